@@ -1,0 +1,251 @@
+#pragma once
+
+#include "platform/Text.h"
+#include "platform/Value.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace platform {
+
+/// What stands at a path, links not followed.
+enum class ItemKind : std::uint8_t { file, folder, symbolicLink, other };
+
+/// Why an answer of the file system is empty.
+enum class FileProblem : std::uint8_t {
+    none,
+    missing, ///< nothing is there, or a link on the way leads nowhere
+    notAFolder, ///< something on the way, or the item itself, is no folder
+    notAPlainFile, ///< a folder, device, pipe or socket where a file is to be read
+    notPermitted,
+    pathTooLong, ///< longer than the system takes
+    linksInCircles,
+    linkOnTheWay, ///< only where links were to stop the call (LinkPolicy::stop)
+    readError, ///< the disk or the network failed
+};
+
+/// Whether a call follows symbolic links in the path it is given.
+enum class LinkPolicy : std::uint8_t {
+    follow, ///< as the system does
+    stop, ///< answer FileProblem::linkOnTheWay when any component of the path, the last included, is a link
+};
+
+/// Facts about one item.
+struct ItemStatus {
+    ItemKind kind = ItemKind::other;
+    std::uint64_t size = 0; ///< bytes
+    Date modificationDate;
+    /// The earlier of birth time and modification time, so that a copy keeps the day it was shot;
+    /// the modification time where no birth time is kept.
+    Date creationDate;
+};
+
+/// The flags by which a browser decides whether and how it shows an item.
+struct ItemFlags {
+    bool invisible = false; ///< its name begins with a full stop, or its folder's `.hidden` names it
+    bool container = false; ///< a folder; a symbolic link is none, whatever it points to
+    bool package = false; ///< a container that is shown as one file, told by its extension
+};
+
+/// Whether an item holds the entry that a listing asked for.
+enum class MarkerAnswer : std::uint8_t {
+    absent,
+    present,
+    link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed
+};
+
+/// What a listing is to find out beside names and flags, so that a scan needs no second call an item.
+struct ListingRequest {
+    /// For every item that can hold one: is there an entry of this name inside it, links followed?
+    /// Not asked when empty.
+    std::string_view marker {};
+    /// The modification date, links followed, of every item that holds the marker.
+    bool datesOfHolders = false;
+    LinkPolicy links = LinkPolicy::follow;
+};
+
+/// One entry of a folder, as a listing answers it.
+struct FolderItem {
+    std::string_view name; ///< bytes as on disk; valid while the listing lives
+    ItemKind kind = ItemKind::other;
+    ItemFlags flags;
+    MarkerAnswer marker = MarkerAnswer::absent;
+    std::optional<Date> modificationDate {}; ///< where the request asked for it and it could be read
+};
+
+/// The items of one folder in the order in which the file system lists them, without "." and "..".
+///
+/// A value: names lie in one block, so a folder of a hundred thousand items costs a handful of allocations.
+class FolderListing {
+public:
+    FolderListing() = default;
+    explicit FolderListing(FileProblem problem)
+        : _problem(problem)
+    {
+    }
+
+    /// Why there are no items, or `none`. A folder that was read and is empty has no problem; one of which the disk gave
+    /// only a part answers that part, and `readError`.
+    FileProblem problem() const noexcept { return _problem; }
+    /// The folder's own facts, links followed, taken while it was listed; absent when it could not be listed.
+    const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
+
+    /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
+    bool pathIsReal() const noexcept { return _pathIsReal; }
+
+    std::size_t size() const noexcept { return _entries.size(); }
+    bool empty() const noexcept { return _entries.empty(); }
+    FolderItem operator[](std::size_t index) const
+    {
+        const Entry& entry = _entries[index];
+        FolderItem item { std::string_view(_names).substr(entry.nameOffset, entry.nameLength), entry.kind, entry.flags,
+            entry.marker };
+        if (entry.hasDate)
+            item.modificationDate = Date { entry.seconds, entry.nanoseconds };
+        return item;
+    }
+
+    class Iterator {
+    public:
+        Iterator(const FolderListing* listing, std::size_t index)
+            : _listing(listing)
+            , _index(index)
+        {
+        }
+        FolderItem operator*() const { return (*_listing)[_index]; }
+        Iterator& operator++()
+        {
+            ++_index;
+            return *this;
+        }
+        friend bool operator==(const Iterator&, const Iterator&) = default;
+
+    private:
+        const FolderListing* _listing;
+        std::size_t _index;
+    };
+    Iterator begin() const { return { this, 0 }; }
+    Iterator end() const { return { this, _entries.size() }; }
+
+    /// For whoever makes a listing.
+    void append(const FolderItem& item);
+    void setItem(std::size_t index, const FolderItem& item);
+    void setFolderStatus(const ItemStatus& status) { _folderStatus = status; }
+    void setProblem(FileProblem problem) { _problem = problem; }
+    void setPathIsReal(bool isReal) { _pathIsReal = isReal; }
+
+private:
+    struct Entry {
+        std::int64_t seconds = 0;
+        std::uint32_t nanoseconds = 0;
+        std::uint32_t nameOffset = 0;
+        std::uint32_t nameLength = 0;
+        ItemKind kind = ItemKind::other;
+        MarkerAnswer marker = MarkerAnswer::absent;
+        ItemFlags flags;
+        bool hasDate = false;
+
+        void take(const FolderItem& item);
+    };
+
+    std::string _names;
+    std::vector<Entry> _entries;
+    std::optional<ItemStatus> _folderStatus;
+    FileProblem _problem = FileProblem::none;
+    bool _pathIsReal = false;
+};
+
+/// A plain file that is open for reading; closed when destroyed. One thread at a time.
+class OpenFile {
+public:
+    virtual ~OpenFile() = default;
+    /// Facts taken from the open file itself.
+    virtual ItemStatus status() const = 0;
+    /// Reads from `offset` (bytes) into `buffer` and answers how many bytes were read: fewer than asked for only at
+    /// the end of the file; 0 as well when the disk fails.
+    virtual std::size_t read(std::uint64_t offset, std::span<std::byte> buffer) const = 0;
+};
+
+/// An open file, or why there is none.
+struct OpenResult {
+    std::unique_ptr<OpenFile> file;
+    FileProblem problem = FileProblem::none;
+};
+
+/// What this system reads of the file system; nothing here writes.
+///
+/// Paths are absolute byte strings of slash-separated components. Every operation may be called from any thread and
+/// may block while a disk spins up or does not answer; none keeps a descriptor open after it has returned, an
+/// `OpenFile` excepted. None throws.
+class FileSystem {
+public:
+    virtual ~FileSystem() = default;
+
+    /// The current user's home folder, absolute; absent when none is known.
+    virtual std::optional<std::string> homeFolder() const = 0;
+
+    /// The items directly inside `folder`, in the order the file system lists them.
+    ///
+    /// When there are none, says why. A scan treats all reasons alike; an explanation does not.
+    virtual FolderListing itemsInFolder(std::string_view folder, const ListingRequest& request) const = 0;
+
+    /// Facts about the item at `path`, links followed; absent when nothing exists at the end.
+    virtual std::optional<ItemStatus> status(std::string_view path) const = 0;
+
+    /// Facts about the item at `path` itself: a link in the last component is not followed, links before it are.
+    virtual std::optional<ItemStatus> linkStatus(std::string_view path) const = 0;
+
+    /// The target text of the symbolic link at `path`, as stored; absent when there is no link.
+    virtual std::optional<std::string> linkTarget(std::string_view path) const = 0;
+
+    /// The flags of the item at `path`, told as a listing of its folder tells them. A link's flags are its own.
+    /// No flag is set when nothing is there.
+    virtual ItemFlags itemFlags(std::string_view path) const = 0;
+
+    /// The real path: every symbolic link on the way resolved. A link that leads nowhere gives the place it names; a
+    /// link in circles gives the real path of its folder, and its name. Never empty; what does not exist stays as written.
+    virtual std::string resolvedPath(std::string_view path) const = 0;
+
+    /// Opens the plain file at `path` for reading, links followed. Never opens a pipe, device or socket.
+    virtual OpenResult openPlainFile(std::string_view path) const = 0;
+
+    /// This file system without links that the machine adds to those on disk. A machine laid over another builds on it.
+    virtual const FileSystem& withoutAddedLinks() const { return *this; }
+
+    /// Whether anything exists at `path`, links followed.
+    bool exists(std::string_view path) const { return status(path).has_value(); }
+};
+
+inline void FolderListing::Entry::take(const FolderItem& item)
+{
+    kind = item.kind;
+    marker = item.marker;
+    flags = item.flags;
+    hasDate = item.modificationDate.has_value();
+    if (hasDate) {
+        seconds = item.modificationDate->seconds;
+        nanoseconds = item.modificationDate->nanoseconds;
+    }
+}
+
+inline void FolderListing::append(const FolderItem& item)
+{
+    Entry& entry = _entries.emplace_back();
+    entry.nameOffset = static_cast<std::uint32_t>(_names.size());
+    entry.nameLength = static_cast<std::uint32_t>(item.name.size());
+    _names.append(item.name);
+    entry.take(item);
+}
+
+inline void FolderListing::setItem(std::size_t index, const FolderItem& item)
+{
+    _entries[index].take(item);
+}
+
+} // namespace platform

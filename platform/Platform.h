@@ -1,0 +1,39 @@
+#pragma once
+
+namespace platform {
+
+class Bundles;
+class Clock;
+class Console;
+class FileSystem;
+class Languages;
+class MainRunLoop;
+class MetadataIndex;
+class Movies;
+class NotificationCenter;
+class Preferences;
+class Threads;
+class Volumes;
+class Workspace;
+
+/// Everything this system asks of the machine it runs on, one reference a role.
+///
+/// The roles outlive whoever is handed this bundle, and every thread that was started through `threads`.
+struct Platform {
+    FileSystem& fileSystem;
+    Volumes& volumes;
+    Workspace& workspace;
+    Preferences& preferences;
+    MetadataIndex& metadataIndex;
+    Movies& movies;
+    NotificationCenter& notifications; ///< the process's default centre
+    NotificationCenter& workspaceNotifications; ///< volumes mounted
+    Clock& clock;
+    Threads& threads;
+    MainRunLoop& mainRunLoop;
+    Console& console;
+    Bundles& bundles;
+    Languages& languages;
+};
+
+} // namespace platform

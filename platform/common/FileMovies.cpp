@@ -1,0 +1,19 @@
+#include "platform/common/FileMovies.h"
+
+#include "platform/FileSystem.h"
+#include "platform/formats/MovieHeader.h"
+
+namespace platform {
+
+FileMovies::FileMovies(const FileSystem& files)
+    : _files(files)
+{
+}
+
+std::optional<MovieHeader> FileMovies::headerOfMovie(std::string_view path) const
+{
+    const OpenResult opened = _files.openPlainFile(path);
+    return opened.file ? readMovieHeader(*opened.file) : std::nullopt;
+}
+
+} // namespace platform

@@ -1,0 +1,119 @@
+#include "platform/described/DescribedPlatform.h"
+
+#include "platform/PathText.h"
+#include "platform/Workspace.h"
+#include "platform/common/FileMetadataIndex.h"
+#include "platform/common/FileMovies.h"
+#include "platform/common/FilePreferences.h"
+#include "platform/common/FileProblemText.h"
+#include "platform/common/LexicalPath.h"
+#include "platform/common/LinkedFileSystem.h"
+#include "platform/common/WholeFile.h"
+#include "platform/described/DescribedVolumes.h"
+
+#include <filesystem>
+#include <system_error>
+#include <utility>
+
+namespace platform {
+
+namespace {
+
+    class DescribedFileSystem : public LinkedFileSystem {
+    public:
+        DescribedFileSystem(const FileSystem& real, const LinkTable& table, std::optional<std::string> home)
+            : LinkedFileSystem(real, table)
+            , _home(std::move(home))
+        {
+        }
+        std::optional<std::string> homeFolder() const override { return _home; }
+
+    private:
+        const std::optional<std::string> _home;
+    };
+
+    /// Knows one application at most, and no icon.
+    class DescribedWorkspace : public Workspace {
+    public:
+        explicit DescribedWorkspace(std::optional<std::string> editorPath)
+            : _editorPath(std::move(editorPath))
+        {
+        }
+        std::optional<std::string> applicationPath(std::string_view identifier) const override
+        {
+            return identifier == describedEditorIdentifier ? _editorPath : std::nullopt;
+        }
+        std::optional<std::string> applicationIconFile(std::string_view) const override { return std::nullopt; }
+
+    private:
+        const std::optional<std::string> _editorPath;
+    };
+
+    std::string absolutePath(const std::string& file)
+    {
+        std::error_code error;
+        return lexicallyAbsolute(file, std::filesystem::current_path(error).string());
+    }
+
+} // namespace
+
+struct DescribedPlatform::Roles {
+    Roles(const MachineDescription& description, const Platform& base)
+        : volumes(description, fileSystem, base.volumes)
+        , links(description.links, volumes, base.fileSystem.withoutAddedLinks())
+        , fileSystem(base.fileSystem.withoutAddedLinks(), links, description.home)
+        , workspace(description.editorPath)
+    {
+    }
+
+    DescribedVolumes volumes;
+    LinkTable links;
+    DescribedFileSystem fileSystem;
+    DescribedWorkspace workspace;
+    FilePreferences preferences { fileSystem };
+    FileMovies movies { fileSystem };
+    FileMetadataIndex metadataIndex { fileSystem, movies };
+};
+
+DescribedPlatform::DescribedPlatform(MachineDescription description, const Platform& base)
+    : _roles(std::make_unique<Roles>(description, base))
+    , _base(base)
+{
+}
+
+DescribedPlatform::~DescribedPlatform() = default;
+
+Platform DescribedPlatform::platform() const
+{
+    return {
+        .fileSystem = _roles->fileSystem,
+        .volumes = _roles->volumes,
+        .workspace = _roles->workspace,
+        .preferences = _roles->preferences,
+        .metadataIndex = _roles->metadataIndex,
+        .movies = _roles->movies,
+        .notifications = _base.notifications,
+        .workspaceNotifications = _base.workspaceNotifications,
+        .clock = _base.clock,
+        .threads = _base.threads,
+        .mainRunLoop = _base.mainRunLoop,
+        .console = _base.console,
+        .bundles = _base.bundles,
+        .languages = _base.languages,
+    };
+}
+
+DescribedPlatformResult describedPlatform(const std::string& file, const Platform& base)
+{
+    const std::string path = absolutePath(file);
+    const OpenResult opened = base.fileSystem.openPlainFile(path);
+    if (!opened.file)
+        return { nullptr, file + ": cannot be read: " + std::string(textOfFileProblem(opened.problem)) };
+    const std::string bytes = readBytes(*opened.file, largestMachineDescription + 1);
+    MachineDescriptionResult result = readMachineDescription(bytes, pathByRemovingLastComponent(path));
+    if (!result.problem.empty())
+        return { nullptr, file + ":" + result.problem };
+    return { std::make_unique<DescribedPlatform>(std::move(result.description), base), {} };
+}
+
+} // namespace platform

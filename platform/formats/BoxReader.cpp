@@ -1,0 +1,77 @@
+#include "platform/formats/BoxReader.h"
+
+namespace platform {
+namespace {
+
+    constexpr std::uint64_t shortHeader = 8;
+    constexpr std::uint64_t longHeader = 16;
+
+    std::uint64_t number(const std::byte* bytes, std::size_t count)
+    {
+        std::uint64_t result = 0;
+        for (std::size_t index = 0; index < count; ++index)
+            result = (result << 8) | std::to_integer<std::uint64_t>(bytes[index]);
+        return result;
+    }
+
+} // namespace
+
+BoxStep BoxReader::next(FileRange& rest, ZeroSize zeroSize, Box& box)
+{
+    if (rest.size() < shortHeader)
+        return BoxStep::end;
+    if (++_boxes > mostBoxes || _reads >= mostReads)
+        return BoxStep::tooMuch;
+    const bool mayBeLong = rest.size() >= longHeader;
+    const std::byte* header = bytesAt(rest.start, mayBeLong ? longHeader : shortHeader);
+    if (!header)
+        return BoxStep::broken;
+    box.type = number32(header + 4);
+    std::uint64_t size = number32(header);
+    std::uint64_t headerSize = shortHeader;
+    if (size == 0 && zeroSize == ZeroSize::endsList)
+        return BoxStep::end;
+    if (size == 0) {
+        size = rest.size();
+    } else if (size == 1 && mayBeLong) {
+        size = number64(header + 8);
+        headerSize = longHeader;
+    }
+    if (size < headerSize || size > rest.size())
+        return BoxStep::broken;
+    box.content = { rest.start + headerSize, rest.start + size };
+    rest.start += size;
+    return BoxStep::box;
+}
+
+const std::byte* BoxReader::bytesAt(std::uint64_t offset, std::size_t count)
+{
+    const bool isInWindow = offset >= _windowStart && offset - _windowStart <= _windowLength
+        && _windowLength - (offset - _windowStart) >= count;
+    if (!isInWindow) {
+        if (offset > _size || _size - offset < count || ++_reads > mostReads)
+            return nullptr;
+        _windowStart = offset;
+        _windowLength = _file.read(offset, _window);
+        if (_windowLength < count)
+            return nullptr;
+    }
+    return _window.data() + (offset - _windowStart);
+}
+
+std::uint16_t BoxReader::number16(const std::byte* bytes) noexcept
+{
+    return static_cast<std::uint16_t>(number(bytes, 2));
+}
+
+std::uint32_t BoxReader::number32(const std::byte* bytes) noexcept
+{
+    return static_cast<std::uint32_t>(number(bytes, 4));
+}
+
+std::uint64_t BoxReader::number64(const std::byte* bytes) noexcept
+{
+    return number(bytes, 8);
+}
+
+} // namespace platform

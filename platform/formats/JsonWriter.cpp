@@ -1,0 +1,294 @@
+#include "platform/formats/JsonWriter.h"
+
+#include "platform/formats/Base64.h"
+#include "platform/formats/Dates.h"
+#include "platform/formats/Unicode.h"
+
+#include <charconv>
+#include <cmath>
+#include <cstring>
+
+namespace platform {
+namespace {
+
+    constexpr std::size_t blockSize = 64 * 1024;
+
+    constexpr std::uint64_t everyByte(std::uint64_t byte)
+    {
+        return byte * 0x0101010101010101;
+    }
+
+    /// The high bit of each byte of `eight` that is zero; bits above the first one set may be wrong.
+    constexpr std::uint64_t zeroBytes(std::uint64_t eight)
+    {
+        return (eight - everyByte(1)) & ~eight & everyByte(0x80);
+    }
+
+    /// Whether all eight are ASCII and may stand in a string as they are.
+    bool arePlain(std::uint64_t eight)
+    {
+        const std::uint64_t controls = (eight - everyByte(0x20)) & ~eight & everyByte(0x80);
+        const std::uint64_t quotes = zeroBytes(eight ^ everyByte('"'));
+        const std::uint64_t backslashes = zeroBytes(eight ^ everyByte('\\'));
+        return ((eight & everyByte(0x80)) | controls | quotes | backslashes) == 0;
+    }
+
+    bool isPlain(char letter)
+    {
+        return static_cast<unsigned char>(letter) >= 0x20 && static_cast<unsigned char>(letter) < 0x80 && letter != '"'
+            && letter != '\\';
+    }
+
+    bool arePlain(const char* letters)
+    {
+        std::uint64_t eight = 0;
+        std::memcpy(&eight, letters, sizeof eight);
+        return arePlain(eight);
+    }
+
+    /// How many bytes from `start` on may stand in a string as they are.
+    std::size_t plainRun(std::string_view text, std::size_t start)
+    {
+        constexpr std::size_t step = sizeof(std::uint64_t);
+        std::size_t end = start;
+        while (end < text.size()) {
+            if (text.size() - end >= step && arePlain(text.data() + end)) {
+                end += step;
+                continue;
+            }
+            // The last few bytes, looked at once more together with those before them.
+            if (text.size() - end < step && text.size() >= step && arePlain(text.data() + text.size() - step))
+                return text.size() - start;
+            const bool isAscii = static_cast<unsigned char>(text[end]) < 0x80;
+            const std::size_t length = isAscii ? isPlain(text[end]) : lengthOfValidSequence(text.substr(end));
+            if (length == 0)
+                break;
+            end += length;
+        }
+        return end - start;
+    }
+
+    struct Escape {
+        char letters[6];
+        std::size_t length;
+    };
+
+    Escape escapeFor(char letter)
+    {
+        constexpr std::string_view digits = "0123456789abcdef";
+        switch (letter) {
+        case '"':
+        case '\\':
+            return { { '\\', letter }, 2 };
+        case '\n':
+            return { { '\\', 'n' }, 2 };
+        case '\r':
+            return { { '\\', 'r' }, 2 };
+        case '\t':
+            return { { '\\', 't' }, 2 };
+        default:
+            const auto byte = static_cast<unsigned char>(letter);
+            return { { '\\', 'u', '0', '0', digits[byte >> 4], digits[byte & 15] }, 6 };
+        }
+    }
+
+} // namespace
+
+JsonWriter::JsonWriter(Sink sink)
+    : _sink(std::move(sink))
+    , _block(std::make_unique<char[]>(blockSize))
+{
+}
+
+JsonWriter::~JsonWriter()
+{
+    flush();
+}
+
+void JsonWriter::key(std::string_view name)
+{
+    separate();
+    quoted(name);
+    append(':');
+    _needsComma = false;
+}
+
+void JsonWriter::integer(std::int64_t integer)
+{
+    char digits[24];
+    const std::to_chars_result end = std::to_chars(std::begin(digits), std::end(digits), integer);
+    literal({ digits, static_cast<std::size_t>(end.ptr - digits) });
+}
+
+void JsonWriter::real(double real)
+{
+    if (!std::isfinite(real))
+        return null();
+    constexpr double largestWhole = 9007199254740992; // beyond it not every whole number is one of these
+    const bool isWhole
+        = std::abs(real) < largestWhole && real == std::floor(real) && (real != 0 || !std::signbit(real));
+    char digits[40];
+    char* last = std::end(digits) - 2;
+    std::to_chars_result end
+        = isWhole ? std::to_chars(digits, last, static_cast<std::int64_t>(real)) : std::to_chars(digits, last, real);
+    const std::string_view shortest(digits, static_cast<std::size_t>(end.ptr - digits));
+    if (shortest.find_first_of(".e") == std::string_view::npos) {
+        *end.ptr++ = '.';
+        *end.ptr++ = '0';
+    }
+    literal({ digits, static_cast<std::size_t>(end.ptr - digits) });
+}
+
+void JsonWriter::string(std::string_view text)
+{
+    separate();
+    quoted(text);
+}
+
+void JsonWriter::text(const Text& text)
+{
+    if (text.isAbsent())
+        null();
+    else
+        string(text.view());
+}
+
+void JsonWriter::date(Date date)
+{
+    string(DateText(date, DateText::Fraction::nineDigits).view());
+}
+
+void JsonWriter::size(Size size)
+{
+    beginObject();
+    key("width");
+    real(size.width);
+    key("height");
+    real(size.height);
+    endObject();
+}
+
+void JsonWriter::value(const Value& value)
+{
+    switch (value.kind()) {
+    case Value::Kind::null:
+        return null();
+    case Value::Kind::boolean:
+        return boolean(*value.boolean());
+    case Value::Kind::integer:
+        return integer(*value.integer());
+    case Value::Kind::real:
+        return real(*value.real());
+    case Value::Kind::text:
+        return text(*value.text());
+    case Value::Kind::date:
+        return date(*value.date());
+    case Value::Kind::size:
+        return size(*value.size());
+    case Value::Kind::data:
+        return string(encodeBase64(value.data()->bytes));
+    case Value::Kind::list:
+        beginList();
+        for (const Value& item : *value.list())
+            this->value(item);
+        return endList();
+    case Value::Kind::dictionary:
+        beginObject();
+        for (const Value::Entry& entry : *value.dictionary()) {
+            key(entry.first);
+            this->value(entry.second);
+        }
+        return endObject();
+    }
+}
+
+void JsonWriter::endDocument()
+{
+    append('\n');
+    _needsComma = false;
+}
+
+void JsonWriter::flush()
+{
+    if (_length > 0)
+        _sink({ _block.get(), _length });
+    _length = 0;
+}
+
+void JsonWriter::begin(char bracket)
+{
+    separate();
+    append(bracket);
+    _needsComma = false;
+}
+
+void JsonWriter::end(char bracket)
+{
+    append(bracket);
+    _needsComma = true;
+}
+
+void JsonWriter::literal(std::string_view text)
+{
+    separate();
+    append(text);
+}
+
+void JsonWriter::quoted(std::string_view text)
+{
+    std::size_t run = plainRun(text, 0);
+    if (run == text.size() && text.size() + 2 <= blockSize - _length) {
+        char* end = _block.get() + _length;
+        *end++ = '"';
+        if (!text.empty())
+            std::memcpy(end, text.data(), text.size());
+        end[text.size()] = '"';
+        _length += text.size() + 2;
+        return;
+    }
+    append('"');
+    std::size_t position = 0;
+    for (;; run = plainRun(text, position)) {
+        append(text.substr(position, run));
+        position += run;
+        if (position == text.size())
+            break;
+        const char letter = text[position++];
+        if (static_cast<unsigned char>(letter) >= 0x80) {
+            append(replacementCharacter);
+        } else {
+            const Escape escape = escapeFor(letter);
+            append({ escape.letters, escape.length });
+        }
+    }
+    append('"');
+}
+
+void JsonWriter::separate()
+{
+    if (_needsComma)
+        append(',');
+    _needsComma = true;
+}
+
+void JsonWriter::append(char letter)
+{
+    if (_length == blockSize)
+        flush();
+    _block[_length++] = letter;
+}
+
+void JsonWriter::append(std::string_view bytes)
+{
+    if (bytes.size() > blockSize - _length) {
+        flush();
+        if (bytes.size() > blockSize)
+            return _sink(bytes);
+    }
+    if (bytes.empty())
+        return;
+    std::memcpy(_block.get() + _length, bytes.data(), bytes.size());
+    _length += bytes.size();
+}
+
+} // namespace platform

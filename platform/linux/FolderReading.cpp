@@ -1,0 +1,154 @@
+#include "platform/linux/FolderReading.h"
+
+#include "platform/linux/Descriptor.h"
+#include "platform/linux/HiddenNames.h"
+#include "platform/linux/ItemReading.h"
+
+#include <string>
+#include <unordered_map>
+
+#include <dirent.h>
+#include <fcntl.h>
+#include <sys/stat.h>
+
+namespace platform {
+
+namespace {
+
+    class FolderReader {
+    public:
+        FolderReader(int folder, const ListingRequest& request)
+            : _folder(folder)
+            , _request(request)
+            , _asksForMarker(!request.marker.empty() && request.marker.find('\0') == std::string_view::npos)
+        {
+        }
+
+        FolderListing listing();
+
+    private:
+        void takeBlock(const char* block, std::size_t length);
+        void take(const dirent64& entry);
+        ItemKind kindOfItem(const dirent64& entry) const;
+        MarkerAnswer markerInside(const char* name, ItemKind kind);
+        void hideNamed();
+
+        int _folder;
+        const ListingRequest& _request;
+        bool _asksForMarker;
+        bool _sawHiddenNames = false;
+        std::string _markerPath {};
+        FolderListing _listing {};
+    };
+
+    FolderListing FolderReader::listing()
+    {
+        // A file system that never comes to an end (FUSE) must not eat the memory.
+        constexpr std::size_t itemsAtMost = 20'000'000;
+        if (const auto status = readItemStatus(_folder, "", AT_EMPTY_PATH))
+            _listing.setFolderStatus(*status);
+        alignas(dirent64) char block[64 * 1024];
+        ssize_t length = 0;
+        do {
+            length = uninterrupted([&] { return getdents64(_folder, block, sizeof(block)); });
+            if (length > 0)
+                takeBlock(block, static_cast<std::size_t>(length));
+        } while (length > 0 && _listing.size() < itemsAtMost);
+        if (length != 0)
+            _listing.setProblem(FileProblem::readError);
+        if (_sawHiddenNames)
+            hideNamed();
+        return std::move(_listing);
+    }
+
+    void FolderReader::takeBlock(const char* block, std::size_t length)
+    {
+        for (std::size_t offset = 0; offset < length;) {
+            const auto* entry = reinterpret_cast<const dirent64*>(block + offset);
+            take(*entry);
+            offset += entry->d_reclen;
+        }
+    }
+
+    void FolderReader::take(const dirent64& entry)
+    {
+        const std::string_view name = entry.d_name;
+        if (name == "." || name == "..")
+            return;
+        FolderItem item;
+        item.name = name;
+        item.kind = kindOfItem(entry);
+        item.flags = flagsOfItem(name, item.kind);
+        if (_asksForMarker)
+            item.marker = markerInside(entry.d_name, item.kind);
+        if (_request.datesOfHolders && item.marker != MarkerAnswer::absent) {
+            if (const auto status = readItemStatus(_folder, entry.d_name, 0))
+                item.modificationDate = status->modificationDate;
+        }
+        _sawHiddenNames = _sawHiddenNames || name == HiddenNames::fileName;
+        _listing.append(item);
+    }
+
+    ItemKind FolderReader::kindOfItem(const dirent64& entry) const
+    {
+        switch (entry.d_type) {
+        case DT_REG:
+            return ItemKind::file;
+        case DT_DIR:
+            return ItemKind::folder;
+        case DT_LNK:
+            return ItemKind::symbolicLink;
+        case DT_UNKNOWN: {
+            const auto status = readItemStatus(_folder, entry.d_name, AT_SYMLINK_NOFOLLOW);
+            return status ? status->kind : ItemKind::other;
+        }
+        default:
+            return ItemKind::other;
+        }
+    }
+
+    MarkerAnswer FolderReader::markerInside(const char* name, ItemKind kind)
+    {
+        const bool follows = _request.links == LinkPolicy::follow;
+        if (kind != ItemKind::folder && !(follows && kind == ItemKind::symbolicLink))
+            return MarkerAnswer::absent;
+        _markerPath.assign(name).append(1, '/').append(_request.marker);
+        if (follows) {
+            const int answer = uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); });
+            return answer == 0 ? MarkerAnswer::present : MarkerAnswer::absent;
+        }
+        struct stat facts;
+        const auto ask = [&] { return fstatat(_folder, _markerPath.c_str(), &facts, AT_SYMLINK_NOFOLLOW); };
+        if (uninterrupted(ask) == -1)
+            return MarkerAnswer::absent;
+        return S_ISLNK(facts.st_mode) ? MarkerAnswer::link : MarkerAnswer::present;
+    }
+
+    // Looks up each line among the items, not each item among the lines: the folder bounds the memory, not the file.
+    void FolderReader::hideNamed()
+    {
+        const HiddenNames hiddenNames = HiddenNames::readIn(_folder);
+        if (hiddenNames.empty())
+            return;
+        std::unordered_map<std::string_view, bool> isHidden(_listing.size());
+        for (const FolderItem item : _listing)
+            isHidden.emplace(item.name, false);
+        hiddenNames.forEach([&](std::string_view line) {
+            if (const auto found = isHidden.find(line); found != isHidden.end())
+                found->second = true;
+        });
+        for (std::size_t index = 0; index < _listing.size(); ++index) {
+            FolderItem item = _listing[index];
+            item.flags.invisible = item.flags.invisible || isHidden.find(item.name)->second;
+            _listing.setItem(index, item);
+        }
+    }
+
+} // namespace
+
+FolderListing readOpenFolder(int folder, const ListingRequest& request)
+{
+    return FolderReader(folder, request).listing();
+}
+
+} // namespace platform

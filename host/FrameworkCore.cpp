@@ -1,0 +1,96 @@
+#include "host/FrameworkCore.h"
+
+#include "host/OBLog.h"
+#include "platform/Immortal.h"
+#include "platform/Snapshot.h"
+#include "platform/Threads.h"
+
+#include <utility>
+
+namespace {
+
+using CurrentCore = platform::Snapshot<std::shared_ptr<FrameworkCore>>;
+
+CurrentCore& currentCore()
+{
+    static platform::Immortal<CurrentCore> core;
+    return *core;
+}
+
+} // namespace
+
+FrameworkCore::FrameworkCore(const platform::Platform& platform, OBLogSink logSink)
+    : _platform(platform)
+    , _logSink(std::move(logSink))
+{
+}
+
+std::shared_ptr<FrameworkCore> FrameworkCore::current()
+{
+    return currentCore().load();
+}
+
+void FrameworkCore::setCurrent(std::shared_ptr<FrameworkCore> core)
+{
+    currentCore().store(std::move(core));
+}
+
+void FrameworkCore::log(std::string_view message, int level, const OBMediaManager* sender) const
+{
+    if (_logSink)
+        _logSink(message, level, sender);
+}
+
+void FrameworkCore::logOnce(const std::string& message, const OBMediaManager* sender)
+{
+    {
+        platform::Locked guard(_loggedLock);
+        if (!_logged.insert(message).second)
+            return;
+    }
+    log(message, 2, sender);
+}
+
+bool FrameworkCore::startThread(const std::string& name, std::function<void()> body)
+{
+    {
+        std::lock_guard guard(_threadsLock);
+        ++_threads;
+    }
+    const bool started
+        = _platform.threads.startDetached(name, [core = shared_from_this(), work = std::move(body)]() mutable {
+              work();
+              work = nullptr; // what the body held is released before the thread counts as ended
+              core->threadEnded();
+          });
+    if (!started)
+        threadEnded();
+    return started;
+}
+
+void FrameworkCore::threadEnded()
+{
+    {
+        std::lock_guard guard(_threadsLock);
+        --_threads;
+    }
+    _threadsChanged.notify_all();
+}
+
+std::size_t FrameworkCore::threadCount() const
+{
+    std::lock_guard guard(_threadsLock);
+    return _threads;
+}
+
+bool FrameworkCore::waitForThreads(std::chrono::nanoseconds limit)
+{
+    std::unique_lock guard(_threadsLock);
+    return _threadsChanged.wait_for(guard, limit, [this] { return _threads == 0; });
+}
+
+void OBLog(std::string_view message, int level, const OBMediaManager* sender)
+{
+    if (const auto core = FrameworkCore::current())
+        core->log(message, level, sender);
+}

@@ -1,0 +1,348 @@
+// Loads of one manager: who asked, which load answers whom, and who is told.
+//
+// The one surprise: `loadData` is an operation that plug-ins override and that must end up in the base class, which is
+// where the load runs. So the load thread calls `loadData`, and the base operation knows by a mark of the thread that it is
+// being called from there.
+
+#include "host/ManagerState.h"
+
+#include "platform/Notifications.h"
+#include "platform/Threads.h"
+
+#include <algorithm>
+#include <cmath>
+
+namespace {
+
+/// Observers hear of progress at most ten times a second.
+constexpr std::chrono::nanoseconds progressInterval = std::chrono::milliseconds(100);
+
+/// The manager whose load runs on this thread.
+thread_local const ManagerState* loadingOnThisThread = nullptr;
+
+/// 0.5 and above is a normal thread; below, linearly to the nicest at 0.0.
+int niceForPriority(double priority)
+{
+    constexpr int nicest = 19;
+    return priority >= 0.5 ? 0 : static_cast<int>(std::lround((0.5 - priority) / 0.5 * nicest));
+}
+
+} // namespace
+
+ManagerState::ManagerState(OBMediaManager& manager, const OBManagerContext& context)
+    : core(context._core)
+    , bundle(context._bundle)
+    , _manager(manager)
+{
+}
+
+void ManagerState::Progress::restart()
+{
+    isLoading = true;
+    foldersDone = 0;
+    foldersKnown = 0;
+    itemsFound = 0;
+    itemsSkipped = 0;
+    pathAtWork.store({});
+}
+
+OBLoadProgress ManagerState::Progress::now() const
+{
+    const auto [path, since] = pathAtWork.load();
+    return { isLoading, foldersDone, foldersKnown, itemsFound, itemsSkipped, path, since };
+}
+
+void ManagerState::requestTree(OBExecutor executor, std::function<void(OBLoadResult)> completion)
+{
+    OBLoadResult ready { OBLoadOutcome::loaded, root.load() };
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        if (_ended) {
+            ready = { OBLoadOutcome::ended, nullptr };
+        } else {
+            const bool joins = _loadActive && !_needsReload && !gate.isCancelPending();
+            if (joins || _needsReload || !ready.rootMediaGroup || _loadActive || _loadQueued) {
+                _waiters.push_back({ joins ? _loadNumber : _loadNumber + 1, executor, std::move(completion) });
+                start = !joins && queueLoad(Job::wholeLoad);
+                completion = nullptr;
+            }
+        }
+    }
+    if (start)
+        startLoadThread();
+    if (completion)
+        executor([call = std::move(completion), result = std::move(ready)] { call(result); });
+}
+
+void ManagerState::requestLoad(Job job)
+{
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        start = !_ended && queueLoad(job);
+    }
+    if (start)
+        startLoadThread();
+}
+
+void ManagerState::setNeedsReload(bool needed)
+{
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        _needsReload = needed;
+        start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
+    }
+    if (start)
+        startLoadThread();
+}
+
+void ManagerState::setAutoReload(bool enabled)
+{
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        _autoReload = enabled;
+        start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
+    }
+    if (start)
+        startLoadThread();
+}
+
+void ManagerState::wasHandedOut()
+{
+    std::lock_guard guard(_lock);
+    _handedOut = true;
+}
+
+bool ManagerState::wantsLoadByItself() const
+{
+    return _needsReload && _autoReload && _handedOut && !_ended && !_observers.empty();
+}
+
+bool ManagerState::queueLoad(Job job)
+{
+    if (!_loadQueued || job == Job::wholeLoad)
+        _queuedJob = job;
+    _loadQueued = true;
+    return !std::exchange(_threadRuns, true);
+}
+
+void ManagerState::startLoadThread()
+{
+    const auto manager = _manager.shared_from_this();
+    if (core->startThread("ob-load", [this, manager] { runLoads(); }))
+        return;
+    {
+        std::lock_guard guard(_lock);
+        _threadRuns = false;
+        _loadQueued = false;
+        ++_loadNumber;
+    }
+    core->log("a load could not start: the system gives no thread", 1, &_manager);
+    finishLoad(OBLoadOutcome::unavailable);
+}
+
+void ManagerState::runLoads()
+{
+    Job job {};
+    while (beginLoad(job))
+        finishLoad(runLoad(job));
+}
+
+/// Takes the next load from the queue; false, and the thread is to end, when there is none.
+bool ManagerState::beginLoad(Job& job)
+{
+    const bool open = gate.begin();
+    std::lock_guard guard(_lock);
+    if (!open || _ended || !_loadQueued) {
+        if (open)
+            gate.end();
+        _threadRuns = false;
+        return false;
+    }
+    job = _queuedJob;
+    _loadQueued = false;
+    _loadActive = true;
+    _needsReload = false;
+    _problems.clear();
+    ++_loadNumber;
+    return true;
+}
+
+OBLoadOutcome ManagerState::runLoad(Job job)
+{
+    progress.restart();
+    core->platform().threads.setNiceOfCurrentThread(niceForPriority(loadThreadPriority));
+    loadingOnThisThread = this;
+    OBLoadOutcome outcome = OBLoadOutcome::loaded;
+    if (job == Job::performOnly)
+        performLoad();
+    else if (_manager.canLoadData())
+        _manager.loadData();
+    else
+        outcome = OBLoadOutcome::unavailable;
+    loadingOnThisThread = nullptr;
+    return gate.isCancelPending() ? OBLoadOutcome::cancelled : outcome;
+}
+
+void ManagerState::finishLoad(OBLoadOutcome outcome)
+{
+    progress.isLoading = false;
+    progress.pathAtWork.store({});
+    std::vector<Waiter> answered;
+    Observers listening;
+    {
+        std::lock_guard guard(_lock);
+        if (std::exchange(_loadActive, false))
+            gate.end();
+        // Asked again, a cancelled load starts over; by itself it does not, or a cancel would never be one.
+        _needsReload = _needsReload || outcome == OBLoadOutcome::cancelled;
+        const auto later = std::stable_partition(
+            _waiters.begin(), _waiters.end(), [this](const Waiter& waiter) { return waiter.load <= _loadNumber; });
+        answered.assign(std::make_move_iterator(_waiters.begin()), std::make_move_iterator(later));
+        _waiters.erase(_waiters.begin(), later);
+        listening = _observers;
+    }
+    const OBLoadResult result { outcome, root.load() };
+    deliver(std::move(answered), result);
+    for (const auto& observer : listening) {
+        if (observer->callbacks.loadEnded) {
+            observer->executor([observer, result] {
+                if (!observer->takenBack)
+                    observer->callbacks.loadEnded(result);
+            });
+        }
+    }
+}
+
+void ManagerState::deliver(std::vector<Waiter> waiters, const OBLoadResult& result)
+{
+    for (Waiter& waiter : waiters)
+        waiter.executor([call = std::move(waiter.completion), result] { call(result); });
+}
+
+bool ManagerState::firstLoadData() const
+{
+    std::lock_guard guard(_lock);
+    return _firstLoadData;
+}
+
+void ManagerState::loadDataCalled()
+{
+    if (loadingOnThisThread == this)
+        performLoad();
+    else
+        requestLoad(Job::performOnly);
+    std::lock_guard guard(_lock);
+    _firstLoadData = false;
+}
+
+void ManagerState::performLoad()
+{
+    if (OBMediaGroupRef group = _manager.performLoadData())
+        _manager.setRootMediaGroup(std::move(group));
+}
+
+/// Nothing here waits: what is at work sees the cancel, what sleeps wakes, and each keeps the manager alive until it returns.
+void ManagerState::end()
+{
+    std::vector<Waiter> waiting;
+    Observers listening;
+    decltype(_notifications) notifications;
+    {
+        std::lock_guard guard(_lock);
+        if (std::exchange(_ended, true))
+            return;
+        waiting = std::exchange(_waiters, {});
+        listening = std::exchange(_observers, {});
+        notifications = std::exchange(_notifications, {});
+    }
+    gate.close();
+    ended.raise();
+    core->pathWatcher().removeObserver(&_manager);
+    for (const auto& [center, token] : notifications)
+        center->removeObserver(token);
+    for (const auto& observer : listening)
+        observer->takenBack = true;
+    deliver(std::move(waiting), { OBLoadOutcome::ended, nullptr });
+}
+
+std::shared_ptr<ManagerObserver> ManagerState::addObserver(OBExecutor executor, OBManagerCallbacks callbacks)
+{
+    auto observer = std::make_shared<ManagerObserver>();
+    observer->executor = std::move(executor);
+    observer->callbacks = std::move(callbacks);
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        if (_ended)
+            return observer;
+        std::erase_if(_observers, [](const auto& other) { return other->takenBack.load(); });
+        _observers.push_back(observer);
+        start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
+    }
+    if (start)
+        startLoadThread();
+    return observer;
+}
+
+ManagerState::Observers ManagerState::observers() const
+{
+    std::lock_guard guard(_lock);
+    return _observers;
+}
+
+void ManagerState::publishRoot(const OBMediaGroupRef& group)
+{
+    root.store(group);
+    for (const auto& observer : observers()) {
+        if (observer->callbacks.rootPublished) {
+            observer->executor([observer, group] {
+                if (!observer->takenBack)
+                    observer->callbacks.rootPublished(group);
+            });
+        }
+    }
+}
+
+void ManagerState::tellProgress()
+{
+    const std::int64_t now = core->platform().clock.monotonic().count();
+    std::int64_t last = progress.lastTold;
+    if (now - last < progressInterval.count() || !progress.lastTold.compare_exchange_strong(last, now))
+        return;
+    for (const auto& observer : observers()) {
+        if (observer->callbacks.progressed) {
+            observer->executor([observer, state = progress.now()] {
+                if (!observer->takenBack)
+                    observer->callbacks.progressed(state);
+            });
+        }
+    }
+}
+
+void ManagerState::addNotification(platform::NotificationCenter& center, platform::NotificationCenter::Token token)
+{
+    {
+        std::lock_guard guard(_lock);
+        if (!_ended) {
+            _notifications.emplace_back(&center, token);
+            return;
+        }
+    }
+    center.removeObserver(token);
+}
+
+void ManagerState::noteProblem(std::string_view path, platform::FileProblem problem)
+{
+    std::lock_guard guard(_lock);
+    _problems.push_back({ std::string(path), problem });
+}
+
+std::vector<OBLoadProblem> ManagerState::problems() const
+{
+    std::lock_guard guard(_lock);
+    return _problems;
+}

@@ -1,0 +1,58 @@
+#include "host/OBMediaHost.h"
+
+#include "host/FrameworkCore.h"
+#include "host/PluginLibrary.h"
+
+#include <utility>
+
+OBMediaHost::OBMediaHost(const platform::Platform& platform, OBHostOptions options)
+    : _core(std::make_shared<FrameworkCore>(platform, std::move(options.logSink)))
+    , _plugins(std::make_unique<PluginLibrary>(*_core, std::move(options.pluginFolders)))
+{
+    FrameworkCore::setCurrent(_core);
+}
+
+OBMediaHost::~OBMediaHost()
+{
+    if (FrameworkCore::current() == _core)
+        FrameworkCore::setCurrent(nullptr);
+}
+
+std::vector<OBPluginInfo> OBMediaHost::plugins()
+{
+    return _plugins->plugins();
+}
+
+std::vector<OBPluginInfo> OBMediaHost::tryAllPlugins()
+{
+    for (const OBPluginInfo& plugin : _plugins->plugins()) {
+        if (plugin.reason.empty())
+            createManager(plugin.identifier);
+    }
+    return _plugins->plugins();
+}
+
+const OBMediaManagerClass* OBMediaHost::managerClass(std::string_view identifier)
+{
+    return _plugins->managerClass(identifier);
+}
+
+OBManagerResult OBMediaHost::createManager(std::string_view identifier)
+{
+    return _plugins->createManager(_core, identifier);
+}
+
+OBPathWatcher& OBMediaHost::pathWatcher()
+{
+    return _core->pathWatcher();
+}
+
+std::size_t OBMediaHost::threadCount() const
+{
+    return _core->threadCount();
+}
+
+bool OBMediaHost::waitForThreads(std::chrono::nanoseconds limit)
+{
+    return _core->waitForThreads(limit);
+}

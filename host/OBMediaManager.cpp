@@ -1,0 +1,285 @@
+#include "host/OBMediaManager.h"
+
+#include "host/ManagerState.h"
+#include "platform/Clock.h"
+#include "platform/FileSystem.h"
+#include "platform/MainRunLoop.h"
+#include "platform/Preferences.h"
+
+#include <utility>
+
+using platform::Text;
+using platform::Value;
+
+OBMediaManager::OBMediaManager(const OBManagerContext& context)
+    : _state(std::make_unique<ManagerState>(*this, context))
+{
+}
+
+OBMediaManager::~OBMediaManager() = default;
+
+bool OBMediaManager::init()
+{
+    return true;
+}
+
+void OBMediaManager::dealloc()
+{
+}
+
+void OBMediaManager::loadData()
+{
+    _state->loadDataCalled();
+}
+
+OBMediaGroupRef OBMediaManager::performLoadData()
+{
+    return nullptr;
+}
+
+bool OBMediaManager::canLoadData()
+{
+    return true;
+}
+
+OBMediaGroupList OBMediaManager::mediaGroups()
+{
+    return {};
+}
+
+OBMediaGroupList OBMediaManager::movieGroups()
+{
+    return {};
+}
+
+Text OBMediaManager::displayName()
+{
+    return {};
+}
+
+OBImageRef OBMediaManager::displayImage()
+{
+    return nullptr;
+}
+
+Text OBMediaManager::uniqueID()
+{
+    return pluginIdentifier();
+}
+
+Text OBMediaManager::rootMediaGroupTitle()
+{
+    return {};
+}
+
+OBImageRef OBMediaManager::rootMediaGroupIcon()
+{
+    return nullptr;
+}
+
+int OBMediaManager::mediaTypesSupported()
+{
+    return 0;
+}
+
+Text OBMediaManager::applicationVersion()
+{
+    return {};
+}
+
+bool OBMediaManager::appInstalled()
+{
+    return !getAppPath().isAbsent();
+}
+
+Text OBMediaManager::getAppPath()
+{
+    return {};
+}
+
+Text OBMediaManager::defaultNoDataMessage(const OBMediaGroupRef&)
+{
+    return {};
+}
+
+OBSourceInspection* OBMediaManager::inspection()
+{
+    return nullptr;
+}
+
+OBMediaGroupRef OBMediaManager::rootMediaGroup() const
+{
+    return _state->root.load();
+}
+
+void OBMediaManager::setRootMediaGroup(OBMediaGroupRef group)
+{
+    _state->publishRoot(group);
+}
+
+bool OBMediaManager::isCancelLoadRequestPending() const noexcept
+{
+    return _state->gate.isCancelPending();
+}
+
+bool OBMediaManager::firstTimeCallingLoadData() const
+{
+    return _state->firstLoadData();
+}
+
+void OBMediaManager::setNeedsReload(bool needsReload)
+{
+    _state->setNeedsReload(needsReload);
+}
+
+void OBMediaManager::setAutoReloadEnabled(bool enabled)
+{
+    _state->setAutoReload(enabled);
+}
+
+void OBMediaManager::setLoadThreadPriority(double priority)
+{
+    _state->loadThreadPriority = priority;
+}
+
+double OBMediaManager::loadThreadPriority() const
+{
+    return _state->loadThreadPriority;
+}
+
+const OBBundle& OBMediaManager::pluginBundle() const
+{
+    return *_state->bundle;
+}
+
+Text OBMediaManager::pluginIdentifier() const
+{
+    return _state->bundle->identifier();
+}
+
+Text OBMediaManager::localizedString(std::string_view key) const
+{
+    return _state->bundle->localizedString(key);
+}
+
+const platform::Platform& OBMediaManager::platform() const
+{
+    return _state->core->platform();
+}
+
+Value OBMediaManager::preferencesOfDomain(std::string_view domain)
+{
+    platform::PreferencesAnswer answer = platform().preferences.valuesOfDomain(domain);
+    if (!answer.problem.empty())
+        _state->core->logOnce(answer.problem, this);
+    return std::move(answer.values);
+}
+
+platform::FolderListing OBMediaManager::listFolder(const Text& path, const platform::ListingRequest& request)
+{
+    using platform::FileProblem;
+    notePathAtWork(path);
+    platform::FolderListing listing = platform().fileSystem.itemsInFolder(path, request);
+    _state->progress.foldersDone.fetch_add(1, std::memory_order_relaxed);
+    switch (listing.problem()) {
+    case FileProblem::none:
+    case FileProblem::missing:
+    case FileProblem::notAFolder:
+        break;
+    case FileProblem::pathTooLong:
+        _state->core->logOnce(path.string() + ": listed as empty: the path is too long for the system", this);
+        [[fallthrough]];
+    default:
+        _state->noteProblem(path, listing.problem());
+    }
+    _state->tellProgress();
+    return listing;
+}
+
+void OBMediaManager::noteFoldersFound(std::uint64_t count)
+{
+    _state->progress.foldersKnown.fetch_add(count, std::memory_order_relaxed);
+}
+
+void OBMediaManager::noteItemsFound(std::uint64_t count)
+{
+    _state->progress.itemsFound.fetch_add(count, std::memory_order_relaxed);
+}
+
+void OBMediaManager::noteItemsSkipped(std::uint64_t count)
+{
+    _state->progress.itemsSkipped.fetch_add(count, std::memory_order_relaxed);
+}
+
+void OBMediaManager::notePathAtWork(const Text& path)
+{
+    _state->progress.pathAtWork.store({ path, platform().clock.monotonic() });
+}
+
+std::shared_ptr<OBScanObserver> OBMediaManager::scanObserver() const
+{
+    return _state->scanObserver.load();
+}
+
+bool OBMediaManager::performOnMainThreadAndWait(const std::function<void()>& call)
+{
+    return platform().mainRunLoop.performAndWait(call);
+}
+
+bool OBMediaManager::startThread(const std::string& name, std::function<void()> body)
+{
+    return _state->core->startThread(
+        name, [manager = shared_from_this(), work = std::move(body)] { work(); });
+}
+
+void OBMediaManager::observeNotification(
+    platform::NotificationCenter& center, std::string_view name, platform::NotificationCenter::Handler handler)
+{
+    const auto call = [manager = weak_from_this(), work = std::move(handler)](const platform::Notification& posted) {
+        const auto alive = manager.lock();
+        if (alive && !alive->_state->ended.isRaised())
+            work(posted);
+    };
+    _state->addNotification(center, center.addObserver(name, nullptr, call));
+}
+
+void OBMediaManager::requestRootMediaGroup(OBExecutor executor, std::function<void(OBLoadResult)> completion)
+{
+    _state->requestTree(std::move(executor), std::move(completion));
+}
+
+void OBMediaManager::cancelLoad()
+{
+    _state->gate.requestCancel();
+}
+
+OBObservation OBMediaManager::observe(OBExecutor executor, OBManagerCallbacks callbacks)
+{
+    auto observer = _state->addObserver(std::move(executor), std::move(callbacks));
+    return OBObservation(std::shared_ptr<void>(nullptr, [observer](void*) { observer->takenBack = true; }));
+}
+
+OBLoadProgress OBMediaManager::loadProgress() const
+{
+    return _state->progress.now();
+}
+
+std::vector<OBLoadProblem> OBMediaManager::loadProblems() const
+{
+    return _state->problems();
+}
+
+void OBMediaManager::setScanObserver(std::shared_ptr<OBScanObserver> observer)
+{
+    _state->scanObserver.store(std::move(observer));
+}
+
+void OBMediaManager::wasHandedOut()
+{
+    _state->wasHandedOut();
+}
+
+void OBMediaManager::end()
+{
+    _state->end();
+}

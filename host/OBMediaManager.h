@@ -1,0 +1,173 @@
+#pragma once
+
+#include "host/OBBundle.h"
+#include "host/OBExecutor.h"
+#include "host/OBExport.h"
+#include "host/OBLoad.h"
+#include "host/OBMediaGroup.h"
+#include "host/OBPathWatcher.h"
+#include "host/OBScanObserver.h"
+#include "platform/FileSystem.h"
+#include "platform/Notifications.h"
+#include "platform/Platform.h"
+
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+class FrameworkCore;
+class OBMediaManagerClass;
+class OBSourceInspection;
+struct ManagerState;
+
+/// What a manager is made with. Handed through by a plug-in's `alloc`; made by the framework alone.
+class OBManagerContext {
+public:
+    OBManagerContext(std::shared_ptr<FrameworkCore> core, std::shared_ptr<const OBBundle> bundle)
+        : _core(std::move(core))
+        , _bundle(std::move(bundle))
+    {
+    }
+
+private:
+    friend class OBMediaManager;
+    friend struct ManagerState;
+    std::shared_ptr<FrameworkCore> _core;
+    std::shared_ptr<const OBBundle> _bundle;
+};
+
+/// Declares that a class is a complete source plug-in.
+class OBMediaManagerPlugin_MustImplement {
+protected:
+    ~OBMediaManagerPlugin_MustImplement() = default;
+};
+
+/// Takes back what it stands for when it is destroyed. A call that has already begun may still be running then, unless
+/// it is destroyed on the thread on which the executor runs calls.
+class OB_EXPORT OBObservation {
+public:
+    OBObservation() = default;
+    explicit OBObservation(std::shared_ptr<void> registration)
+        : _registration(std::move(registration))
+    {
+    }
+
+private:
+    std::shared_ptr<void> _registration;
+};
+
+/// One source of media: the base class of every source plug-in, and what an application drives it by.
+///
+/// Contents: what a plug-in overrides (identity, loading, messages); the services it calls on itself; what an application
+/// calls. The framework makes a manager through its plug-in's class, calls `init`, and hands it out; when the application
+/// has dropped its last reference the manager ends: registrations are taken back, sleeps end, a cancel is pending, and
+/// `dealloc` runs when the last call in flight has returned. Nobody waits for that.
+class OB_EXPORT OBMediaManager : public OBPathWatcherObserver, public std::enable_shared_from_this<OBMediaManager> {
+public:
+    explicit OBMediaManager(const OBManagerContext& context);
+    ~OBMediaManager() override;
+    OBMediaManager(const OBMediaManager&) = delete;
+    OBMediaManager& operator=(const OBMediaManager&) = delete;
+
+    // What a plug-in overrides. `init` is called once, by the framework, before anything else; false hands out nothing.
+    // An override calls the base first in `init`, last in `dealloc`.
+
+    virtual bool init();
+    virtual void dealloc();
+
+    /// Starts a load and answers at once. The framework calls it on the load thread, where the base operation runs the
+    /// load itself.
+    virtual void loadData();
+    /// Builds a new tree, on the load thread; the framework installs it. Null leaves what is installed.
+    virtual OBMediaGroupRef performLoadData();
+    /// Whether a load can produce anything now.
+    virtual bool canLoadData();
+
+    /// All groups that hold media, as a flat list.
+    virtual OBMediaGroupList mediaGroups();
+    virtual OBMediaGroupList movieGroups();
+
+    virtual platform::Text displayName();
+    virtual OBImageRef displayImage();
+    virtual platform::Text uniqueID();
+    virtual platform::Text rootMediaGroupTitle();
+    virtual OBImageRef rootMediaGroupIcon();
+    virtual int mediaTypesSupported();
+
+    virtual platform::Text applicationVersion();
+    virtual bool appInstalled();
+    /// Absent when the source's application is not installed.
+    virtual platform::Text getAppPath();
+
+    /// What to show for an empty group; absent for no message.
+    virtual platform::Text defaultNoDataMessage(const OBMediaGroupRef& group);
+
+    /// What the source tells beside its tree; null when it offers nothing.
+    virtual OBSourceInspection* inspection();
+
+    // Services that a plug-in calls on itself. Any thread.
+
+    /// The installed tree, at once; null before the first load.
+    OBMediaGroupRef rootMediaGroup() const;
+    /// Publishes a tree, new or changed in place.
+    void setRootMediaGroup(OBMediaGroupRef group);
+    /// Whether whoever scans is to stop.
+    bool isCancelLoadRequestPending() const noexcept;
+    /// True until the first `loadData` has returned.
+    bool firstTimeCallingLoadData() const;
+    void setNeedsReload(bool needsReload);
+    void setAutoReloadEnabled(bool enabled);
+    /// 0.5 and above is normal priority; below, the load thread becomes nicer, up to the nicest at 0.0.
+    void setLoadThreadPriority(double priority);
+    double loadThreadPriority() const;
+    const OBBundle& pluginBundle() const;
+    platform::Text pluginIdentifier() const;
+    /// Absent when the plug-in's string table has no text for `key`.
+    platform::Text localizedString(std::string_view key) const;
+
+    const platform::Platform& platform() const;
+    /// All values of a preferences domain; null when it has none. Why one cannot be read is logged, once.
+    platform::Value preferencesOfDomain(std::string_view domain);
+    /// Lists a folder for a scan: keeps the progress and notes why a folder that is there cannot be read.
+    platform::FolderListing listFolder(const platform::Text& path, const platform::ListingRequest& request);
+    /// For the progress: folders that will be listed, media objects made, items that a rule kept out.
+    void noteFoldersFound(std::uint64_t count);
+    void noteItemsFound(std::uint64_t count);
+    void noteItemsSkipped(std::uint64_t count);
+    /// For the progress: what is being read now.
+    void notePathAtWork(const platform::Text& path);
+    /// Who is told what a scan decides; null when nobody is. The scan that starts sees one that was set before it.
+    std::shared_ptr<OBScanObserver> scanObserver() const;
+
+    /// Runs `call` on the main thread and waits; false, with `call` not run, when the main loop has ended.
+    bool performOnMainThreadAndWait(const std::function<void()>& call);
+    /// Runs `body` on a thread of its own, which keeps this manager alive. False when there is none to be had.
+    bool startThread(const std::string& name, std::function<void()> body);
+    /// Calls `handler` for notifications called `name` until the manager ends.
+    void observeNotification(
+        platform::NotificationCenter& center, std::string_view name, platform::NotificationCenter::Handler handler);
+
+    // What an application calls. Any thread.
+
+    /// Delivers the tree through `executor`, after a load if one is needed. Answers at once.
+    void requestRootMediaGroup(OBExecutor executor, std::function<void(OBLoadResult)> completion);
+    /// Asks the loads and reloads at work to stop; void when none is at work.
+    void cancelLoad();
+    /// Calls back through `executor` until the observation is dropped. Where automatic reloads are enabled, whoever
+    /// observes gets a tree without asking for one.
+    [[nodiscard]] OBObservation observe(OBExecutor executor, OBManagerCallbacks callbacks);
+    OBLoadProgress loadProgress() const;
+    /// The folders that the last load could not read.
+    std::vector<OBLoadProblem> loadProblems() const;
+    void setScanObserver(std::shared_ptr<OBScanObserver> observer);
+
+    /// For the framework: `init` has succeeded and the application has the manager; it has dropped it.
+    void wasHandedOut();
+    void end();
+
+private:
+    const std::unique_ptr<ManagerState> _state;
+};

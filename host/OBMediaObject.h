@@ -1,0 +1,136 @@
+#pragma once
+
+#include "host/OBExport.h"
+#include "host/OBImage.h"
+#include "platform/ThreadSafety.h"
+#include "platform/Value.h"
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+class OBMarvexProperties;
+class OBMediaObject;
+class OBMediaObjectBatch;
+using OBMediaObjectRef = std::shared_ptr<OBMediaObject>;
+using OBMarvexPropertiesRef = std::shared_ptr<const OBMarvexProperties>;
+
+/// What many media objects have in common; made once and shared by all of them.
+struct OBMediaObjectKind {
+    int mediaType = 0;
+    int mediaSourceType = 0;
+    platform::Text sourcePluginIdentifier {};
+    OBImageRef icon {};
+    /// Attributes whose value is the object's own path.
+    std::vector<platform::Text> ownPathKeys {};
+};
+
+/// The files of one folder that became media objects of one kind. Immutable; objects and their pictures share it.
+struct OBMediaFolder : std::enable_shared_from_this<OBMediaFolder> {
+    std::shared_ptr<const OBMediaObjectKind> kind;
+    platform::Text path; ///< without a slash at its end
+    std::string fileNames; ///< one after the other
+    bool pathIsReal = false; ///< the folder's path holds no symbolic link
+};
+
+/// The metadata-search properties of one file, by the attributes of the query language (kMDItemFSName and so on).
+/// Answered at once; the file is read when the first property is. Any thread; reading may block.
+class OB_EXPORT OBMarvexProperties {
+public:
+    explicit OBMarvexProperties(platform::Text path);
+
+    platform::Text path() const { return _path; }
+    /// A dictionary; null when nothing exists at the path.
+    platform::Value all() const;
+    platform::Value valueForKey(std::string_view key) const;
+
+private:
+    const platform::Text _path;
+    mutable platform::Mutex _lock;
+    mutable std::optional<platform::Value> _read GUARDED_BY(_lock);
+};
+
+/// One movie file of the tree.
+///
+/// An object is made by itself with `initWithMediaType_name`, or together with the other files of its folder by
+/// `OBMediaObjectBatch`; the latter keeps a file name each and computes paths and attributes when asked.
+/// Any thread may read and write; a reader sees each field before or after a change.
+class OB_EXPORT OBMediaObject {
+public:
+    OBMediaObject();
+    ~OBMediaObject();
+    OBMediaObject(const OBMediaObject&) = delete;
+    OBMediaObject& operator=(const OBMediaObject&) = delete;
+
+    /// A new object that stands for no file yet.
+    static OBMediaObjectRef initWithMediaType_name(int mediaType, platform::Text name);
+
+    int mediaType() const;
+    /// The display name.
+    platform::Text name() const;
+    int mediaSourceType() const;
+    void setMediaSourceType(int code);
+    platform::Text sourcePluginIdentifier() const;
+    void setSourcePluginIdentifier(platform::Text identifier);
+
+    /// The file; absent when none was set.
+    platform::Text path() const;
+    void setPath(platform::Text path);
+    /// Takes over the path of another object, and what is known of it.
+    void setPathOfObject(const OBMediaObject& other);
+    /// The real path: every symbolic link on the way resolved. Absent when nothing exists there. Asks the file system.
+    platform::Text aliasResolvedPath() const;
+
+    /// The properties of the file at `path`, read when first asked for.
+    static OBMarvexPropertiesRef marvexProperties(platform::Text path);
+    /// Those that were set; else those of the object's own file.
+    OBMarvexPropertiesRef marvexProperties() const;
+    void setMarvexProperties(OBMarvexPropertiesRef properties);
+
+    /// A null value when the object has no such attribute.
+    platform::Value attributeForKey(std::string_view key) const;
+    void setAttribute_forKey(platform::Value value, platform::Text key);
+    /// All attributes, in the order in which they came.
+    platform::Value::Dictionary attributes() const;
+
+    /// Null when none was set.
+    OBImageRef icon() const;
+    void setIcon(OBImageRef icon);
+
+    /// The picture of the movie, produced on first request: reads the movie's header, sets the resolution and duration
+    /// attributes, and answers an image whose pixels nobody has read yet; null for a file that is no movie.
+    ///
+    /// Evaluated on the main thread only: on any other thread the call asks the main thread and waits. Once produced,
+    /// every thread gets the same image at once. Null, with nothing set, when the main loop has ended.
+    OBImageRef thumbnailImage();
+    void setThumbnailImage(OBImageRef image);
+    /// What `thumbnailImage` would answer without producing anything.
+    OBImageRef thumbnailIfProduced() const;
+    /// Whether the thumbnail has been produced, be it null.
+    bool hasProducedThumbnail() const;
+
+private:
+    friend class OBMediaObjectBatch;
+    struct OwnFields;
+    class MovieThumbnail;
+
+    OwnFields& own() REQUIRES(_lock);
+    std::string_view fileName() const;
+    platform::Text pathLocked() const REQUIRES(_lock);
+    template <class Visitor> void visitAttributes(const Visitor& visitor) const REQUIRES(_lock);
+    void produceThumbnail();
+
+    // Constant once the object is handed out: which file of the folder this is; no folder for an object made by itself.
+    const OBMediaFolder* _folder = nullptr;
+    std::uint32_t _nameOffset = 0;
+    std::uint32_t _nameLength = 0;
+
+    mutable platform::SmallLock _lock;
+    bool _pathIsReal GUARDED_BY(_lock) = false; // the path was seen to hold no symbolic link: it is its own real path
+    bool _thumbnailProduced GUARDED_BY(_lock) = false;
+    std::unique_ptr<OwnFields> _own GUARDED_BY(_lock); // what differs from the kind and the folder
+    std::shared_ptr<MovieThumbnail> _movie GUARDED_BY(_lock); // what the header told; null for a file that is no movie
+};

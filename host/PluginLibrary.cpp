@@ -1,0 +1,230 @@
+// Bundles: which are there, which of them this host can use, and the managers made of them.
+//
+// The one surprise: a plug-in's code runs only when one of its managers is wanted. Until then its manifest has to do.
+
+#include "host/PluginLibrary.h"
+
+#include "platform/Bundles.h"
+#include "platform/FileSystem.h"
+#include "platform/Languages.h"
+#include "platform/PathText.h"
+
+#include <algorithm>
+#include <exception>
+#include <utility>
+
+using platform::Locked;
+using platform::Value;
+
+namespace {
+
+constexpr std::string_view bundleExtension = "obplugin";
+constexpr std::string_view fallbackLanguage = "en";
+
+/// Ends its manager when the application has dropped the last reference.
+struct Ownership {
+    explicit Ownership(std::shared_ptr<OBMediaManager> owned)
+        : manager(std::move(owned))
+    {
+    }
+    ~Ownership() { manager->end(); }
+    Ownership(const Ownership&) = delete;
+    Ownership& operator=(const Ownership&) = delete;
+
+    const std::shared_ptr<OBMediaManager> manager;
+};
+
+/// Ends a manager's life: `dealloc` answers `init`, where that succeeded.
+struct Deallocate {
+    bool isReady = false;
+
+    void operator()(OBMediaManager* manager) const
+    {
+        const std::unique_ptr<OBMediaManager> last(manager);
+        if (last && isReady)
+            last->dealloc();
+    }
+};
+
+/// Calls code of a plug-in; the text of what it throws, or nothing.
+template <class Call> std::string textOfThrown(const Call& call)
+{
+    try {
+        call();
+        return {};
+    } catch (const std::exception& error) {
+        return std::string("it threw: ") + error.what();
+    } catch (...) {
+        return "it threw";
+    }
+}
+
+std::vector<std::string> bundlesIn(const platform::FileSystem& fileSystem, const std::string& folder)
+{
+    std::vector<std::string> paths;
+    const platform::FolderListing listing = fileSystem.itemsInFolder(folder, {});
+    for (const platform::FolderItem item : listing) {
+        if (platform::extensionOfName(item.name) == bundleExtension)
+            paths.push_back(platform::pathJoined(folder, item.name));
+    }
+    std::sort(paths.begin(), paths.end());
+    return paths;
+}
+
+std::string versionProblem(const platform::BundleManifest& manifest)
+{
+    if (manifest.hostInterfaceMinimum <= OBHostInterfaceVersion && OBHostInterfaceVersion <= manifest.hostInterfaceMaximum)
+        return {};
+    return "made for host interface " + std::to_string(manifest.hostInterfaceMinimum) + " to "
+        + std::to_string(manifest.hostInterfaceMaximum) + ", this is " + std::to_string(OBHostInterfaceVersion);
+}
+
+} // namespace
+
+PluginLibrary::PluginLibrary(FrameworkCore& core, std::vector<std::string> folders)
+    : _core(core)
+{
+    folders.push_back(core.platform().bundles.installedPluginsFolder());
+    Locked guard(_lock);
+    for (const std::string& folder : folders) {
+        for (std::string& path : bundlesIn(core.platform().fileSystem, folder)) {
+            const auto known = std::find_if(
+                _plugins.begin(), _plugins.end(), [&](const Plugin& other) { return other.info.path == path; });
+            if (known != _plugins.end())
+                continue;
+            Plugin plugin = readBundle(std::move(path));
+            const Plugin* first = find(plugin.info.identifier);
+            if (first && plugin.info.reason.empty())
+                plugin.info.reason = "the plug-in is there already, in " + first->info.path;
+            _plugins.push_back(std::move(plugin));
+        }
+    }
+}
+
+PluginLibrary::Plugin PluginLibrary::readBundle(std::string path) const
+{
+    Plugin plugin;
+    platform::ManifestAnswer answer = _core.platform().bundles.readManifest(path);
+    plugin.info = { answer.manifest.identifier, answer.manifest.version, std::move(path), false, answer.problem };
+    if (plugin.info.reason.empty())
+        plugin.info.reason = versionProblem(answer.manifest);
+    plugin.manifest = std::move(answer.manifest);
+    return plugin;
+}
+
+std::vector<OBPluginInfo> PluginLibrary::plugins() const
+{
+    std::vector<OBPluginInfo> result;
+    Locked guard(_lock);
+    for (const Plugin& plugin : _plugins)
+        result.push_back(plugin.info);
+    return result;
+}
+
+/// The bundle that is used for `identifier`: the first that is not refused, else the first.
+PluginLibrary::Plugin* PluginLibrary::find(std::string_view identifier)
+{
+    Plugin* refused = nullptr;
+    for (Plugin& plugin : _plugins) {
+        if (identifier.empty() || plugin.info.identifier != identifier)
+            continue;
+        if (plugin.info.reason.empty())
+            return &plugin;
+        refused = refused ? refused : &plugin;
+    }
+    return refused;
+}
+
+void PluginLibrary::load(Plugin& plugin)
+{
+    if (plugin.managerClass || !plugin.info.reason.empty())
+        return;
+    const std::string file = platform::pathJoined(plugin.info.path, plugin.manifest.library);
+    const platform::LibraryAnswer library = _core.platform().bundles.loadLibrary(file, OBPluginEntryPointName);
+    plugin.info.reason = library.problem;
+    if (!library.entryPoint)
+        return;
+    const auto entryPoint = reinterpret_cast<OBPluginEntryPoint>(library.entryPoint);
+    plugin.info.reason = textOfThrown([&] { plugin.managerClass = entryPoint(); });
+    if (plugin.info.reason.empty() && !plugin.managerClass)
+        plugin.info.reason = plugin.manifest.library + ": offers no source";
+    plugin.info.loaded = plugin.info.reason.empty();
+    if (plugin.info.loaded) {
+        plugin.bundle = std::make_shared<const OBBundle>(
+            _core.platform().bundles, plugin.info.path, plugin.manifest, stringTable(plugin));
+    }
+}
+
+/// The texts in the first of the user's languages that the bundle has, else in English.
+Value PluginLibrary::stringTable(const Plugin& plugin)
+{
+    std::vector<std::string> wanted = _core.platform().languages.preferredLanguages();
+    wanted.emplace_back(fallbackLanguage);
+    const std::vector<std::string>& offered = plugin.manifest.languages;
+    for (const std::string& language : wanted) {
+        if (std::find(offered.begin(), offered.end(), language) == offered.end())
+            continue;
+        platform::StringTableAnswer answer
+            = _core.platform().bundles.readStringTable(plugin.info.path, language);
+        if (answer.problem.empty())
+            return std::move(answer.table);
+        _core.logOnce(answer.problem, nullptr);
+    }
+    return {};
+}
+
+const OBMediaManagerClass* PluginLibrary::managerClass(std::string_view identifier)
+{
+    Locked guard(_lock);
+    Plugin* plugin = find(identifier);
+    if (!plugin)
+        return nullptr;
+    load(*plugin);
+    return plugin->info.reason.empty() ? plugin->managerClass : nullptr;
+}
+
+OBManagerResult PluginLibrary::createManager(const std::shared_ptr<FrameworkCore>& core, std::string_view identifier)
+{
+    const OBMediaManagerClass* managerClass = nullptr;
+    std::shared_ptr<const OBBundle> bundle;
+    {
+        Locked guard(_lock);
+        Plugin* plugin = find(identifier);
+        if (!plugin)
+            return { nullptr, "no plug-in called " + std::string(identifier) };
+        load(*plugin);
+        if (!plugin->info.reason.empty())
+            return { nullptr, plugin->info.path + ": " + plugin->info.reason };
+        managerClass = plugin->managerClass;
+        bundle = plugin->bundle;
+    }
+
+    std::unique_ptr<OBMediaManager> made;
+    std::string problem = textOfThrown([&] { made = managerClass->alloc(OBManagerContext(core, bundle)); });
+    if (problem.empty() && !made)
+        problem = "it made no manager";
+    const std::shared_ptr<OBMediaManager> manager(made.release(), Deallocate {});
+    bool isReady = false;
+    if (problem.empty())
+        problem = textOfThrown([&] { isReady = manager->init(); });
+    if (problem.empty() && !isReady)
+        problem = "its manager did not become ready";
+    if (!problem.empty()) {
+        refuse(identifier, problem);
+        return { nullptr, bundle->folder() + ": " + problem };
+    }
+    std::get_deleter<Deallocate>(manager)->isReady = true;
+    manager->wasHandedOut();
+    const auto ownership = std::make_shared<Ownership>(manager);
+    return { std::shared_ptr<OBMediaManager>(ownership, manager.get()), {} };
+}
+
+/// A source that could not be made is not offered again: what it left half done is not known.
+void PluginLibrary::refuse(std::string_view identifier, const std::string& reason)
+{
+    Locked guard(_lock);
+    if (Plugin* plugin = find(identifier)) {
+        plugin->info.reason = reason;
+        plugin->info.loaded = false;
+    }
+}

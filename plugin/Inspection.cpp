@@ -1,0 +1,52 @@
+// What the source tells an operator beside its tree. Nothing here runs a load.
+
+#include "plugin/MontaroConstants.h"
+#include "plugin/OBMontaroPlugin.h"
+#include "plugin/SearchFolders.h"
+
+using platform::Text;
+
+namespace {
+
+std::vector<std::string> strings(const std::vector<Text>& texts)
+{
+    std::vector<std::string> result;
+    for (const Text& text : texts)
+        result.push_back(text.string());
+    return result;
+}
+
+} // namespace
+
+OBSourceInspection* OBMontaroPlugin::inspection()
+{
+    return this;
+}
+
+std::vector<std::string> OBMontaroPlugin::projectSearchPaths()
+{
+    const MontaroSearchPaths paths = _MontaroSearchPaths.load();
+    return strings(paths ? *paths : foldersToSearch(platform(), _MontaroDefaultPath(), MontaroProjectsFolderName));
+}
+
+std::vector<std::string> OBMontaroPlugin::eventSearchPaths()
+{
+    const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
+    return strings(
+        paths ? *paths : foldersToSearch(platform(), _MontaroDefaultEventsFolderPath(), MontaroEventsFolderName));
+}
+
+std::optional<bool> OBMontaroPlugin::mostRecentEventFirst() const
+{
+    return _mostRecentEventFirst;
+}
+
+std::optional<double> OBMontaroPlugin::pluginVersionNumber() const
+{
+    return OBMBMontaroPluginVersionNumber;
+}
+
+std::optional<std::string> OBMontaroPlugin::pluginVersionString() const
+{
+    return std::string(reinterpret_cast<const char*>(OBMBMontaroPluginVersionString));
+}

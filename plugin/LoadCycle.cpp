@@ -1,0 +1,139 @@
+// How a load builds a new tree, and what the root group itself shows.
+//
+// The one surprise: on a load the root's children stand in scan order; only a later reload sorts them.
+
+#include "plugin/MontaroConstants.h"
+#include "plugin/OBMontaroPlugin.h"
+#include "plugin/RepresentativeMovie.h"
+#include "plugin/SharedValues.h"
+
+#include "host/OBConstants.h"
+#include "host/OBPathWatcher.h"
+#include "platform/FileSystem.h"
+
+#include <utility>
+
+using platform::Locked;
+using platform::Text;
+
+namespace {
+
+constexpr const char* projectQuery = "(kMDItemFSName = '*.mtrproject'c)";
+constexpr const char* movieQuery = "(kMDItemContentType = 'org.ombrix.movie')";
+constexpr const char* projectFormatVersion = "6";
+
+std::vector<std::string> strings(const std::vector<Text>& texts)
+{
+    std::vector<std::string> result;
+    for (const Text& text : texts)
+        result.push_back(text.string());
+    return result;
+}
+
+} // namespace
+
+void OBMontaroPlugin::loadData()
+{
+    if (firstTimeCallingLoadData()) {
+        const Text preferences = expandingTilde(MontaroPrefsPath);
+        if (preferences && platform().fileSystem.exists(preferences))
+            _watchPath(preferences);
+        _watchPath(_MontaroDefaultPath());
+        observeNotification(platform().workspaceNotifications, platform::volumeMountedNotification,
+            [this](const platform::Notification& notification) { _fileSystemMounted(notification); });
+    }
+    OBMediaManager::loadData();
+}
+
+Text OBMontaroPlugin::expandingTilde(std::string_view path) const
+{
+    const auto home = platform().fileSystem.homeFolder();
+    return home ? Text::joined(*home, path.substr(1)) : Text();
+}
+
+OBMediaGroupRef OBMontaroPlugin::performLoadData()
+{
+    if (!_MontaroSearchPaths.load())
+        _prepareMontaroProjectsSearchPaths();
+    if (!_MontaroEventsSearchPaths.load())
+        _prepareMontaroEventsSearchPaths();
+
+    const OBMediaGroupRef root = OBMediaGroup::initWithTypeIdentifier(OBMontaroRootGroupTypeIdentifier);
+    root->setName(OBMontaro);
+    root->setParentID({});
+    root->setID(OBMontaro);
+    root->setIcon(sharedValues().smallAppIcon.load());
+    root->setDynamicMediaObjects(false);
+
+    const auto watcher = OBPathWatcher::sharedPathWatcher();
+    std::vector<std::string> projectScope;
+    if (const Text path = _MontaroDefaultPath())
+        projectScope.push_back(path.string());
+    watcher->watchQuery_observer_queryScope_queryRunMode(
+        projectQuery, this, std::move(projectScope), OBQueryRunModeLive);
+    {
+        Locked guard(*_MontaroEventsSearchPathsLock);
+        watcher->watchQuery_observer_queryScope_queryRunMode(
+            movieQuery, this, strings(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
+    }
+
+    root->setChildGroups(_reloadMontaroProjects(false));
+    root->addChildGroup(_reloadMontaroEvents_updateRootMediaGroup(root->ID(), false));
+    _setMediaObjectsForRootMediaGroup(root);
+    return root;
+}
+
+void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root)
+{
+    OBMediaObjectList objects;
+    for (const OBMediaGroupRef& child : root->childGroups()) {
+        const OBTypeIdentifierRef type = child->typeIdentifier();
+        if (type == OBMontaroProjectLibraryGroupTypeIdentifier)
+            continue;
+        if (type != OBMontaroProjectGroupTypeIdentifier) {
+            objects = objects.appending(child->mediaObjects());
+            continue;
+        }
+        const ChosenMovie chosen = chooseRepresentativeMovie(*this, child->mediaObjects());
+        if (chosen.movie)
+            objects = objects.appending(makeRepresentative(*this, *child, chosen, projectFormatVersion));
+    }
+    root->setMediaObjects(std::move(objects));
+}
+
+bool OBMontaroPlugin::canLoadData()
+{
+    const Text path = getAppPath();
+    return path && platform().fileSystem.exists(path);
+}
+
+OBMediaGroupList OBMontaroPlugin::mediaGroups()
+{
+    const MontaroFlatGroupList events = _flatEventGroupsList.load();
+    const MontaroFlatGroupList projects = _flatProjectGroupsList.load();
+    std::vector<OBMediaGroupRef> groups;
+    for (const MontaroFlatGroupList& list : { events, projects }) {
+        if (!list)
+            continue;
+        const OBMediaGroupList found = list->load();
+        groups.insert(groups.end(), found.begin(), found.end());
+    }
+    return OBMediaGroupList(std::move(groups));
+}
+
+OBMediaGroupList OBMontaroPlugin::movieGroups()
+{
+    return mediaGroups();
+}
+
+Text OBMontaroPlugin::defaultNoDataMessage(const OBMediaGroupRef& group)
+{
+    if (!group)
+        return {};
+    if (group == rootMediaGroup() && group->childGroups().empty())
+        return localizedString("defaultNoDataMessage");
+    if (group->typeIdentifier() == OBMontaroProjectGroupTypeIdentifier && group->childGroups().empty()
+        && group->mediaObjects().empty())
+        return localizedString("MTProjectNotReady");
+    return {};
+}

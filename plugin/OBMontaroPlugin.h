@@ -1,0 +1,158 @@
+#pragma once
+
+#include "host/OBMediaManager.h"
+#include "host/OBSourceInspection.h"
+#include "platform/Notifications.h"
+#include "platform/Snapshot.h"
+#include "platform/ThreadSafety.h"
+
+#include <atomic>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+struct EventScan;
+struct ProjectScan;
+
+/// An ordered list of folders to search; immutable, replaced whole. Null until it has been prepared.
+using MontaroSearchPaths = std::shared_ptr<const std::vector<platform::Text>>;
+
+/// The groups that one scan found, in the order found. A scan extends the list that it made, and only that.
+using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList>>;
+
+/// The source of the video editor Montaro: its project and event libraries as a live tree of groups and movies.
+///
+/// Threads: the framework's load thread runs `performLoadData` and the scans below it; reloads run on whatever thread
+/// heard of a change; thumbnails are produced on the main thread, which therefore never waits for a scan. No two of the
+/// four locks are ever held at once.
+///
+/// Contents, each section in its own file:
+///   identity and lifecycle   OBMontaroPlugin.cpp
+///   load cycle               LoadCycle.cpp
+///   editor                   EditorDiscovery.cpp
+///   projects                 projects/ProjectSearchPaths.cpp, ProjectFolderScan.cpp, ProjectMovies.cpp, ProjectReload.cpp
+///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventPreference.cpp, EventReload.cpp
+///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp
+///   user interaction         ui/Icons.cpp
+///   operators' questions     Inspection.cpp
+class OBMontaroPlugin : public OBMediaManager, public OBMediaManagerPlugin_MustImplement, private OBSourceInspection {
+public:
+    explicit OBMontaroPlugin(const OBManagerContext& context);
+    ~OBMontaroPlugin() override;
+
+    // Identity and lifecycle
+
+    bool init() override;
+    void dealloc() override;
+    static bool isManagedMediaSource();
+    platform::Text displayName() override;
+    OBImageRef displayImage() override;
+    platform::Text uniqueID() override;
+    platform::Text rootMediaGroupTitle() override;
+    int mediaTypesSupported() override;
+
+    // Load cycle
+
+    void loadData() override;
+    OBMediaGroupRef performLoadData() override;
+    bool canLoadData() override;
+    OBMediaGroupList mediaGroups() override;
+    OBMediaGroupList movieGroups() override;
+    platform::Text defaultNoDataMessage(const OBMediaGroupRef& group) override;
+    /// Builds the root group's own media objects from its direct children: one representative a project, and all objects
+    /// of any other group.
+    void _setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root);
+
+    // Editor
+
+    platform::Text getAppPath() override;
+    bool appInstalled() override;
+    platform::Text applicationVersion() override;
+
+    // Projects
+
+    /// A list that holds the list of the private type's name.
+    static platform::Value supportedPasteboardTypes();
+    /// The project folder in the user's home; absent while no home folder is known. Asked for once a process.
+    platform::Text _MontaroDefaultPath();
+    void _prepareMontaroProjectsSearchPaths();
+    /// Scans all project libraries; with `updateRoot`, puts the result into the installed tree too.
+    OBMediaGroupList _reloadMontaroProjects(bool updateRoot);
+    OBMediaGroupList _reloadMontaroProjects();
+    /// Puts the scanned projects in place of the root's old ones; `library` holds those of all libraries.
+    void finishReloadMontaroProjects(const OBMediaGroupRef& library);
+    /// Whether a folder is a project.
+    bool _isMTProject(std::string_view path);
+    OBMediaGroupRef _createMontaroProjectsFolderForPath(const platform::Text& path, ProjectScan& scan);
+    /// Gives a folder group one representative movie a project below it.
+    void _createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder);
+    /// The movies that were shared from the project, in listing order.
+    std::vector<std::string> _renderedMoviesPathsForProjectPath(const platform::Text& path);
+    /// The first of them; absent when there is none.
+    std::optional<std::string> _previewFileForProjectPath(const platform::Text& path);
+
+    // Events
+
+    /// The event folder in the user's home; absent while no home folder is known. Asked for once a process.
+    platform::Text _MontaroDefaultEventsFolderPath();
+    void _prepareMontaroEventsSearchPaths();
+    /// Scans all event libraries into one library group; null when the walk was cancelled. With `updateRoot`, puts it into
+    /// the installed tree too.
+    OBMediaGroupRef _reloadMontaroEvents_updateRootMediaGroup(const platform::Text& parentID, bool updateRoot);
+    OBMediaGroupRef _reloadMontaroEvents();
+    /// Puts the scanned events in place of the root's old ones, or nothing when they hold no media object. `library` may be
+    /// null.
+    void finishReloadMontaroEvents(const OBMediaGroupRef& library);
+    /// Reads the editor's choice of order.
+    void _checkMontaroPreferences();
+
+    // Watching
+
+    void _watchPath(const platform::Text& path);
+    /// A volume was mounted: a thread of its own adds its event folder to those that are searched.
+    void _fileSystemMounted(const platform::Notification& notification);
+    void _fileSystemMountedThreaded(const platform::Notification& notification);
+
+    // User interaction
+
+    OBImageRef rootMediaGroupIcon() override;
+    void _grabMontaroIcons();
+
+    // Operators' questions
+
+    OBSourceInspection* inspection() override;
+
+private:
+    std::vector<std::string> projectSearchPaths() override;
+    std::vector<std::string> eventSearchPaths() override;
+    std::optional<bool> mostRecentEventFirst() const override;
+    std::optional<double> pluginVersionNumber() const override;
+    std::optional<std::string> pluginVersionString() const override;
+
+    bool addEventsSearchPath(const platform::Text& path);
+    /// An absolute path for one that begins with "~"; absent while no home folder is known.
+    platform::Text expandingTilde(std::string_view path) const;
+    void dropAppIcon() NO_THREAD_SAFETY_ANALYSIS;
+    OBMediaGroupRef projectGroup(const platform::Text& listedFolder, const platform::FolderItem& item, ProjectScan& scan);
+
+    // In the order in which they are declared. The locks exist from `init` to `dealloc`.
+
+    std::unique_ptr<platform::RecursiveMutex> _appIconLock;
+    OBImageRef _appIcon GUARDED_BY(*_appIconLock);
+    platform::Snapshot<MontaroSearchPaths> _MontaroSearchPaths; // replaced under its lock, tested for null without
+    platform::Snapshot<MontaroSearchPaths> _MontaroEventsSearchPaths; // likewise
+    platform::Text _MontaroAppVersionString; // the version is a fixed text; this stays absent
+    std::atomic<bool> _missingMontaroDefaultPath { false };
+    std::atomic<bool> _mostRecentEventFirst { false }; // written under _updatePreferencesLock
+    std::unique_ptr<platform::Mutex> _updatePreferencesLock;
+    platform::Snapshot<MontaroFlatGroupList> _flatEventGroupsList;
+    platform::Snapshot<MontaroFlatGroupList> _flatProjectGroupsList;
+    std::unique_ptr<platform::Mutex> _MontaroSearchPathsLock; // held for a whole projects scan
+    std::unique_ptr<platform::Mutex> _MontaroEventsSearchPathsLock; // held for a whole events folder walk
+    std::atomic<bool> _poolingProjectsReload { false };
+    std::atomic<bool> _poolingEventsReload { false };
+    std::map<std::string, OBImageRef> cachedIcons; // images are shared by the class instead; this stays empty
+};

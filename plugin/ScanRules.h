@@ -1,0 +1,51 @@
+#pragma once
+
+#include "platform/FileSystem.h"
+#include "platform/PathText.h"
+
+#include <algorithm>
+#include <array>
+#include <string_view>
+
+/// One reason for which a scan takes an item or keeps it out. The scans apply these and nothing else, so that whoever asks
+/// why something is not listed is told by the rule that decided.
+struct ScanRule {
+    std::string_view name; ///< what the rule is about
+    bool (*passes)(const platform::FolderItem& item);
+    std::string_view passed; ///< what is so when it passes, for people
+    std::string_view failed; ///< what is so when it does not
+    std::string_view remedy; ///< what would make it pass
+};
+
+namespace ScanRules {
+
+/// The extensions of movies that a project was shared as. Case matters.
+inline constexpr std::array<std::string_view, 4> movieExtensions { "mov", "m4v", "mp4", "3gp" };
+
+inline constexpr ScanRule nameIsNotHidden { "hidden name",
+    [](const platform::FolderItem& item) { return !item.name.empty() && item.name.front() != '.'; },
+    "its name does not begin with a full stop", "its name begins with a full stop",
+    "rename it so that its name does not begin with a full stop" };
+
+inline constexpr ScanRule isVisible { "hidden file",
+    [](const platform::FolderItem& item) { return !item.flags.invisible; }, "no file .hidden names it",
+    "the file .hidden of its folder names it", "remove its name from the file .hidden of its folder" };
+
+inline constexpr ScanRule isContainer { "folder",
+    [](const platform::FolderItem& item) { return item.flags.container; }, "it is a folder",
+    "it is neither a project nor a folder", "move it out of the library, or share the project that it belongs to" };
+
+inline constexpr ScanRule isNotPackage { "package",
+    [](const platform::FolderItem& item) { return !item.flags.package; }, "it is a plain folder",
+    "its extension makes it a package, which is shown as one file", "remove its extension" };
+
+inline constexpr ScanRule hasMovieExtension { "extension",
+    [](const platform::FolderItem& item) {
+        return std::find(movieExtensions.begin(), movieExtensions.end(), platform::extensionOfName(item.name))
+            != movieExtensions.end();
+    },
+    "its extension is a project movie's",
+    "its extension is not one of mov, m4v, mp4, 3gp (case matters for project movies)",
+    "give it the extension mov, m4v, mp4 or 3gp" };
+
+} // namespace ScanRules

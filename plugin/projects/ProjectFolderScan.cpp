@@ -1,0 +1,160 @@
+// Project libraries become folder and project groups.
+//
+// The one surprise: what comes out is what the libraries hold, merged; the group of a library itself lives for one scan,
+// tagged as a project group.
+
+#include "plugin/MontaroConstants.h"
+#include "plugin/SharedValues.h"
+#include "plugin/projects/ProjectScan.h"
+
+#include "host/OBConstants.h"
+#include "platform/FileSystem.h"
+#include "platform/PathText.h"
+
+#include <utility>
+
+using platform::FileProblem;
+using platform::FolderItem;
+using platform::FolderListing;
+using platform::Locked;
+using platform::Text;
+
+namespace {
+
+constexpr std::string_view localizedExtension = "localized";
+
+/// Names and flags of the entries, and of each whether it is a project and since when.
+constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPathComponent, true };
+
+/// What all movies of all projects share.
+std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin)
+{
+    return std::make_shared<const OBMediaObjectKind>(OBMediaObjectKind { OBMediaTypeMovie, OBMediaSourceTypePlugin,
+        plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey } });
+}
+
+OBMediaGroupRef groupForFolder(OBTypeIdentifierRef type, const Text& path, const Text& parentID, const OBImageRef& icon)
+{
+    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    group->setName(platform::lastPathComponent(path));
+    group->setParentID(parentID);
+    group->setID(path);
+    group->setIcon(icon);
+    group->setPath(path);
+    return group;
+}
+
+} // namespace
+
+OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
+{
+    _poolingProjectsReload = false;
+    ProjectScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), movieKind(*this),
+        sharedValues().projectIcon.load(), sharedValues().emptyProjectIcon.load() };
+    _flatProjectGroupsList.store(scan.flatGroups);
+
+    std::vector<OBMediaGroupRef> libraries;
+    {
+        Locked guard(*_MontaroSearchPathsLock);
+        const MontaroSearchPaths paths = _MontaroSearchPaths.load();
+        for (const Text& path : paths ? *paths : std::vector<Text>()) {
+            if (isCancelLoadRequestPending())
+                break;
+            if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
+                library->setName(localizedString("MontaroProjectLibrary"));
+                library->setTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
+                library->setParentID(OBMontaro);
+                library->setID(path);
+                library->setIcon(sharedValues().smallAppIcon.load());
+                libraries.push_back(library);
+            }
+            _watchPath(path);
+        }
+    }
+
+    if (!libraries.empty() && !isCancelLoadRequestPending() && updateRoot) {
+        for (std::size_t index = 1; index < libraries.size(); ++index)
+            libraries.front()->addChildGroups(libraries[index]->childGroups());
+        finishReloadMontaroProjects(libraries.front());
+        if (const OBMediaGroupRef root = rootMediaGroup()) {
+            _setMediaObjectsForRootMediaGroup(root);
+            setRootMediaGroup(root);
+        }
+    }
+
+    OBMediaGroupList result;
+    for (const OBMediaGroupRef& library : libraries)
+        result = result.appending(library->childGroups());
+    return result;
+}
+
+bool OBMontaroPlugin::_isMTProject(std::string_view path)
+{
+    return platform().fileSystem.exists(platform::pathJoined(path, MontaroProjectIdentifierPathComponent));
+}
+
+OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text& path, ProjectScan& scan)
+{
+    if (!path)
+        return nullptr;
+    const OBMediaGroupRef folder = groupForFolder(OBMontaroFolderGroupTypeIdentifier, path,
+        platform::pathByRemovingLastComponent(path), scan.projectIcon);
+
+    // A folder may be known to people by a name with an extension that it does not have on disk.
+    Text listed = path;
+    FolderListing listing = listFolder(path, projectListing);
+    folder->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
+                                                       : OBMediaGroup::modDateForFile(path));
+    if (listing.problem() != FileProblem::none
+        && platform::extensionOfName(platform::lastPathComponent(path)) == localizedExtension) {
+        listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
+        listing = listFolder(listed, projectListing);
+    }
+
+    noteFoldersFound(listing.size());
+    for (const FolderItem item : listing) {
+        if (!scan.report.passes(ScanRules::nameIsNotHidden, item, listed)
+            || !scan.report.passes(ScanRules::isVisible, item, listed))
+            continue;
+        if (item.marker == platform::MarkerAnswer::present) {
+            folder->addChildGroup(projectGroup(listed, item, scan));
+        } else if (scan.report.passes(ScanRules::isContainer, item, listed)
+            && scan.report.passes(ScanRules::isNotPackage, item, listed)) {
+            const OBMediaGroupRef subfolder
+                = _createMontaroProjectsFolderForPath(Text::joined(listed, "/", item.name), scan);
+            subfolder->setParentID(folder->ID());
+            folder->addChildGroup(subfolder);
+        }
+    }
+
+    if (folder->childGroups().empty()) {
+        const OBMediaGroupRef placeholder = groupForFolder(listed == _MontaroDefaultPath()
+                ? OBMontaroProjectLibraryGroupTypeIdentifier
+                : OBMontaroFolderGroupTypeIdentifier,
+            listed, listed, scan.projectIcon);
+        placeholder->setModificationDate(listed == path ? folder->modificationDate()
+                                                        : OBMediaGroup::modDateForFile(listed));
+        scan.addToFlatGroups(placeholder);
+    }
+    _createMontaroProjectsFolderMediaObjects(folder);
+    return folder;
+}
+
+/// One project of `listedFolder`. It shows in the flat list before its movies are known.
+OBMediaGroupRef OBMontaroPlugin::projectGroup(const Text& listedFolder, const FolderItem& item, ProjectScan& scan)
+{
+    const Text path = Text::joined(listedFolder, "/", item.name);
+    const OBMediaGroupRef project
+        = groupForFolder(OBMontaroProjectGroupTypeIdentifier, path, listedFolder, scan.projectIcon);
+    project->setName(platform::nameWithoutExtension(item.name));
+    project->setModificationDate(
+        item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
+    scan.addToFlatGroups(project);
+
+    const SharedMovies movies = sharedMoviesOfProject(*this, scan.report, path);
+    project->setMediaObjects(OBMediaObjectBatch::objects(
+        scan.movieKind, { movies.folder, movies.listing.pathIsReal() }, movies.files));
+    project->setIcon(movies.files.empty() ? scan.emptyProjectIcon : scan.projectIcon);
+    noteItemsFound(movies.files.size());
+    return project;
+}

@@ -1,0 +1,127 @@
+#include "apps/common/LoadWatch.h"
+
+#include "apps/common/DisplayWidth.h"
+#include "apps/common/HostileNames.h"
+#include "apps/common/HumanText.h"
+#include "apps/common/StandardError.h"
+#include "apps/common/Terminal.h"
+#include "platform/Clock.h"
+#include "platform/PathText.h"
+#include "platform/ThreadSafety.h"
+#include "platform/Threads.h"
+#include "platform/Volumes.h"
+
+#include <set>
+#include <string>
+#include <utility>
+
+#include <unistd.h>
+
+namespace apps {
+namespace {
+
+    using namespace std::chrono_literals;
+
+    constexpr auto untilFirstLine = 300ms;
+    constexpr auto betweenLines = 100ms;
+    constexpr auto patience = 3s;
+    constexpr std::string_view volumesFolder = "/Volumes";
+
+} // namespace
+
+struct LoadWatch::Watching {
+    explicit Watching(std::shared_ptr<OBMediaManager> watched)
+        : manager(std::move(watched))
+        , platform(manager->platform())
+        , isTerminal(apps::isTerminal(STDERR_FILENO))
+        , started(platform.clock.monotonic())
+    {
+    }
+
+    void run()
+    {
+        leaveSignalsToOtherThreads();
+        auto delay = std::chrono::nanoseconds(untilFirstLine);
+        while (platform.clock.sleep(delay, ended)) {
+            tell(manager->loadProgress());
+            delay = betweenLines;
+        }
+    }
+
+    void tell(const OBLoadProgress& progress)
+    {
+        if (!progress.isLoading)
+            return;
+        const std::chrono::nanoseconds now = platform.clock.monotonic();
+        const std::string place = nameOfPlace(platform, progress.pathAtWork);
+        const bool isStuck = !progress.pathAtWork.empty() && now - progress.pathAtWorkSince >= patience;
+        platform::Locked guard(telling);
+        if (ended.isRaised())
+            return;
+        if (isStuck && !isTerminal && placesNamed.insert(place).second)
+            printError(waitingLine(progress, place));
+        if (!isTerminal)
+            return;
+        const int columns = sizeOfTerminal(STDERR_FILENO).columns - 1;
+        showProgress(isStuck
+                ? cutAtEnd(waitingLine(progress, place) + "  " + durationText(now - progress.pathAtWorkSince), columns)
+                : progressLine(progress, place, now - started, columns));
+    }
+
+    static std::string waitingLine(const OBLoadProgress& progress, const std::string& place)
+    {
+        return "ombrix: waiting for " + escapedText(place) + " (" + escapedText(progress.pathAtWork) + ")";
+    }
+
+    void end()
+    {
+        platform::Locked guard(telling);
+        ended.raise();
+        eraseProgress();
+    }
+
+    const std::shared_ptr<OBMediaManager> manager;
+    const platform::Platform& platform;
+    const bool isTerminal;
+    const std::chrono::nanoseconds started;
+    platform::WakeSignal ended;
+    platform::Mutex telling; // held while something is shown, so that nothing is once the watch has ended
+    std::set<std::string> placesNamed GUARDED_BY(telling);
+};
+
+LoadWatch::LoadWatch(std::shared_ptr<OBMediaManager> manager)
+    : _watching(std::make_shared<Watching>(std::move(manager)))
+{
+    _watching->platform.threads.startDetached("load watch", [watching = _watching] { watching->run(); });
+}
+
+LoadWatch::~LoadWatch()
+{
+    _watching->end();
+}
+
+std::string nameOfPlace(const platform::Platform& platform, std::string_view path)
+{
+    if (platform::isSameOrBelow(path, volumesFolder)) {
+        const std::string_view rest = platform::pathRelativeTo(path, volumesFolder);
+        return std::string(rest.substr(0, rest.find('/')));
+    }
+    std::string longest = "/";
+    for (std::string& volume : platform.volumes.localVolumes()) {
+        if (volume.size() > longest.size() && platform::isSameOrBelow(path, volume))
+            longest = std::move(volume);
+    }
+    return std::string(platform::lastPathComponent(longest == "/" ? path : longest));
+}
+
+std::string progressLine(
+    const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds elapsed, int columns)
+{
+    const std::string facts = "  " + quantityText(progress.foldersDone, "folder") + "  "
+        + quantityText(progress.itemsFound, "clip") + "  " + durationText(elapsed) + "  Ctrl-C cancels";
+    const std::string start = "scanning ";
+    const int room = columns - displayWidth(facts) - displayWidth(start);
+    return cutAtEnd(start + cutInMiddle(escapedText(place), room > 8 ? room : 8) + facts, columns);
+}
+
+} // namespace apps

@@ -1,0 +1,160 @@
+#include "apps/common/RecordJson.h"
+
+#include "platform/formats/JsonWriter.h"
+
+#include <vector>
+
+namespace apps {
+namespace {
+
+    using platform::JsonWriter;
+    using platform::Text;
+    using platform::Value;
+
+    /// A writer whose document is complete, and handed over, when it goes.
+    class Document {
+    public:
+        explicit Document(Output& output)
+            : writer([&output](std::string_view block) { output.writeThrough(block); })
+        {
+        }
+        ~Document() { writer.endDocument(); }
+
+        JsonWriter writer;
+    };
+
+    void writeText(JsonWriter& writer, std::string_view key, const Text& text)
+    {
+        writer.key(key);
+        writer.text(text);
+    }
+
+    void writeIcon(JsonWriter& writer, const OBImageRef& icon)
+    {
+        writeText(writer, "icon", icon ? icon->name() : Text());
+    }
+
+    void writeAttributes(JsonWriter& writer, const Value::Dictionary& attributes)
+    {
+        writer.key("attributes");
+        writer.beginObject();
+        for (const Value::Entry& attribute : attributes) {
+            writer.key(attribute.first);
+            writer.value(attribute.second);
+        }
+        writer.endObject();
+    }
+
+    void writeObject(JsonWriter& writer, const OBMediaObject& object)
+    {
+        writer.beginObject();
+        writer.key("mediaType");
+        writer.integer(object.mediaType());
+        writeText(writer, "name", object.name());
+        writer.key("mediaSourceType");
+        writer.integer(object.mediaSourceType());
+        writeText(writer, "sourcePluginIdentifier", object.sourcePluginIdentifier());
+        writeText(writer, "path", object.path());
+        writeText(writer, "aliasResolvedPath", object.aliasResolvedPath());
+        writeIcon(writer, object.icon());
+        writeAttributes(writer, object.attributes());
+        writer.endObject();
+    }
+
+    void writeObjects(JsonWriter& writer, const OBMediaObjectList& objects)
+    {
+        writer.beginList();
+        objects.visit([&writer](OBMediaObject& object) {
+            writeObject(writer, object);
+            return true;
+        });
+        writer.endList();
+    }
+
+    /// Begins the object of a group and writes all but its children; whoever calls ends it.
+    void beginGroup(JsonWriter& writer, const OBMediaGroup& group)
+    {
+        writer.beginObject();
+        const OBTypeIdentifierRef type = group.typeIdentifier();
+        writer.key("typeIdentifier");
+        if (type)
+            writer.string(type->text());
+        else
+            writer.null();
+        writeText(writer, "name", group.name());
+        writeText(writer, "ID", group.ID());
+        writeText(writer, "parentID", group.parentID());
+        writeIcon(writer, group.icon());
+        writeText(writer, "path", group.path());
+        writer.key("modificationDate");
+        if (const std::optional<platform::Date> date = group.modificationDate())
+            writer.date(*date);
+        else
+            writer.null();
+        writeAttributes(writer, group.attributes());
+        writer.key("mediaObjects");
+        writeObjects(writer, group.ownMediaObjects());
+    }
+
+    /// A group that was begun, and how many of its children were written.
+    struct OpenGroup {
+        OBMediaGroupList children;
+        std::size_t written = 0;
+    };
+
+    OpenGroup beginGroupWithChildren(JsonWriter& writer, const OBMediaGroup& group)
+    {
+        beginGroup(writer, group);
+        writer.key("childGroups");
+        writer.beginList();
+        return { group.childGroups(), 0 };
+    }
+
+} // namespace
+
+void printGroup(Output& output, const OBMediaGroupRef& group)
+{
+    Document document(output);
+    JsonWriter& writer = document.writer;
+    if (!group)
+        return writer.null();
+    // A stack of our own: folders may be nested deeper than the thread's.
+    std::vector<OpenGroup> open;
+    open.push_back(beginGroupWithChildren(writer, *group));
+    while (!open.empty()) {
+        OpenGroup& innermost = open.back();
+        if (innermost.written < innermost.children.size()) {
+            const OBMediaGroupRef child = innermost.children[innermost.written++];
+            open.push_back(beginGroupWithChildren(writer, *child));
+        } else {
+            writer.endList();
+            writer.endObject();
+            open.pop_back();
+        }
+    }
+}
+
+void printGroups(Output& output, const OBMediaGroupList& groups)
+{
+    Document document(output);
+    document.writer.beginList();
+    for (const OBMediaGroupRef& group : groups) {
+        beginGroup(document.writer, *group);
+        document.writer.endObject();
+    }
+    document.writer.endList();
+}
+
+void printObjects(Output& output, const OBMediaObjectList& objects)
+{
+    Document document(output);
+    writeObjects(document.writer, objects);
+}
+
+void printValue(Output& output, const Value& value)
+{
+    Document document(output);
+    document.writer.value(value);
+}
+
+} // namespace apps

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <string_view>
+
+namespace apps {
+
+// Standard error of this process, of which there is one: lines for people, and at its end one line of progress that
+// vanishes without a trace, also when a signal ends the process. No escape sequences. Any thread.
+
+/// Prints `line` and a line feed; progress that is shown is erased first.
+void printError(std::string_view line);
+
+/// Shows `line`, at most one terminal line long, in place of the progress line shown so far.
+void showProgress(std::string_view line);
+void eraseProgress();
+
+/// From now on SIGINT, SIGTERM and SIGHUP erase the progress line and then end the process as they always do. A signal
+/// that is ignored stays so.
+void eraseProgressOnSignals();
+
+/// Signals are handled on other threads than the calling one.
+void leaveSignalsToOtherThreads();
+
+} // namespace apps

@@ -1,0 +1,129 @@
+#include "apps/common/Style.h"
+
+#include "apps/common/HostileNames.h"
+#include "apps/common/Terminal.h"
+
+namespace apps {
+namespace {
+
+    constexpr std::string_view normal = "\x1b[0m";
+    constexpr std::string_view dimmed = "\x1b[2m";
+
+    bool wantsColor(const StyleWishes& wishes)
+    {
+        if (wishes.color != When::automatic)
+            return wishes.color == When::always;
+        if (!wishes.noColor.empty())
+            return false;
+        if (!wishes.colorForce.empty() && wishes.colorForce != "0")
+            return true;
+        return wishes.isTerminal && wishes.term != "dumb" && !wishes.term.empty();
+    }
+
+    bool wantsLinks(const StyleWishes& wishes)
+    {
+        if (wishes.hyperlink != When::automatic)
+            return wishes.hyperlink == When::always;
+        return wishes.isTerminal && wantsColor(wishes);
+    }
+
+    bool mayStandInLink(unsigned char byte)
+    {
+        return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') || (byte >= '0' && byte <= '9')
+            || byte == '/' || byte == '-' || byte == '.' || byte == '_' || byte == '~';
+    }
+
+} // namespace
+
+Style::Style(const StyleWishes& wishes)
+    : _isTerminal(wishes.isTerminal)
+    , _isColored(wantsColor(wishes))
+    , _hasLinks(wantsLinks(wishes))
+{
+}
+
+StyleWishes Style::wishesFor(int descriptor, When color, When hyperlink)
+{
+    return { color, hyperlink, apps::isTerminal(descriptor), environmentVariable("TERM"),
+        environmentVariable("NO_COLOR"), environmentVariable("CLICOLOR_FORCE") };
+}
+
+std::string Style::name(std::string_view bytes) const
+{
+    return _isTerminal ? escapedName(bytes) : std::string(bytes);
+}
+
+std::string Style::bold(std::string_view laidOut, std::string_view path) const
+{
+    const std::string text = drawn(laidOut, "\x1b[1m");
+    if (!_hasLinks || path.empty())
+        return text;
+    static const std::string host = hostName();
+    return "\x1b]8;;" + fileLink(host, path) + "\x1b\\" + text + "\x1b]8;;\x1b\\";
+}
+
+std::string Style::plain(std::string_view laidOut) const
+{
+    return drawn(laidOut, {});
+}
+
+std::string Style::dim(std::string_view laidOut) const
+{
+    return drawn(laidOut, dimmed);
+}
+
+std::string Style::warning(std::string_view laidOut) const
+{
+    return drawn(laidOut, "\x1b[33m");
+}
+
+std::string Style::failure(std::string_view laidOut) const
+{
+    return drawn(laidOut, "\x1b[31m");
+}
+
+std::string Style::drawn(std::string_view laidOut, std::string_view sequence) const
+{
+    // Off a terminal nothing was escaped, and the bytes of the marks may be the name's own.
+    if (!_isTerminal && (!_isColored || sequence.empty()))
+        return std::string(laidOut);
+    if (!_isColored)
+        return withoutMarks(laidOut);
+    std::string text(sequence);
+    bool isOpen = !sequence.empty();
+    for (const char letter : laidOut) {
+        const bool isMark = _isTerminal && (letter == escapeBegins || letter == escapeEnds);
+        if (!isMark) {
+            text += letter;
+            continue;
+        }
+        if (isOpen)
+            text += normal;
+        const std::string_view next = letter == escapeBegins ? dimmed : sequence;
+        text += next;
+        isOpen = !next.empty();
+    }
+    if (isOpen)
+        text += normal;
+    return text;
+}
+
+std::string fileLink(std::string_view host, std::string_view path)
+{
+    constexpr std::string_view digits = "0123456789ABCDEF";
+    std::string link = "file://";
+    link += host;
+    for (const char letter : path) {
+        const auto byte = static_cast<unsigned char>(letter);
+        if (mayStandInLink(byte)) {
+            link += letter;
+        } else {
+            link += '%';
+            link += digits[byte >> 4];
+            link += digits[byte & 15];
+        }
+    }
+    return link;
+}
+
+} // namespace apps

@@ -1,0 +1,122 @@
+#include "apps/ombrix/CommandTable.h"
+
+#include "apps/ombrix/Commands.h"
+
+namespace ombrix {
+namespace {
+
+    constexpr OptionInfo json { "--json", "", "", "print one JSON document, every key always there" };
+    constexpr OptionInfo zero { "-0", "", "", "end every path with a zero byte instead of a line feed" };
+    constexpr OptionInfo group { "--group", "", "ID", "the group; the first with that ID counts" };
+
+    constexpr OptionInfo global[] {
+        { "--machine", "", "FILE", "use the machine that FILE describes, not this one" },
+        { "--source", "", "IDENTIFIER", "the plug-in whose tree is meant" },
+        { "--color", "", "WHEN", "auto, always or never" },
+        { "--hyperlink", "", "WHEN", "names as links to their folders: auto, always, never" },
+        { "--help", "-h", "", "this text, or that of a command" },
+        { "--version", "", "", "the versions of the program and of its host interface" },
+    };
+
+    constexpr OptionInfo treeOptions[] {
+        { "--all", "", "", "everything, also where it is longer than the terminal" },
+        { "--skipped", "", "", "list below the tree what was left out, and why" },
+        json,
+    };
+    constexpr Example treeExamples[] {
+        { "ombrix tree Events", "one part of the tree, unfolded" },
+        { "ombrix tree --json | jq '.childGroups[].name'", "the names at the top" },
+    };
+
+    constexpr OptionInfo groupsOptions[] { json };
+    constexpr Example groupsExamples[] {
+        { "ombrix groups", "a table" },
+        { "ombrix groups --json | jq -r '.[].ID'", "the ID of every group" },
+    };
+
+    constexpr OptionInfo objectsOptions[] { group, zero, json };
+    constexpr Example objectsExamples[] {
+        { "ombrix objects --group Events", "the clips of all events" },
+        { "ombrix objects --group Montaro -0 | xargs -0 ls -l", "safe for every name" },
+    };
+
+    constexpr OptionInfo pathsOptions[] { zero, json };
+    constexpr Example pathsExamples[] {
+        { "ombrix paths", "which folders are searched, and which of them exist" },
+        { "ombrix paths --json | jq -r '.events[]'", "those for events" },
+    };
+
+    constexpr OptionInfo infoOptions[] { json };
+    constexpr Example infoExamples[] {
+        { "ombrix info", "is the editor found, and where" },
+        { "ombrix info --json | jq .canLoadData", "whether a tree can be loaded" },
+    };
+
+    constexpr OptionInfo messageOptions[] { group };
+    constexpr Example messageExamples[] {
+        { "ombrix message --group Montaro", "why the whole tree is empty" },
+        { "ombrix message --group \"$HOME/Movies/Montaro Projects/Trip\"", "why a project is" },
+    };
+
+    constexpr OptionInfo pluginsOptions[] { json };
+    constexpr Example pluginsExamples[] {
+        { "ombrix plugins", "what was found, and what was refused and why" },
+        { "OMBRIX_PLUGIN_PATH=build/plugins ombrix plugins", "with your own folder first" },
+    };
+
+    constexpr Example helpExamples[] {
+        { "ombrix help tree", "what \"tree\" can do" },
+        { "ombrix --help", "all commands" },
+    };
+
+    constexpr CommandInfo table[] {
+        { "tree", Intent::look, "[ID|NAME]", 1, "show the media tree, or one part of it",
+            "Loads once and prints the tree, or the first group that has this ID, else this\n"
+            "name. On a terminal the whole tree is folded to its height; each folded place\n"
+            "names the command that unfolds it.",
+            treeOptions, treeExamples, runTree },
+        { "groups", Intent::look, "", 0, "list all groups that hold media",
+            "Loads once and prints the groups as a flat list, events first.", groupsOptions, groupsExamples,
+            runGroups },
+        { "objects", Intent::look, "", 0, "list the movies of one group",
+            "Loads once and prints the path of every movie to be shown for the group, one a\n"
+            "line, depth first.",
+            objectsOptions, objectsExamples, runObjects },
+        { "paths", Intent::look, "", 0, "list the folders that are searched",
+            "Prints the folders for projects and those for events, in the order in which\n"
+            "they are searched. Loads nothing.",
+            pathsOptions, pathsExamples, runPaths },
+        { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
+            "Prints what is known of the source without loading its tree.", infoOptions, infoExamples, runInfo },
+        { "message", Intent::ask, "", 0, "say what an empty group tells the user",
+            "Loads once and prints the text that is shown for the group while it is empty;\n"
+            "nothing when there is none.",
+            messageOptions, messageExamples, runMessage },
+        { "plugins", Intent::ask, "", 0, "list the plug-ins, and why one is refused",
+            "Loads every bundle that is found to see whether it works.", pluginsOptions, pluginsExamples, runPlugins },
+        { "help", Intent::ask, "[COMMAND]", 1, "explain a command", "The same as \"ombrix COMMAND --help\".", {},
+            helpExamples, runHelp },
+    };
+
+} // namespace
+
+std::span<const CommandInfo> commands()
+{
+    return table;
+}
+
+const CommandInfo* commandNamed(std::string_view name)
+{
+    for (const CommandInfo& command : table) {
+        if (command.name == name)
+            return &command;
+    }
+    return nullptr;
+}
+
+std::span<const OptionInfo> globalOptions()
+{
+    return global;
+}
+
+} // namespace ombrix

@@ -1,0 +1,18 @@
+#pragma once
+
+namespace ombrix {
+
+class Program;
+
+// The commands, each in a file of its own; all answer the exit status.
+
+int runTree(Program& program);
+int runGroups(Program& program);
+int runObjects(Program& program);
+int runPaths(Program& program);
+int runInfo(Program& program);
+int runMessage(Program& program);
+int runPlugins(Program& program);
+int runHelp(Program& program);
+
+} // namespace ombrix

@@ -1,0 +1,157 @@
+#include "apps/ombrix/Program.h"
+
+#include "apps/common/HostileNames.h"
+#include "apps/common/StandardError.h"
+#include "apps/ombrix/GroupSearch.h"
+#include "apps/ombrix/ProblemText.h"
+
+#include <utility>
+
+namespace ombrix {
+namespace {
+
+    constexpr int standardOutput = 1;
+
+    /// Why `manager` cannot load, and where.
+    std::pair<std::string, std::string> whyNothingLoads(OBMediaManager& manager)
+    {
+        const std::string source = manager.displayName().string();
+        const platform::Text path = manager.getAppPath();
+        if (path.isAbsent())
+            return { source, "the editor is not installed, so its libraries are not shown" };
+        return { source, "the editor is not installed: nothing exists at " + apps::escapedText(path) };
+    }
+
+} // namespace
+
+Program::Program(Arguments arguments)
+    : _arguments(std::move(arguments))
+    , _output(standardOutput)
+    , _style(apps::Style::wishesFor(standardOutput, _arguments.color, _arguments.hyperlink))
+{
+}
+
+std::optional<int> Program::columns() const
+{
+    if (!_style.isTerminal())
+        return std::nullopt;
+    return apps::sizeOfTerminal(standardOutput).columns;
+}
+
+void Program::printLine(std::string_view line)
+{
+    _output.write(line);
+    _output.write("\n");
+}
+
+void Program::printPath(std::string_view path)
+{
+    if (_arguments.has("-0")) {
+        _output.write(path);
+        _output.write(std::string_view("\0", 1));
+    } else {
+        printLine(_style.plain(_style.name(path)));
+    }
+}
+
+int Program::fail(std::string_view place, std::string_view what) const
+{
+    apps::printError("ombrix: " + apps::escapedText(place) + ": " + std::string(what));
+    return failed;
+}
+
+int Program::failUsage(std::string_view what) const
+{
+    apps::printError("ombrix: " + std::string(what));
+    return wrongUsage;
+}
+
+void Program::warn(std::string_view what) const
+{
+    apps::printError("ombrix: warning: " + std::string(what));
+}
+
+apps::Session* Program::session()
+{
+    if (!_session) {
+        apps::SessionResult result = apps::openSession({ _arguments.machineFile, _arguments.source });
+        _session = std::move(result.session);
+        if (!_session)
+            apps::printError("ombrix: " + apps::escapedText(result.problem));
+    }
+    return _session.get();
+}
+
+std::shared_ptr<OBMediaManager> Program::manager()
+{
+    apps::Session* open = session();
+    if (!open)
+        return nullptr;
+    std::shared_ptr<OBMediaManager> manager = open->manager();
+    if (!manager)
+        apps::printError("ombrix: " + apps::escapedText(open->problem()));
+    return manager;
+}
+
+OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
+{
+    const std::shared_ptr<OBMediaManager> source = manager();
+    if (!source)
+        return nullptr;
+    if (!source->canLoadData()) {
+        const auto [place, what] = whyNothingLoads(*source);
+        fail(place, what);
+        return nullptr;
+    }
+    if (observer)
+        source->setScanObserver(observer);
+    const apps::TreeLoad load = apps::loadTree(source);
+    _loadDuration = load.duration;
+    if (load.result.outcome == OBLoadOutcome::unavailable) {
+        const auto [place, what] = whyNothingLoads(*source);
+        fail(place, what);
+        return nullptr;
+    }
+    if (!load.result.rootMediaGroup)
+        fail(source->displayName(), "the load ended without a tree");
+    return load.result.rootMediaGroup;
+}
+
+Program::GroupAnswer Program::loadGroupOfOption()
+{
+    const std::string* identifier = _arguments.valueOf("--group");
+    if (!identifier) {
+        const std::string name(_arguments.command->name);
+        return { nullptr, failUsage(name + ": option --group ID is missing (\"ombrix help " + name + "\")") };
+    }
+    const OBMediaGroupRef root = load();
+    if (!root)
+        return { nullptr, failed };
+    OBMediaGroupRef group = groupWithID(root, *identifier);
+    if (!group)
+        return { nullptr, fail(*identifier, "no group has this ID" + suggestedID(root, *identifier)) };
+    return { std::move(group), done };
+}
+
+void Program::warnOfUnreadFolders()
+{
+    const std::vector<OBLoadProblem> problems = manager()->loadProblems();
+    if (problems.empty())
+        return;
+    const std::string first
+        = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
+    if (problems.size() == 1)
+        warn(first);
+    else
+        warn(std::to_string(problems.size()) + " folders could not be read, the first: " + first);
+}
+
+int Program::finish(int status)
+{
+    _output.flush();
+    if (!_output.problem().empty())
+        return fail("standard output", _output.problem());
+    return status;
+}
+
+} // namespace ombrix

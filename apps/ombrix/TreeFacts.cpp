@@ -1,0 +1,137 @@
+#include "apps/ombrix/TreeFacts.h"
+
+#include "apps/common/HumanText.h"
+#include "platform/PathText.h"
+
+#include <string_view>
+
+namespace ombrix {
+namespace {
+
+    constexpr std::string_view volumesFolder = "/Volumes";
+    constexpr std::string_view between = " · ";
+
+    void append(std::string& list, const std::string& text)
+    {
+        if (!list.empty())
+            list += between;
+        list += text;
+    }
+
+    /// The name of the volume below /Volumes that holds the group; empty for other places.
+    std::string_view volumeOf(std::string_view path)
+    {
+        if (!platform::isSameOrBelow(path, volumesFolder))
+            return {};
+        const std::string_view rest = platform::pathRelativeTo(path, volumesFolder);
+        return rest.substr(0, rest.find('/'));
+    }
+
+    /// The volume where it is news: the group above lies elsewhere.
+    std::string noteOf(const std::vector<TreeNode>& nodes, const TreeNode& node)
+    {
+        const platform::Text path = node.group->path();
+        const platform::Text pathAbove = nodes[node.parent].group->path();
+        const std::string_view volume = volumeOf(path);
+        return volume == volumeOf(pathAbove) ? std::string() : std::string(volume);
+    }
+
+    std::string rootSummary(const Totals& totals)
+    {
+        std::string summary = apps::quantityText(totals.projects, "project");
+        if (totals.events > 0)
+            append(summary, apps::quantityText(totals.events, "event"));
+        if (totals.clips > 0)
+            append(summary, apps::quantityText(totals.clips, "clip"));
+        else if (totals.movies > 0)
+            append(summary, apps::quantityText(totals.movies, "movie"));
+        if (totals.bytes > 0)
+            append(summary, apps::sizeText(totals.bytes));
+        return summary;
+    }
+
+    std::string folderSummary(const TreeNode& node, bool isFolded, platform::Date now)
+    {
+        const Totals& totals = node.totals;
+        std::string summary = totals.projects == 0 ? "no projects" : apps::quantityText(totals.projects, "project");
+        if (totals.folders > 0)
+            summary += " in " + apps::quantityText(totals.folders, "folder");
+        if (isFolded && totals.newest)
+            append(summary, "newest " + apps::dateText(*totals.newest, now));
+        return summary;
+    }
+
+    std::string yearSummary(const Totals& totals)
+    {
+        std::string summary = apps::quantityText(totals.events, "event");
+        append(summary, apps::quantityText(totals.clips, "clip"));
+        append(summary, apps::sizeText(totals.bytes));
+        return summary;
+    }
+
+    std::string summaryOf(const TreeNode& node, bool isFolded, bool isFirst, platform::Date now)
+    {
+        switch (node.kind) {
+        case NodeKind::root:
+            return rootSummary(node.totals);
+        case NodeKind::folder:
+            return folderSummary(node, isFolded, now);
+        case NodeKind::eventLibrary:
+            return apps::quantityText(node.totals.events, "event");
+        case NodeKind::year:
+            return isFolded || isFirst ? yearSummary(node.totals) : std::string();
+        case NodeKind::project:
+        case NodeKind::event:
+            return {};
+        case NodeKind::other:
+            break;
+        }
+        return node.children == 0 ? std::string() : apps::quantityText(node.children, "group");
+    }
+
+    std::string dateOf(const std::vector<TreeNode>& nodes, const TreeNode& node, platform::Date now)
+    {
+        if (!node.totals.newest)
+            return {};
+        if (node.kind != NodeKind::event)
+            return apps::dateText(*node.totals.newest, now);
+        const TreeNode& above = nodes[node.parent];
+        const platform::Text year = above.kind == NodeKind::year ? above.group->name() : platform::Text();
+        return apps::dateRangeText(*node.totals.oldest, *node.totals.newest, year);
+    }
+
+} // namespace
+
+NodeFacts factsOf(const std::vector<TreeNode>& nodes, const TreeLine& line, platform::Date now)
+{
+    const TreeNode& node = nodes[line.node];
+    NodeFacts facts;
+    facts.summary = summaryOf(node, line.isFolded, line.node == 0, now);
+    facts.note = noteOf(nodes, node);
+    const std::uint64_t media = node.kind == NodeKind::event ? node.totals.clips : node.totals.movies;
+    const bool holdsMedia = node.kind == NodeKind::project || node.kind == NodeKind::event
+        || (node.kind == NodeKind::other && node.children == 0);
+    if (!holdsMedia || media == 0)
+        return facts;
+    facts.count = apps::countText(media);
+    facts.unit = apps::unitText(media, mediaUnit(node.kind));
+    facts.size = apps::sizeText(node.totals.bytes);
+    facts.date = dateOf(nodes, node, now);
+    return facts;
+}
+
+std::string moreText(const std::vector<TreeNode>& nodes, const TreeLine& line)
+{
+    Totals hidden;
+    std::size_t node = line.firstHidden;
+    for (std::size_t count = 0; count < line.hidden; ++count) {
+        hidden.add(nodes[node].totals);
+        node = nodes[node].end;
+    }
+    std::string text = "… " + apps::countText(line.hidden) + " more";
+    if (hidden.oldest)
+        text += ", back to " + apps::monthText(*hidden.oldest);
+    return text;
+}
+
+} // namespace ombrix

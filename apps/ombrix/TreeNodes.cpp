@@ -1,0 +1,177 @@
+#include "apps/ombrix/TreeNodes.h"
+
+#include "host/OBConstants.h"
+#include "platform/PathText.h"
+
+#include <algorithm>
+#include <set>
+#include <string_view>
+
+namespace ombrix {
+namespace {
+
+    struct Level {
+        OBMediaGroupList groups;
+        std::size_t next = 0;
+        std::size_t node = 0;
+    };
+
+    TreeNode makeNode(const OBMediaGroupRef& group, std::size_t index, std::size_t parent, std::size_t depth)
+    {
+        TreeNode node { group };
+        node.kind = kindOf(*group);
+        node.depth = depth;
+        node.parent = parent;
+        node.end = index + 1;
+        node.children = group->childGroups().size();
+        return node;
+    }
+
+    std::vector<TreeNode> flattened(const OBMediaGroupRef& root)
+    {
+        std::vector<TreeNode> nodes { makeNode(root, 0, 0, 0) };
+        std::vector<Level> levels { { root->childGroups(), 0, 0 } };
+        while (!levels.empty()) {
+            Level& innermost = levels.back();
+            if (innermost.next == innermost.groups.size()) {
+                nodes[innermost.node].end = nodes.size();
+                levels.pop_back();
+                continue;
+            }
+            const OBMediaGroupRef group = innermost.groups[innermost.next++];
+            const bool isLast = innermost.next == innermost.groups.size();
+            const std::size_t index = nodes.size();
+            nodes.push_back(makeNode(group, index, innermost.node, levels.size()));
+            nodes.back().isLast = isLast;
+            levels.push_back({ group->childGroups(), 0, index });
+        }
+        return nodes;
+    }
+
+    /// The movies of the group itself. Folders and libraries only repeat those of what lies in them.
+    void addOwnMovies(TreeNode& node, const platform::FileSystem& fileSystem)
+    {
+        const bool isLeaf = node.kind == NodeKind::other && node.children == 0;
+        if (node.kind != NodeKind::project && node.kind != NodeKind::event && !isLeaf)
+            return;
+        const OBMediaObjectList objects = node.group->ownMediaObjects();
+        const bool isEvent = node.kind == NodeKind::event;
+        (isEvent ? node.totals.clips : node.totals.movies) += objects.size();
+        objects.visit([&](OBMediaObject& object) {
+            const platform::Text path = object.path();
+            if (const auto status = path ? fileSystem.status(path) : std::nullopt)
+                node.totals.addMovie(*status, isEvent ? status->creationDate : status->modificationDate);
+            return true;
+        });
+    }
+
+    Totals countedBy(const TreeNode& node)
+    {
+        Totals totals = node.totals;
+        totals.projects += node.kind == NodeKind::project;
+        totals.folders += node.kind == NodeKind::folder;
+        totals.events += node.kind == NodeKind::event;
+        return totals;
+    }
+
+    void markUnreadable(std::vector<TreeNode>& nodes, const std::vector<OBLoadProblem>& problems)
+    {
+        if (problems.empty())
+            return;
+        std::set<std::string_view> folders;
+        std::set<std::string_view> holders;
+        for (const OBLoadProblem& problem : problems) {
+            folders.insert(problem.path);
+            holders.insert(platform::pathByRemovingLastComponent(problem.path));
+        }
+        for (TreeNode& node : nodes) {
+            const platform::Text path = node.group->path();
+            // The folder of movies inside a project has no group of its own.
+            const bool isLeaf = node.kind == NodeKind::project || node.kind == NodeKind::event;
+            node.isUnreadable = path && (folders.count(path) > 0 || (isLeaf && holders.count(path) > 0));
+        }
+    }
+
+} // namespace
+
+NodeKind kindOf(const OBMediaGroup& group)
+{
+    const OBTypeIdentifierRef type = group.typeIdentifier();
+    if (type == OBMontaroRootGroupTypeIdentifier)
+        return NodeKind::root;
+    if (type == OBMontaroProjectGroupTypeIdentifier)
+        return NodeKind::project;
+    if (type == OBMontaroFolderGroupTypeIdentifier || type == OBMontaroProjectLibraryGroupTypeIdentifier)
+        return NodeKind::folder;
+    if (type == OBMontaroEventLibraryGroupTypeIdentifier)
+        return NodeKind::eventLibrary;
+    if (type == OBMontaroEventCalendarGroupTypeIdentifier)
+        return NodeKind::year;
+    if (type == OBMontaroEventGroupTypeIdentifier)
+        return NodeKind::event;
+    return NodeKind::other;
+}
+
+std::string_view kindText(NodeKind kind)
+{
+    switch (kind) {
+    case NodeKind::root:
+        return "root";
+    case NodeKind::folder:
+        return "folder";
+    case NodeKind::project:
+        return "project";
+    case NodeKind::eventLibrary:
+        return "events";
+    case NodeKind::year:
+        return "year";
+    case NodeKind::event:
+        return "event";
+    case NodeKind::other:
+        break;
+    }
+    return "group";
+}
+
+std::string_view mediaUnit(NodeKind kind)
+{
+    return kind == NodeKind::event || kind == NodeKind::year || kind == NodeKind::eventLibrary ? "clip" : "movie";
+}
+
+void Totals::add(const Totals& other)
+{
+    projects += other.projects;
+    folders += other.folders;
+    events += other.events;
+    movies += other.movies;
+    clips += other.clips;
+    bytes += other.bytes;
+    if (other.oldest && (!oldest || *other.oldest < *oldest))
+        oldest = other.oldest;
+    if (other.newest && (!newest || *newest < *other.newest))
+        newest = other.newest;
+}
+
+void Totals::addMovie(const platform::ItemStatus& status, platform::Date date)
+{
+    Totals movie;
+    movie.bytes = status.size;
+    movie.oldest = date;
+    movie.newest = date;
+    add(movie);
+}
+
+std::vector<TreeNode> treeNodes(
+    const OBMediaGroupRef& root, const platform::FileSystem& fileSystem, const std::vector<OBLoadProblem>& problems)
+{
+    std::vector<TreeNode> nodes = flattened(root);
+    for (TreeNode& node : nodes)
+        addOwnMovies(node, fileSystem);
+    // Backwards, every node is complete before it is added to its parent.
+    for (std::size_t index = nodes.size() - 1; index > 0; --index)
+        nodes[nodes[index].parent].totals.add(countedBy(nodes[index]));
+    markUnreadable(nodes, problems);
+    return nodes;
+}
+
+} // namespace ombrix

@@ -1,0 +1,204 @@
+#include "apps/ombrix/TreeFold.h"
+#include "apps/common/DisplayWidth.h"
+#include "apps/ombrix/TreeText.h"
+#include "host/OBConstants.h"
+#include "platform/linux/LinuxPlatform.h"
+#include "tests/support/TemporaryFolder.h"
+
+#include <doctest/doctest.h>
+
+#include <string>
+#include <vector>
+
+using namespace ombrix;
+
+namespace {
+
+OBMediaGroupRef makeGroup(OBTypeIdentifierRef type, const std::string& name)
+{
+    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    group->setName(name);
+    group->setID(name);
+    return group;
+}
+
+/// A root with `folders` folders of `projects` projects each, and an empty events library.
+OBMediaGroupRef makeTree(int folders, int projects)
+{
+    const OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
+    for (int folder = 0; folder < folders; ++folder) {
+        const OBMediaGroupRef group = makeGroup(OBMontaroFolderGroupTypeIdentifier, "Folder " + std::to_string(folder));
+        for (int project = 0; project < projects; ++project)
+            group->addChildGroup(makeGroup(OBMontaroProjectGroupTypeIdentifier, "Project " + std::to_string(project)));
+        root->addChildGroup(group);
+    }
+    root->addChildGroup(makeGroup(OBMontaroEventLibraryGroupTypeIdentifier, "Events"));
+    return root;
+}
+
+std::vector<TreeNode> nodesOf(const OBMediaGroupRef& root, const std::vector<OBLoadProblem>& problems = {})
+{
+    static platform::LinuxPlatform machine;
+    return treeNodes(root, machine.platform().fileSystem, problems);
+}
+
+std::string joined(const std::vector<std::string>& lines)
+{
+    std::string text;
+    for (const std::string& line : lines)
+        text += line + "\n";
+    return text;
+}
+
+std::vector<std::string> textOf(
+    const std::vector<TreeNode>& nodes, const std::vector<TreeLine>& lines, std::optional<int> columns)
+{
+    apps::StyleWishes look;
+    look.isTerminal = columns.has_value();
+    const apps::Style style(look);
+    TreeTextWishes wishes { style, columns, { 1794657600, 0 } };
+    wishes.emptyMessage = [](const OBMediaGroupRef&) { return platform::Text(); };
+    wishes.unfoldingCommand = [](const OBMediaGroupRef& group) { return "unfold " + group->name().string(); };
+    wishes.linkTarget = [](std::string_view path) { return std::string(path); };
+    std::vector<std::string> text;
+    printTreeText(nodes, lines, wishes, [&text](std::string_view line) { text.emplace_back(line); });
+    return text;
+}
+
+} // namespace
+
+TEST_CASE("a tree that fits is not folded")
+{
+    const std::vector<TreeNode> nodes = nodesOf(makeTree(2, 2));
+    REQUIRE(nodes.size() == 8);
+    CHECK(foldedLines(nodes, 8).size() == 8);
+    CHECK(joined(textOf(nodes, foldedLines(nodes, 8), std::nullopt))
+        == "Montaro           4 projects\n"
+           "├─ Folder 0       2 projects\n"
+           "│  ├─ Project 0\n"
+           "│  └─ Project 1\n"
+           "├─ Folder 1       2 projects\n"
+           "│  ├─ Project 0\n"
+           "│  └─ Project 1\n"
+           "└─ Events         0 events\n");
+}
+
+TEST_CASE("a folded tree has no more lines than there is room for and always shows the last group")
+{
+    for (const auto& [folders, projects] : { std::pair(3, 50), std::pair(50, 3), std::pair(0, 0), std::pair(1, 500) }) {
+        const std::vector<TreeNode> nodes = nodesOf(makeTree(folders, projects));
+        for (std::size_t most = 4; most < 40; ++most) {
+            const std::vector<TreeLine> lines = foldedLines(nodes, most);
+            CAPTURE(most);
+            CHECK(lines.size() <= most);
+            CHECK(nodes[lines.back().node].group->name().view() == "Events");
+            CHECK(lines.back().isLast);
+        }
+    }
+}
+
+TEST_CASE("the lines of a folded tree and what they hide are all of its groups")
+{
+    const std::vector<TreeNode> nodes = nodesOf(makeTree(7, 9));
+    for (std::size_t most = 3; most < nodes.size(); ++most) {
+        std::size_t count = 0;
+        for (const TreeLine& line : foldedLines(nodes, most)) {
+            std::size_t node = line.firstHidden;
+            for (std::size_t hidden = 0; hidden < line.hidden; ++hidden) {
+                count += nodes[node].end - node;
+                node = nodes[node].end;
+            }
+            if (line.hidden == 0)
+                count += line.isFolded ? nodes[line.node].end - line.node : 1;
+        }
+        CAPTURE(most);
+        CHECK(count == nodes.size());
+    }
+}
+
+TEST_CASE("what is folded says how many are hidden and how to see them")
+{
+    const std::vector<TreeNode> nodes = nodesOf(makeTree(1, 1200));
+    const std::vector<std::string> text = textOf(nodes, foldedLines(nodes, 6), 80);
+    REQUIRE(text.size() == 6);
+    CHECK(text[4].find("│  └─ … 1,198 more") == 0);
+    CHECK(text[4].find("unfold Folder 0") != std::string::npos);
+}
+
+TEST_CASE("no line is wider than the terminal, and facts line up at every width")
+{
+    const OBMediaGroupRef root = makeTree(2, 2);
+    root->childGroups()[0]->setName(
+        "東京の夜 and a name that is much too long for any terminal 👩‍👩‍👧‍👦");
+    root->childGroups()[1]->setName("Zu\u0308rich");
+    const std::vector<TreeNode> nodes = nodesOf(root);
+    for (const int columns : { 40, 60, 80, 120 }) {
+        CAPTURE(columns);
+        int column = -1;
+        for (const std::string& line : textOf(nodes, unfoldedLines(nodes), columns)) {
+            CAPTURE(line);
+            CHECK(apps::displayWidth(line) <= columns);
+            const std::size_t fact = line.find("2 projects");
+            if (fact == std::string::npos)
+                continue;
+            const int found = apps::displayWidth(std::string_view(line).substr(0, fact));
+            CHECK((column < 0 || column == found));
+            column = found;
+        }
+    }
+}
+
+TEST_CASE("lines of a tree that is deeper than the terminal is wide still fit")
+{
+    const OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
+    OBMediaGroupRef innermost = root;
+    for (int level = 0; level < 300; ++level) {
+        const OBMediaGroupRef child = makeGroup(OBMontaroFolderGroupTypeIdentifier, "Folder");
+        innermost->addChildGroup(child);
+        innermost = child;
+    }
+    const std::vector<TreeNode> nodes = nodesOf(root);
+    for (const std::string& line : textOf(nodes, unfoldedLines(nodes), 80)) {
+        CAPTURE(line);
+        CHECK(apps::displayWidth(line) <= 80);
+    }
+    CHECK(textOf(nodes, unfoldedLines(nodes), std::nullopt).size() == 301);
+}
+
+TEST_CASE("a project counts its movies, their size and the newest of their days")
+{
+    const tests::TemporaryFolder folder;
+    std::vector<OBMediaObjectRef> movies;
+    for (const char* name : { "a.mov", "b.mov" }) {
+        movies.push_back(OBMediaObject::initWithMediaType_name(3, name));
+        movies.back()->setPath(folder.file(name, std::string(1500, 'x')));
+    }
+    tests::setModificationDate(folder.path("a.mov"), { 1299146400, 0 });
+    tests::setModificationDate(folder.path("b.mov"), { 1288146400, 0 });
+    const OBMediaGroupRef root = makeTree(1, 1);
+    root->childGroups()[0]->childGroups()[0]->setMediaObjects(OBMediaObjectList(movies));
+    const std::vector<TreeNode> nodes = nodesOf(root);
+    CHECK(joined(textOf(nodes, unfoldedLines(nodes), std::nullopt))
+        == "Montaro                               1 project · 2 movies · 3.0 kB\n"
+           "├─ Folder 0                           1 project\n"
+           "│  └─ Project 0   2 movies   3.0 kB   3 Mar 2011\n"
+           "└─ Events                             0 events\n");
+}
+
+TEST_CASE("a folder that could not be read is marked, and a project whose movies could not")
+{
+    const OBMediaGroupRef root = makeTree(2, 1);
+    root->childGroups()[0]->setPath("/a/Folder 0");
+    root->childGroups()[1]->setPath("/a/Folder 1");
+    root->childGroups()[1]->childGroups()[0]->setPath("/a/Folder 1/Project 0");
+    const std::vector<TreeNode> nodes = nodesOf(root,
+        { { "/a/Folder 0", platform::FileProblem::notPermitted },
+            { "/a/Folder 1/Project 0/Shared Items", platform::FileProblem::readError } });
+    std::vector<std::string> marked;
+    for (const TreeNode& node : nodes) {
+        if (node.isUnreadable)
+            marked.push_back(node.group->path().string());
+    }
+    CHECK(marked == std::vector<std::string> { "/a/Folder 0", "/a/Folder 1/Project 0" });
+    CHECK(textOf(nodes, unfoldedLines(nodes), std::nullopt)[1].find("unreadable") != std::string::npos);
+}

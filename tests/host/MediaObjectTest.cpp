@@ -1,0 +1,245 @@
+#include "host/OBMediaObject.h"
+
+#include "host/OBConstants.h"
+#include "host/OBMediaObjectList.h"
+#include "tests/host/TestHost.h"
+
+#include <doctest/doctest.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+using namespace tests;
+using platform::Size;
+using platform::Text;
+using platform::Value;
+
+namespace {
+
+std::shared_ptr<const OBMediaObjectKind> projectMovies()
+{
+    auto kind = std::make_shared<OBMediaObjectKind>();
+    kind->mediaType = OBMediaTypeMovie;
+    kind->mediaSourceType = OBMediaSourceTypePlugin;
+    kind->sourcePluginIdentifier = "org.test.Source";
+    kind->icon = OBImage::pictureNamed("projectIcon", Size { 16, 16 }, "/icon.svg");
+    kind->ownPathKeys = { "Own Path" };
+    return kind;
+}
+
+OBMediaObjectRef fileOfFolder(const std::string& folder, const std::string& name, bool pathIsReal = false)
+{
+    const std::vector<OBFileOfFolder> files { { "before.mov", true }, { name, pathIsReal }, { "after.mov", true } };
+    return OBMediaObjectBatch::objects(projectMovies(), { folder, pathIsReal }, files)[1];
+}
+
+} // namespace
+
+TEST_CASE("an object made by itself has its type and name and nothing else")
+{
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip.final.mov");
+    CHECK(object->mediaType() == 3);
+    CHECK(object->name() == "trip.final.mov");
+    CHECK(object->mediaSourceType() == 0);
+    CHECK(object->sourcePluginIdentifier().isAbsent());
+    CHECK(object->path().isAbsent());
+    CHECK(object->icon() == nullptr);
+    CHECK(object->attributes().empty());
+    CHECK_FALSE(object->hasProducedThumbnail());
+    CHECK(object->thumbnailIfProduced() == nullptr);
+}
+
+TEST_CASE("every field of an object answers what was set on it")
+{
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip");
+    const auto icon = OBImage::pictureNamed("icon", Size { 1, 1 }, "/icon.svg");
+    object->setMediaSourceType(OBMediaSourceTypePlugin);
+    object->setSourcePluginIdentifier("org.ombrix.Montaro");
+    object->setPath("/movies/trip.mov");
+    object->setIcon(icon);
+    CHECK(object->mediaSourceType() == 4);
+    CHECK(object->sourcePluginIdentifier() == "org.ombrix.Montaro");
+    CHECK(object->path() == "/movies/trip.mov");
+    CHECK(object->icon() == icon);
+    object->setPath(Text());
+    object->setIcon(nullptr);
+    CHECK(object->path().isAbsent());
+    CHECK(object->icon() == nullptr);
+}
+
+TEST_CASE("an object of a folder is named after its file without the extension")
+{
+    const std::vector<std::pair<std::string, std::string>> cases {
+        { "trip.mov", "trip" },
+        { "trip.final.mov", "trip.final" },
+        { "trip", "trip" },
+        { ".mov", ".mov" },
+        { "trip.", "trip." },
+        { "a..", "a." },
+        { "\xff.mov", "\xff" },
+    };
+    for (const auto& [fileName, name] : cases) {
+        const std::string file = fileName;
+        CAPTURE(file);
+        const auto object = fileOfFolder("/movies", file);
+        CHECK(object->name() == Text(name));
+        CHECK(object->path() == Text("/movies/" + file));
+    }
+}
+
+TEST_CASE("an object of a folder has the fields of its kind, and its own path as attribute")
+{
+    const auto kind = projectMovies();
+    const std::vector<OBFileOfFolder> files { { "a.mov", false }, { "b.mov", false } };
+    const OBMediaObjectList list = OBMediaObjectBatch::objects(kind, { "/movies", false }, files);
+    REQUIRE(list.size() == 2);
+    CHECK(list[1]->mediaType() == 3);
+    CHECK(list[1]->mediaSourceType() == 4);
+    CHECK(list[1]->sourcePluginIdentifier() == "org.test.Source");
+    CHECK(list[1]->icon() == kind->icon);
+    CHECK(list[1]->attributeForKey("Own Path") == Value("/movies/b.mov"));
+    CHECK(list[1]->attributes() == Value::Dictionary { { "Own Path", "/movies/b.mov" } });
+}
+
+TEST_CASE("setting one field of an object of a folder keeps the others")
+{
+    const auto untouched = fileOfFolder("/movies", "trip.mov");
+    const std::vector<void (*)(OBMediaObject&)> changes {
+        [](OBMediaObject& object) { object.setMediaSourceType(object.mediaSourceType()); },
+        [](OBMediaObject& object) { object.setIcon(object.icon()); },
+        [](OBMediaObject& object) { object.setSourcePluginIdentifier(object.sourcePluginIdentifier()); },
+        [](OBMediaObject& object) { object.setPath(object.path()); },
+        [](OBMediaObject& object) { object.setAttribute_forKey("/movies/trip.mov", "Own Path"); },
+    };
+    for (const auto change : changes) {
+        const auto object = fileOfFolder("/movies", "trip.mov");
+        change(*object);
+        CHECK(object->mediaType() == untouched->mediaType());
+        CHECK(object->mediaSourceType() == untouched->mediaSourceType());
+        CHECK(object->name() == untouched->name());
+        CHECK(object->path() == untouched->path());
+        CHECK(object->sourcePluginIdentifier() == untouched->sourcePluginIdentifier());
+        CHECK(object->icon()->name() == "projectIcon");
+        CHECK(object->attributes() == untouched->attributes());
+    }
+}
+
+TEST_CASE("changing one object of a folder leaves its neighbours as they are")
+{
+    const std::vector<OBFileOfFolder> files { { "a.mov", false }, { "b.mov", false } };
+    const OBMediaObjectList list = OBMediaObjectBatch::objects(projectMovies(), { "/movies", false }, files);
+    list[0]->setPath("/elsewhere/z.mov");
+    list[0]->setSourcePluginIdentifier("other");
+    CHECK(list[0]->path() == "/elsewhere/z.mov");
+    CHECK(list[0]->name() == "a");
+    CHECK(list[0]->attributeForKey("Own Path") == Value("/elsewhere/z.mov"));
+    CHECK(list[1]->path() == "/movies/b.mov");
+    CHECK(list[1]->sourcePluginIdentifier() == "org.test.Source");
+}
+
+TEST_CASE("an attribute that is set hides the folder's under the same key, and keeps its place when it is set again")
+{
+    const auto object = fileOfFolder("/movies", "trip.mov");
+    object->setAttribute_forKey(1, "first");
+    object->setAttribute_forKey("mine", "Own Path");
+    object->setAttribute_forKey(true, "last");
+    object->setAttribute_forKey(2, "first");
+    CHECK(object->attributeForKey("Own Path") == Value("mine"));
+    CHECK(object->attributeForKey("none").isNull());
+    CHECK(object->attributes() == Value::Dictionary { { "first", 2 }, { "Own Path", "mine" }, { "last", true } });
+}
+
+TEST_CASE("the alias-resolved path is the real path behind every link")
+{
+    TestHost test;
+    const std::string file = test.machine.folder.file("real/trip.mov");
+    test.machine.folder.link("folder", test.machine.folder.path("real"));
+    test.machine.folder.link("link.mov", test.machine.folder.path("folder/trip.mov"));
+    test.host();
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip");
+    object->setPath(test.machine.folder.path("link.mov"));
+    CHECK(object->aliasResolvedPath() == Text(file));
+    CHECK(object->path() == Text(test.machine.folder.path("link.mov")));
+    CHECK(fileOfFolder(test.machine.folder.path("folder"), "trip.mov")->aliasResolvedPath() == Text(file));
+}
+
+TEST_CASE("the alias-resolved path is absent where nothing exists, and without a path")
+{
+    TestHost test;
+    test.machine.folder.link("dangling", test.machine.folder.path("nothing"));
+    test.host();
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip");
+    CHECK(object->aliasResolvedPath().isAbsent());
+    object->setPath(test.machine.folder.path("nothing"));
+    CHECK(object->aliasResolvedPath().isAbsent());
+    object->setPath(test.machine.folder.path("dangling"));
+    CHECK(object->aliasResolvedPath().isAbsent());
+}
+
+TEST_CASE("a path that was seen to hold no link resolves to itself without links being looked for")
+{
+    TestHost test;
+    const std::string file = test.machine.folder.file("real/trip.mov");
+    test.host();
+    const auto object = fileOfFolder(test.machine.folder.path("real"), "trip.mov", true);
+    CHECK(object->aliasResolvedPath() == Text(file));
+    const auto other = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "representative");
+    other->setPathOfObject(*object);
+    CHECK(other->path() == Text(file));
+    CHECK(other->aliasResolvedPath() == Text(file));
+}
+
+TEST_CASE("a new path of an object is resolved afresh")
+{
+    TestHost test;
+    const std::string file = test.machine.folder.file("real/trip.mov");
+    const std::string link = test.machine.folder.link("link.mov", file);
+    test.host();
+    const auto object = fileOfFolder(test.machine.folder.path("real"), "trip.mov", true);
+    object->setPath(link);
+    CHECK(object->aliasResolvedPath() == Text(file));
+    const auto other = fileOfFolder(test.machine.folder.path("real"), "trip.mov", true);
+    other->setPathOfObject(*object);
+    CHECK(other->path() == Text(link));
+    CHECK(other->aliasResolvedPath() == Text(file));
+}
+
+TEST_CASE("the search properties of a file are read when the first one is asked for, once")
+{
+    TestHost test;
+    test.host();
+    const OBMarvexPropertiesRef properties = OBMediaObject::marvexProperties("/movies/trip.mov");
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip");
+    object->setMarvexProperties(properties);
+    CHECK(properties->path() == "/movies/trip.mov");
+    CHECK(object->marvexProperties() == properties);
+    CHECK(test.machine.metadataIndex.timesAsked() == 0);
+    CHECK(properties->valueForKey("kMDItemPath") == Value("/movies/trip.mov"));
+    CHECK(object->marvexProperties()->valueForKey("kMDItemFSSize") == Value(17));
+    CHECK(properties->valueForKey("kMDItemContentType").isNull());
+    CHECK(properties->all().dictionary()->size() == 2);
+    CHECK(test.machine.metadataIndex.timesAsked() == 1);
+}
+
+TEST_CASE("an object without search properties of its own answers those of its file")
+{
+    TestHost test;
+    test.host();
+    const auto object = fileOfFolder("/movies", "trip.mov");
+    CHECK(object->marvexProperties()->path() == "/movies/trip.mov");
+    CHECK(test.machine.metadataIndex.timesAsked() == 0);
+    CHECK(object->marvexProperties()->valueForKey("kMDItemPath") == Value("/movies/trip.mov"));
+}
+
+TEST_CASE("without a host nothing is read of files")
+{
+    TemporaryFolder folder;
+    const auto object = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "trip");
+    object->setPath(folder.file("trip.mov"));
+    CHECK(object->aliasResolvedPath().isAbsent());
+    CHECK(object->thumbnailImage() == nullptr);
+    CHECK_FALSE(object->hasProducedThumbnail());
+    CHECK(OBMediaObject::marvexProperties(object->path())->all().isNull());
+    CHECK_FALSE(OBMediaGroup::modDateForFile(object->path()).has_value());
+}

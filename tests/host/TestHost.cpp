@@ -1,0 +1,60 @@
+#include "tests/host/TestHost.h"
+
+#include <doctest/doctest.h>
+
+#include <utility>
+
+namespace tests {
+
+TestHost::TestHost()
+{
+    machine.addBundle("plugins/Source.obplugin", identifier);
+    options.pluginFolders = { machine.folder.path("plugins") };
+    options.logSink = [log = log](std::string_view message, int level, const OBMediaManager* sender) {
+        log->write(std::to_string(level) + (sender ? " manager " : " - ") + std::string(message));
+    };
+    setScript(script);
+}
+
+TestHost::~TestHost()
+{
+    script->gate.open();
+    if (_host)
+        CHECK(_host->waitForThreads(longestWait));
+    _host = nullptr;
+    setScript(nullptr);
+}
+
+OBMediaHost& TestHost::host()
+{
+    if (!_host)
+        _host = std::make_unique<OBMediaHost>(machine.platform(), options);
+    return *_host;
+}
+
+std::shared_ptr<OBMediaManager> TestHost::manager()
+{
+    OBManagerResult result = host().createManager(identifier);
+    REQUIRE_MESSAGE(result.manager, result.problem);
+    return std::move(result.manager);
+}
+
+MadeUpBundle& TestHost::bundle()
+{
+    return machine.bundles.bundles.find(bundleFolder())->second;
+}
+
+std::string TestHost::bundleFolder() const
+{
+    return machine.folder.path("plugins/Source.obplugin");
+}
+
+void TestHost::endHost()
+{
+    script->gate.open();
+    if (_host)
+        CHECK(_host->waitForThreads(longestWait));
+    _host = nullptr;
+}
+
+} // namespace tests

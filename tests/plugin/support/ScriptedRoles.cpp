@@ -1,0 +1,120 @@
+#include "tests/plugin/support/ScriptedRoles.h"
+
+#include "platform/PathText.h"
+
+#include <algorithm>
+
+namespace tests {
+
+using platform::Locked;
+using platform::Value;
+
+namespace {
+
+    std::vector<std::string> pathsOf(const std::vector<ScriptedVolumes::Volume>& volumes)
+    {
+        std::vector<std::string> paths;
+        for (const ScriptedVolumes::Volume& volume : volumes)
+            paths.push_back(volume.path);
+        return paths;
+    }
+
+} // namespace
+
+platform::FolderListing ScriptedFileSystem::itemsInFolder(
+    std::string_view folder, const platform::ListingRequest& request) const
+{
+    const platform::FolderListing listing = FaultyFileSystem::itemsInFolder(folder, request);
+    std::vector<platform::FolderItem> items;
+    for (const platform::FolderItem item : listing)
+        items.push_back(item);
+    std::sort(items.begin(), items.end(),
+        [this](const auto& left, const auto& right) { return order(left.name, right.name); });
+    platform::FolderListing ordered(listing.problem());
+    for (const platform::FolderItem& item : items)
+        ordered.append(item);
+    if (listing.folderStatus())
+        ordered.setFolderStatus(*listing.folderStatus());
+    ordered.setPathIsReal(listing.pathIsReal());
+    return ordered;
+}
+
+std::vector<std::string> ScriptedVolumes::localVolumes() const
+{
+    if (whenListed)
+        whenListed();
+    return pathsOf(local.load());
+}
+
+std::vector<std::string> ScriptedVolumes::removableMedia() const
+{
+    return pathsOf(removable.load());
+}
+
+std::string ScriptedVolumes::displayName(std::string_view path) const
+{
+    for (const std::vector<Volume>& volumes : { local.load(), removable.load() }) {
+        for (const Volume& volume : volumes) {
+            if (volume.path == path)
+                return volume.displayName;
+        }
+    }
+    return std::string(platform::lastPathComponent(path));
+}
+
+std::optional<std::string> ScriptedWorkspace::applicationPath(std::string_view identifier) const
+{
+    _trace.add("application " + std::string(identifier));
+    if (whenAsked)
+        whenAsked();
+    return editor.load();
+}
+
+std::optional<std::string> ScriptedWorkspace::applicationIconFile(std::string_view) const
+{
+    return iconFile.load();
+}
+
+void ScriptedPreferences::set(const std::string& domain, std::string_view key, Value value)
+{
+    Locked guard(_lock);
+    _values[domain] = Value::Dictionary { { platform::Text(key), std::move(value) } };
+}
+
+platform::PreferencesAnswer ScriptedPreferences::valuesOfDomain(std::string_view domain) const
+{
+    _trace.add("preferences " + std::string(domain));
+    if (whenRead)
+        whenRead();
+    {
+        Locked guard(_lock);
+        if (const auto known = _values.find(domain); known != _values.end())
+            return { known->second, {} };
+    }
+    return _real.valuesOfDomain(domain);
+}
+
+std::optional<platform::MovieHeader> ScriptedMovies::headerOfMovie(std::string_view path) const
+{
+    pathsRead.add(std::string(path));
+    if (whenRead)
+        whenRead(path);
+    const auto known = headers.find(platform::lastPathComponent(path));
+    return known == headers.end() ? _real.headerOfMovie(path) : known->second;
+}
+
+std::optional<platform::ImageResource> ScriptedBundles::imageResource(
+    std::string_view folder, std::string_view name) const
+{
+    _trace.add("picture " + std::string(name));
+    return hasPictures.load() ? _real.imageResource(folder, name) : std::nullopt;
+}
+
+platform::LibraryAnswer ScriptedBundles::loadLibrary(const std::string& path, const char* symbol)
+{
+    if (linkedEntryPoint)
+        return { linkedEntryPoint, {} };
+    return _real.loadLibrary(path, symbol);
+}
+
+} // namespace tests

@@ -1,0 +1,206 @@
+#pragma once
+
+#include "platform/Bundles.h"
+#include "platform/Languages.h"
+#include "platform/Movies.h"
+#include "platform/Preferences.h"
+#include "platform/Snapshot.h"
+#include "platform/ThreadSafety.h"
+#include "platform/Threads.h"
+#include "platform/Volumes.h"
+#include "platform/Workspace.h"
+#include "platform/common/LocalNotificationCenter.h"
+#include "tests/support/FaultyFileSystem.h"
+
+#include <functional>
+#include <map>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+namespace tests {
+
+// Roles that answer what a test tells them. Hooks are set while no other thread is inside, and are called before the
+// answer is given, on the thread that asks; they may block, count, or ask for a cancel.
+
+/// Lines in the order in which they came. Any thread.
+class Trace {
+public:
+    void add(std::string line)
+    {
+        platform::Locked guard(_lock);
+        _lines.push_back(std::move(line));
+    }
+    std::vector<std::string> lines() const
+    {
+        platform::Locked guard(_lock);
+        return _lines;
+    }
+    /// Answers the lines so far and forgets them.
+    std::vector<std::string> take()
+    {
+        platform::Locked guard(_lock);
+        return std::exchange(_lines, {});
+    }
+
+private:
+    mutable platform::Mutex _lock;
+    std::vector<std::string> _lines GUARDED_BY(_lock);
+};
+
+/// Lists every folder in an order of the test's, by name at first, where a real disk's order is anybody's guess.
+class ScriptedFileSystem : public FaultyFileSystem {
+public:
+    using FaultyFileSystem::FaultyFileSystem;
+
+    platform::Snapshot<std::optional<std::string>> home {};
+    std::function<bool(std::string_view, std::string_view)> order = std::less<>();
+
+    std::optional<std::string> homeFolder() const override { return home.load(); }
+    platform::FolderListing itemsInFolder(
+        std::string_view folder, const platform::ListingRequest& request) const override;
+};
+
+class ScriptedVolumes : public platform::Volumes {
+public:
+    struct Volume {
+        std::string path;
+        std::string displayName;
+    };
+
+    platform::Snapshot<std::vector<Volume>> local {};
+    platform::Snapshot<std::vector<Volume>> removable {};
+    std::function<void()> whenListed {};
+
+    std::vector<std::string> localVolumes() const override;
+    std::vector<std::string> removableMedia() const override;
+    std::string displayName(std::string_view path) const override;
+    std::optional<std::string> fileSystemType(std::string_view) const override { return "ext4"; }
+};
+
+/// Knows the editor, or nothing.
+class ScriptedWorkspace : public platform::Workspace {
+public:
+    explicit ScriptedWorkspace(Trace& trace)
+        : _trace(trace)
+    {
+    }
+
+    platform::Snapshot<std::optional<std::string>> editor {};
+    platform::Snapshot<std::optional<std::string>> iconFile {};
+    std::function<void()> whenAsked {};
+
+    std::optional<std::string> applicationPath(std::string_view identifier) const override;
+    std::optional<std::string> applicationIconFile(std::string_view applicationPath) const override;
+
+private:
+    Trace& _trace;
+};
+
+/// Preferences of files, save for the domains that a test gives values.
+class ScriptedPreferences : public platform::Preferences {
+public:
+    ScriptedPreferences(const platform::Preferences& real, Trace& trace)
+        : _real(real)
+        , _trace(trace)
+    {
+    }
+
+    std::function<void()> whenRead {};
+
+    void set(const std::string& domain, std::string_view key, platform::Value value);
+
+    platform::PreferencesAnswer valuesOfDomain(std::string_view domain) const override;
+
+private:
+    const platform::Preferences& _real;
+    Trace& _trace;
+    mutable platform::Mutex _lock;
+    std::map<std::string, platform::Value, std::less<>> _values GUARDED_BY(_lock);
+};
+
+/// Real movies, save for those that a test gives a header.
+class ScriptedMovies : public platform::Movies {
+public:
+    explicit ScriptedMovies(const platform::Movies& real)
+        : _real(real)
+    {
+    }
+
+    /// By file name.
+    std::map<std::string, platform::MovieHeader, std::less<>> headers {};
+    std::function<void(std::string_view path)> whenRead {};
+    mutable Trace pathsRead {};
+
+    std::optional<platform::MovieHeader> headerOfMovie(std::string_view path) const override;
+
+private:
+    const platform::Movies& _real;
+};
+
+/// Bundles as they lie on disk; what their code is, the test decides.
+class ScriptedBundles : public platform::Bundles {
+public:
+    ScriptedBundles(platform::Bundles& real, Trace& trace)
+        : _real(real)
+        , _trace(trace)
+    {
+    }
+
+    void* linkedEntryPoint = nullptr; ///< in place of the bundle's library, where it is set
+    platform::Snapshot<bool> hasPictures { true };
+
+    platform::ManifestAnswer readManifest(std::string_view folder) const override { return _real.readManifest(folder); }
+    platform::StringTableAnswer readStringTable(std::string_view folder, std::string_view language) const override
+    {
+        return _real.readStringTable(folder, language);
+    }
+    std::optional<platform::ImageResource> imageResource(std::string_view folder, std::string_view name) const override;
+    platform::LibraryAnswer loadLibrary(const std::string& path, const char* symbol) override;
+    std::string installedPluginsFolder() const override { return "/nowhere"; }
+
+private:
+    platform::Bundles& _real;
+    Trace& _trace;
+};
+
+/// Real threads, and the nice values that they gave themselves.
+class RecordingThreads : public platform::Threads {
+public:
+    explicit RecordingThreads(platform::Threads& real)
+        : _real(real)
+    {
+    }
+
+    Trace niceValues {};
+
+    bool startDetached(const std::string& name, std::function<void()> body) override
+    {
+        return _real.startDetached(name, std::move(body));
+    }
+    void setNiceOfCurrentThread(int nice) override { niceValues.add(std::to_string(nice)); }
+
+private:
+    platform::Threads& _real;
+};
+
+/// Records who asks to be notified of what.
+class RecordingCenter : public platform::LocalNotificationCenter {
+public:
+    Trace added {};
+
+    Token addObserver(std::string_view name, const void* object, Handler handler) override
+    {
+        added.add(std::string(name) + (object ? " of one sender" : " of any sender"));
+        return LocalNotificationCenter::addObserver(name, object, std::move(handler));
+    }
+};
+
+class NoLanguages : public platform::Languages {
+public:
+    std::vector<std::string> preferredLanguages() const override { return {}; }
+};
+
+} // namespace tests

@@ -25,7 +25,7 @@ namespace {
 /// Movies of which nobody needs to read anything.
 class KnownMovies final : public platform::Movies {
 public:
-    std::optional<platform::MovieHeader> headerOfMovie(std::string_view) const override
+    std::optional<platform::MovieHeader> headerOfMovie(std::string_view, platform::PathKnowledge) const override
     {
         return platform::MovieHeader { platform::Size { 1920, 1080 }, 61.0 };
     }

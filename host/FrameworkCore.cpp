@@ -21,7 +21,7 @@ CurrentCore& currentCore()
 
 FrameworkCore::FrameworkCore(const platform::Platform& platform, OBLogSink logSink)
     : _platform(platform)
-    , _logSink(std::move(logSink))
+    , _logSink(logSink ? std::make_shared<const OBLogSink>(std::move(logSink)) : nullptr)
 {
 }
 
@@ -37,8 +37,8 @@ void FrameworkCore::setCurrent(std::shared_ptr<FrameworkCore> core)
 
 void FrameworkCore::log(std::string_view message, int level, const OBMediaManager* sender) const
 {
-    if (_logSink)
-        _logSink(message, level, sender);
+    if (const auto sink = _logSink.load())
+        (*sink)(message, level, sender);
 }
 
 void FrameworkCore::logOnce(const std::string& message, const OBMediaManager* sender)

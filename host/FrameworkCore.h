@@ -4,6 +4,7 @@
 #include "host/OBMediaBrowserImageManager.h"
 #include "host/OBPathWatcher.h"
 #include "platform/Platform.h"
+#include "platform/Snapshot.h"
 #include "platform/ThreadSafety.h"
 
 #include <chrono>
@@ -17,7 +18,6 @@
 #include <string_view>
 
 class OBMediaManager;
-
 
 /// What the parts of the framework share: the platform, the shared objects, the log, and the threads that are counted.
 ///
@@ -35,6 +35,8 @@ public:
     OBMediaBrowserImageManager& imageManager() { return _imageManager; }
 
     void log(std::string_view message, int level, const OBMediaManager* sender) const;
+    /// Logs no more: the application that reads the log has gone.
+    void stopLogging() { _logSink.store(nullptr); }
     /// Logs at level 2 what has not been logged before.
     void logOnce(const std::string& message, const OBMediaManager* sender);
 
@@ -48,7 +50,7 @@ private:
     void threadEnded();
 
     const platform::Platform _platform;
-    const OBLogSink _logSink;
+    platform::Snapshot<std::shared_ptr<const OBLogSink>> _logSink;
     OBPathWatcher _pathWatcher;
     OBMediaBrowserImageManager _imageManager;
 

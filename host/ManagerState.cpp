@@ -20,11 +20,11 @@ constexpr std::chrono::nanoseconds progressInterval = std::chrono::milliseconds(
 /// The manager whose load runs on this thread.
 thread_local const ManagerState* loadingOnThisThread = nullptr;
 
-/// 0.5 and above is a normal thread; below, linearly to the nicest at 0.0.
+/// 0.5 and above is a normal thread, like what is no number; below, linearly to the nicest at 0.0.
 int niceForPriority(double priority)
 {
     constexpr int nicest = 19;
-    return priority >= 0.5 ? 0 : static_cast<int>(std::lround((0.5 - priority) / 0.5 * nicest));
+    return priority < 0.5 ? static_cast<int>(std::lround((0.5 - std::max(priority, 0.0)) / 0.5 * nicest)) : 0;
 }
 
 } // namespace
@@ -112,8 +112,14 @@ void ManagerState::setAutoReload(bool enabled)
 
 void ManagerState::wasHandedOut()
 {
-    std::lock_guard guard(_lock);
-    _handedOut = true;
+    bool start = false;
+    {
+        std::lock_guard guard(_lock);
+        _handedOut = true;
+        start = _loadQueued && !std::exchange(_threadRuns, true);
+    }
+    if (start)
+        startLoadThread();
 }
 
 bool ManagerState::wantsLoadByItself() const
@@ -126,7 +132,7 @@ bool ManagerState::queueLoad(Job job)
     if (!_loadQueued || job == Job::wholeLoad)
         _queuedJob = job;
     _loadQueued = true;
-    return !std::exchange(_threadRuns, true);
+    return _handedOut && !std::exchange(_threadRuns, true);
 }
 
 void ManagerState::startLoadThread()
@@ -197,8 +203,8 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
         std::lock_guard guard(_lock);
         if (std::exchange(_loadActive, false))
             gate.end();
-        // Asked again, a cancelled load starts over; by itself it does not, or a cancel would never be one.
-        _needsReload = _needsReload || outcome == OBLoadOutcome::cancelled;
+        // Asked again, a load that gave no whole tree starts over; by itself it does not, or a cancel would never be one.
+        _needsReload = _needsReload || outcome != OBLoadOutcome::loaded;
         const auto later = std::stable_partition(
             _waiters.begin(), _waiters.end(), [this](const Waiter& waiter) { return waiter.load <= _loadNumber; });
         answered.assign(std::make_move_iterator(_waiters.begin()), std::make_move_iterator(later));
@@ -241,6 +247,8 @@ void ManagerState::loadDataCalled()
 
 void ManagerState::performLoad()
 {
+    // A source that asks for a load while it loads gets one afterwards.
+    loadingOnThisThread = nullptr;
     if (OBMediaGroupRef group = _manager.performLoadData())
         _manager.setRootMediaGroup(std::move(group));
 }
@@ -279,13 +287,19 @@ std::shared_ptr<ManagerObserver> ManagerState::addObserver(OBExecutor executor, 
         std::lock_guard guard(_lock);
         if (_ended)
             return observer;
-        std::erase_if(_observers, [](const auto& other) { return other->takenBack.load(); });
         _observers.push_back(observer);
         start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
     }
     if (start)
         startLoadThread();
     return observer;
+}
+
+void ManagerState::removeObserver(const std::shared_ptr<ManagerObserver>& observer)
+{
+    observer->takenBack = true;
+    std::lock_guard guard(_lock);
+    std::erase(_observers, observer);
 }
 
 ManagerState::Observers ManagerState::observers() const
@@ -307,9 +321,11 @@ void ManagerState::publishRoot(const OBMediaGroupRef& group)
     }
 }
 
-void ManagerState::tellProgress()
+void ManagerState::beginPath(const platform::Text& path)
 {
-    const std::int64_t now = core->platform().clock.monotonic().count();
+    const std::chrono::nanoseconds time = core->platform().clock.monotonic();
+    progress.pathAtWork.store({ path, time });
+    const std::int64_t now = time.count();
     std::int64_t last = progress.lastTold;
     if (now - last < progressInterval.count() || !progress.lastTold.compare_exchange_strong(last, now))
         return;

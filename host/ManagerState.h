@@ -73,8 +73,10 @@ struct ManagerState {
     void runLoads();
 
     std::shared_ptr<ManagerObserver> addObserver(OBExecutor executor, OBManagerCallbacks callbacks);
+    void removeObserver(const std::shared_ptr<ManagerObserver>& observer);
     void publishRoot(const OBMediaGroupRef& group);
-    void tellProgress();
+    /// Notes what is being read from now on, and tells observers how far the load is, not too often.
+    void beginPath(const platform::Text& path);
 
     void addNotification(platform::NotificationCenter& center, platform::NotificationCenter::Token token);
     void noteProblem(std::string_view path, platform::FileProblem problem);

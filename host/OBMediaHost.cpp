@@ -16,6 +16,7 @@ OBMediaHost::~OBMediaHost()
 {
     if (FrameworkCore::current() == _core)
         FrameworkCore::setCurrent(nullptr);
+    _core->stopLogging();
 }
 
 std::vector<OBPluginInfo> OBMediaHost::plugins()

@@ -15,7 +15,6 @@
 
 class PluginLibrary;
 
-
 /// How an application wants its host.
 struct OBHostOptions {
     /// Folders that are searched for bundles, in order, before the installed ones. Of two bundles with one identifier the

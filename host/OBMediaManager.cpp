@@ -16,16 +16,18 @@ OBMediaManager::OBMediaManager(const OBManagerContext& context)
 {
 }
 
-OBMediaManager::~OBMediaManager() = default;
+/// A call that was in flight when the manager ended may have registered since.
+OBMediaManager::~OBMediaManager()
+{
+    _state->core->pathWatcher().removeObserver(this);
+}
 
 bool OBMediaManager::init()
 {
     return true;
 }
 
-void OBMediaManager::dealloc()
-{
-}
+void OBMediaManager::dealloc() { }
 
 void OBMediaManager::loadData()
 {
@@ -178,7 +180,7 @@ Value OBMediaManager::preferencesOfDomain(std::string_view domain)
 platform::FolderListing OBMediaManager::listFolder(const Text& path, const platform::ListingRequest& request)
 {
     using platform::FileProblem;
-    notePathAtWork(path);
+    _state->beginPath(path);
     platform::FolderListing listing = platform().fileSystem.itemsInFolder(path, request);
     _state->progress.foldersDone.fetch_add(1, std::memory_order_relaxed);
     switch (listing.problem()) {
@@ -192,7 +194,6 @@ platform::FolderListing OBMediaManager::listFolder(const Text& path, const platf
     default:
         _state->noteProblem(path, listing.problem());
     }
-    _state->tellProgress();
     return listing;
 }
 
@@ -213,7 +214,7 @@ void OBMediaManager::noteItemsSkipped(std::uint64_t count)
 
 void OBMediaManager::notePathAtWork(const Text& path)
 {
-    _state->progress.pathAtWork.store({ path, platform().clock.monotonic() });
+    _state->beginPath(path);
 }
 
 std::shared_ptr<OBScanObserver> OBMediaManager::scanObserver() const
@@ -228,8 +229,7 @@ bool OBMediaManager::performOnMainThreadAndWait(const std::function<void()>& cal
 
 bool OBMediaManager::startThread(const std::string& name, std::function<void()> body)
 {
-    return _state->core->startThread(
-        name, [manager = shared_from_this(), work = std::move(body)] { work(); });
+    return _state->core->startThread(name, [manager = shared_from_this(), work = std::move(body)] { work(); });
 }
 
 void OBMediaManager::observeNotification(
@@ -256,7 +256,12 @@ void OBMediaManager::cancelLoad()
 OBObservation OBMediaManager::observe(OBExecutor executor, OBManagerCallbacks callbacks)
 {
     auto observer = _state->addObserver(std::move(executor), std::move(callbacks));
-    return OBObservation(std::shared_ptr<void>(nullptr, [observer](void*) { observer->takenBack = true; }));
+    const auto takeBack = [observer, manager = weak_from_this()](void*) {
+        observer->takenBack = true;
+        if (const auto alive = manager.lock())
+            alive->_state->removeObserver(observer);
+    };
+    return OBObservation(std::shared_ptr<void>(nullptr, takeBack));
 }
 
 OBLoadProgress OBMediaManager::loadProgress() const

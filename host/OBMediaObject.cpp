@@ -16,6 +16,9 @@ using platform::Locked;
 using platform::Text;
 using platform::Value;
 
+/// Room for what a source usually sets, so that it takes one allocation.
+constexpr std::size_t attributesUsually = 4;
+
 /// The fields of an object made by itself, or of one that was changed after its folder made it.
 struct OBMediaObject::OwnFields {
     int mediaType = 0;
@@ -44,7 +47,13 @@ public:
     {
     }
 
-    const platform::MovieHeader& header() const { return _header; }
+    bool hasPicture() const { return _header.resolution.has_value(); }
+    Value attributeForKey(std::string_view key) const
+    {
+        if (key == OBMediaObjectResolutionKey && _header.resolution)
+            return *_header.resolution;
+        return key == OBMediaObjectDurationKey && _header.duration ? Value(*_header.duration) : Value();
+    }
     Text name() const override { return "thumbnail"; }
     OBPixelSource pixelSource() const override
     {
@@ -225,15 +234,23 @@ void OBMediaObject::setMarvexProperties(OBMarvexPropertiesRef properties)
     std::swap(own().marvexProperties, properties);
 }
 
+/// What was set on the object comes first: it hides what the folder or the movie tells under the same key.
 Value OBMediaObject::attributeForKey(std::string_view key) const
 {
-    Value found;
     Locked guard(_lock);
-    visitAttributes([&](std::string_view name, const Value& value) {
-        if (name == key && found.isNull())
-            found = value;
-    });
-    return found;
+    if (_own) {
+        for (const auto& [name, value] : _own->attributes) {
+            if (name == key)
+                return value;
+        }
+    }
+    if (_folder) {
+        for (const Text& name : _folder->kind->ownPathKeys) {
+            if (name == key)
+                return pathLocked();
+        }
+    }
+    return _movie ? _movie->attributeForKey(key) : Value();
 }
 
 void OBMediaObject::setAttribute_forKey(Value value, Text key)
@@ -242,38 +259,35 @@ void OBMediaObject::setAttribute_forKey(Value value, Text key)
     Value::Dictionary& attributes = own().attributes;
     const auto existing = std::find_if(
         attributes.begin(), attributes.end(), [&](const Value::Entry& entry) { return entry.first == key; });
-    if (existing != attributes.end())
+    if (existing != attributes.end()) {
         existing->second = std::move(value);
-    else
-        attributes.emplace_back(std::move(key), std::move(value));
+        return;
+    }
+    if (attributes.empty())
+        attributes.reserve(attributesUsually);
+    attributes.emplace_back(std::move(key), std::move(value));
 }
 
 Value::Dictionary OBMediaObject::attributes() const
 {
     Value::Dictionary result;
     Locked guard(_lock);
-    visitAttributes([&](std::string_view name, const Value& value) {
-        if (std::none_of(result.begin(), result.end(), [&](const auto& entry) { return entry.first == name; }))
-            result.emplace_back(Text(name), value);
-    });
-    return result;
-}
-
-/// What was set on the object comes first: it hides what the folder or the movie tells under the same key.
-template <class Visitor> void OBMediaObject::visitAttributes(const Visitor& visitor) const
-{
-    if (_own) {
-        for (const auto& [name, value] : _own->attributes)
-            visitor(name.view(), value);
-    }
+    if (_own)
+        result = _own->attributes;
+    const auto addMissing = [&result](std::string_view key, Value value) {
+        const auto isKey = [key](const Value::Entry& entry) { return entry.first == key; };
+        if (!value.isNull() && std::none_of(result.begin(), result.end(), isKey))
+            result.emplace_back(Text(key), std::move(value));
+    };
     if (_folder) {
         for (const Text& key : _folder->kind->ownPathKeys)
-            visitor(key.view(), Value(pathLocked()));
+            addMissing(key, pathLocked());
     }
-    if (_movie && _movie->header().resolution)
-        visitor(OBMediaObjectResolutionKey, Value(*_movie->header().resolution));
-    if (_movie && _movie->header().duration)
-        visitor(OBMediaObjectDurationKey, Value(*_movie->header().duration));
+    for (const std::string_view key : { OBMediaObjectResolutionKey, OBMediaObjectDurationKey }) {
+        if (_movie)
+            addMissing(key, _movie->attributeForKey(key));
+    }
+    return result;
 }
 
 OBImageRef OBMediaObject::icon() const
@@ -290,10 +304,10 @@ void OBMediaObject::setIcon(OBImageRef icon)
 
 OBImageRef OBMediaObject::thumbnailImage()
 {
-    if (hasProducedThumbnail())
-        return thumbnailIfProduced();
-    if (const auto core = FrameworkCore::current())
-        core->platform().mainRunLoop.performAndWait([this] { produceThumbnail(); });
+    if (!hasProducedThumbnail()) {
+        if (const auto core = FrameworkCore::current())
+            core->platform().mainRunLoop.performAndWait([&] { produceThumbnail(core->platform()); });
+    }
     return thumbnailIfProduced();
 }
 
@@ -311,7 +325,7 @@ OBImageRef OBMediaObject::thumbnailIfProduced() const
     Locked guard(_lock);
     if (_own && _own->thumbnail)
         return _own->thumbnail;
-    return _movie && _movie->header().resolution ? _movie : nullptr;
+    return _movie && _movie->hasPicture() ? _movie : nullptr;
 }
 
 bool OBMediaObject::hasProducedThumbnail() const
@@ -321,15 +335,18 @@ bool OBMediaObject::hasProducedThumbnail() const
 }
 
 /// Runs on the main thread alone, so that no movie is read twice.
-void OBMediaObject::produceThumbnail()
+void OBMediaObject::produceThumbnail(const platform::Platform& platform)
 {
-    if (hasProducedThumbnail())
-        return;
-    const auto core = FrameworkCore::current();
-    const Text file = path();
-    std::optional<platform::MovieHeader> header;
-    if (core && file)
-        header = core->platform().movies.headerOfMovie(file);
+    Text file;
+    auto known = platform::PathKnowledge::none;
+    {
+        Locked guard(_lock);
+        if (_thumbnailProduced)
+            return;
+        file = pathLocked();
+        known = _pathIsReal ? platform::PathKnowledge::realPlainFile : platform::PathKnowledge::none;
+    }
+    const auto header = file ? platform.movies.headerOfMovie(file, known) : std::nullopt;
 
     std::shared_ptr<MovieThumbnail> movie;
     Locked guard(_lock);

@@ -12,6 +12,10 @@
 #include <string_view>
 #include <vector>
 
+namespace platform {
+struct Platform;
+}
+
 class OBMarvexProperties;
 class OBMediaObject;
 class OBMediaObjectBatch;
@@ -120,8 +124,7 @@ private:
     OwnFields& own() REQUIRES(_lock);
     std::string_view fileName() const;
     platform::Text pathLocked() const REQUIRES(_lock);
-    template <class Visitor> void visitAttributes(const Visitor& visitor) const REQUIRES(_lock);
-    void produceThumbnail();
+    void produceThumbnail(const platform::Platform& platform);
 
     // Constant once the object is handed out: which file of the folder this is; no folder for an object made by itself.
     const OBMediaFolder* _folder = nullptr;

@@ -83,8 +83,7 @@ public:
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override;
 
 private:
-    struct MakeKey {
-    };
+    struct MakeKey { };
 
 public:
     OBMediaObjectBatch(MakeKey key, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files);

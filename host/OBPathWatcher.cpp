@@ -9,9 +9,7 @@ using platform::Locked;
 
 OBPathWatcherObserver::~OBPathWatcherObserver() = default;
 
-void OBPathWatcherObserver::watchedPathChanged_fileChangedEventFlags(std::string_view, std::uint64_t)
-{
-}
+void OBPathWatcherObserver::watchedPathChanged_fileChangedEventFlags(std::string_view, std::uint64_t) { }
 
 void OBPathWatcherObserver::watchedQueryChanged_queryScope(
     const platform::Notification&, const std::vector<std::string>&)

@@ -227,7 +227,12 @@ char32_t takeCodePoint(std::string_view& text)
 {
     const auto byteAt = [&](std::size_t index) -> std::uint32_t { return static_cast<unsigned char>(text[index]); };
     const std::uint32_t lead = byteAt(0);
-    const std::size_t length = lead < 0x80 ? 1 : lead < 0xC2 ? 0 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : lead < 0xF5 ? 4 : 0;
+    const std::size_t length = lead < 0x80 ? 1
+        : lead < 0xC2                      ? 0
+        : lead < 0xE0                      ? 2
+        : lead < 0xF0                      ? 3
+        : lead < 0xF5                      ? 4
+                                           : 0;
     constexpr std::uint32_t leadBits[] = { 0, 0x7F, 0x1F, 0x0F, 0x07 };
     constexpr std::uint32_t smallest[] = { 0, 0, 0x80, 0x800, 0x10000 };
     std::uint32_t codePoint = lead & leadBits[length];

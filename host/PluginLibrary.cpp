@@ -46,6 +46,13 @@ struct Deallocate {
     }
 };
 
+std::string onOneLine(std::string text)
+{
+    std::replace_if(
+        text.begin(), text.end(), [](unsigned char letter) { return letter < ' '; }, ' ');
+    return text;
+}
+
 /// Calls code of a plug-in; the text of what it throws, or nothing.
 template <class Call> std::string textOfThrown(const Call& call)
 {
@@ -53,7 +60,7 @@ template <class Call> std::string textOfThrown(const Call& call)
         call();
         return {};
     } catch (const std::exception& error) {
-        return std::string("it threw: ") + error.what();
+        return onOneLine(std::string("it threw: ") + error.what());
     } catch (...) {
         return "it threw";
     }
@@ -73,7 +80,8 @@ std::vector<std::string> bundlesIn(const platform::FileSystem& fileSystem, const
 
 std::string versionProblem(const platform::BundleManifest& manifest)
 {
-    if (manifest.hostInterfaceMinimum <= OBHostInterfaceVersion && OBHostInterfaceVersion <= manifest.hostInterfaceMaximum)
+    if (manifest.hostInterfaceMinimum <= OBHostInterfaceVersion
+        && OBHostInterfaceVersion <= manifest.hostInterfaceMaximum)
         return {};
     return "made for host interface " + std::to_string(manifest.hostInterfaceMinimum) + " to "
         + std::to_string(manifest.hostInterfaceMaximum) + ", this is " + std::to_string(OBHostInterfaceVersion);
@@ -94,7 +102,7 @@ PluginLibrary::PluginLibrary(FrameworkCore& core, std::vector<std::string> folde
                 continue;
             Plugin plugin = readBundle(std::move(path));
             const Plugin* first = find(plugin.info.identifier);
-            if (first && plugin.info.reason.empty())
+            if (first && first->info.reason.empty() && plugin.info.reason.empty())
                 plugin.info.reason = "the plug-in is there already, in " + first->info.path;
             _plugins.push_back(std::move(plugin));
         }
@@ -135,7 +143,8 @@ PluginLibrary::Plugin* PluginLibrary::find(std::string_view identifier)
     return refused;
 }
 
-void PluginLibrary::load(Plugin& plugin)
+/// What is to be logged is left to the caller, for when the lock is released.
+void PluginLibrary::load(Plugin& plugin, std::vector<std::string>& toLog)
 {
     if (plugin.managerClass || !plugin.info.reason.empty())
         return;
@@ -151,12 +160,12 @@ void PluginLibrary::load(Plugin& plugin)
     plugin.info.loaded = plugin.info.reason.empty();
     if (plugin.info.loaded) {
         plugin.bundle = std::make_shared<const OBBundle>(
-            _core.platform().bundles, plugin.info.path, plugin.manifest, stringTable(plugin));
+            _core.platform().bundles, plugin.info.path, plugin.manifest, stringTable(plugin, toLog));
     }
 }
 
 /// The texts in the first of the user's languages that the bundle has, else in English.
-Value PluginLibrary::stringTable(const Plugin& plugin)
+Value PluginLibrary::stringTable(const Plugin& plugin, std::vector<std::string>& toLog) const
 {
     std::vector<std::string> wanted = _core.platform().languages.preferredLanguages();
     wanted.emplace_back(fallbackLanguage);
@@ -164,40 +173,52 @@ Value PluginLibrary::stringTable(const Plugin& plugin)
     for (const std::string& language : wanted) {
         if (std::find(offered.begin(), offered.end(), language) == offered.end())
             continue;
-        platform::StringTableAnswer answer
-            = _core.platform().bundles.readStringTable(plugin.info.path, language);
+        platform::StringTableAnswer answer = _core.platform().bundles.readStringTable(plugin.info.path, language);
         if (answer.problem.empty())
             return std::move(answer.table);
-        _core.logOnce(answer.problem, nullptr);
+        toLog.push_back(std::move(answer.problem));
     }
     return {};
 }
 
 const OBMediaManagerClass* PluginLibrary::managerClass(std::string_view identifier)
 {
-    Locked guard(_lock);
-    Plugin* plugin = find(identifier);
-    if (!plugin)
-        return nullptr;
-    load(*plugin);
-    return plugin->info.reason.empty() ? plugin->managerClass : nullptr;
+    std::vector<std::string> toLog;
+    const OBMediaManagerClass* managerClass = nullptr;
+    {
+        Locked guard(_lock);
+        if (Plugin* plugin = find(identifier)) {
+            load(*plugin, toLog);
+            managerClass = plugin->info.reason.empty() ? plugin->managerClass : nullptr;
+        }
+    }
+    log(toLog);
+    return managerClass;
+}
+
+void PluginLibrary::log(const std::vector<std::string>& lines)
+{
+    for (const std::string& line : lines)
+        _core.logOnce(line, nullptr);
 }
 
 OBManagerResult PluginLibrary::createManager(const std::shared_ptr<FrameworkCore>& core, std::string_view identifier)
 {
     const OBMediaManagerClass* managerClass = nullptr;
     std::shared_ptr<const OBBundle> bundle;
+    std::vector<std::string> toLog;
     {
         Locked guard(_lock);
         Plugin* plugin = find(identifier);
         if (!plugin)
             return { nullptr, "no plug-in called " + std::string(identifier) };
-        load(*plugin);
+        load(*plugin, toLog);
         if (!plugin->info.reason.empty())
             return { nullptr, plugin->info.path + ": " + plugin->info.reason };
         managerClass = plugin->managerClass;
         bundle = plugin->bundle;
     }
+    log(toLog);
 
     std::unique_ptr<OBMediaManager> made;
     std::string problem = textOfThrown([&] { made = managerClass->alloc(OBManagerContext(core, bundle)); });
@@ -210,6 +231,8 @@ OBManagerResult PluginLibrary::createManager(const std::shared_ptr<FrameworkCore
     if (problem.empty() && !isReady)
         problem = "its manager did not become ready";
     if (!problem.empty()) {
+        if (manager)
+            manager->end();
         refuse(identifier, problem);
         return { nullptr, bundle->folder() + ": " + problem };
     }

@@ -32,8 +32,9 @@ private:
 
     Plugin readBundle(std::string path) const;
     Plugin* find(std::string_view identifier) REQUIRES(_lock);
-    void load(Plugin& plugin) REQUIRES(_lock);
-    platform::Value stringTable(const Plugin& plugin);
+    void load(Plugin& plugin, std::vector<std::string>& toLog) REQUIRES(_lock);
+    platform::Value stringTable(const Plugin& plugin, std::vector<std::string>& toLog) const;
+    void log(const std::vector<std::string>& lines);
     void refuse(std::string_view identifier, const std::string& reason);
 
     FrameworkCore& _core;

@@ -36,6 +36,12 @@ enum class LinkPolicy : std::uint8_t {
     stop, ///< answer FileProblem::linkOnTheWay when any component of the path, the last included, is a link
 };
 
+/// What whoever names a path has seen of it before.
+enum class PathKnowledge : std::uint8_t {
+    none,
+    realPlainFile, ///< a plain file, by a path without symbolic links; saves looking again before it is opened
+};
+
 /// Facts about one item.
 struct ItemStatus {
     ItemKind kind = ItemKind::other;
@@ -67,6 +73,8 @@ struct ListingRequest {
     std::string_view marker {};
     /// The modification date, links followed, of every item that holds the marker.
     bool datesOfHolders = false;
+    /// The folder's own facts.
+    bool folderStatus = false;
     LinkPolicy links = LinkPolicy::follow;
 };
 
@@ -93,7 +101,8 @@ public:
     /// Why there are no items, or `none`. A folder that was read and is empty has no problem; one of which the disk gave
     /// only a part answers that part, and `readError`.
     FileProblem problem() const noexcept { return _problem; }
-    /// The folder's own facts, links followed, taken while it was listed; absent when it could not be listed.
+    /// The folder's own facts, links followed, taken while it was listed; absent when it could not be listed, and when the
+    /// request did not ask for them.
     const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
 
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
@@ -213,7 +222,7 @@ public:
     virtual std::string resolvedPath(std::string_view path) const = 0;
 
     /// Opens the plain file at `path` for reading, links followed. Never opens a pipe, device or socket.
-    virtual OpenResult openPlainFile(std::string_view path) const = 0;
+    virtual OpenResult openPlainFile(std::string_view path, PathKnowledge known = PathKnowledge::none) const = 0;
 
     /// This file system without links that the machine adds to those on disk. A machine laid over another builds on it.
     virtual const FileSystem& withoutAddedLinks() const { return *this; }
@@ -236,6 +245,11 @@ inline void FolderListing::Entry::take(const FolderItem& item)
 
 inline void FolderListing::append(const FolderItem& item)
 {
+    if (_entries.empty()) {
+        // Most folders are small; what grows beyond this doubles.
+        _entries.reserve(8);
+        _names.reserve(128);
+    }
     Entry& entry = _entries.emplace_back();
     entry.nameOffset = static_cast<std::uint32_t>(_names.size());
     entry.nameLength = static_cast<std::uint32_t>(item.name.size());

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "platform/FileSystem.h"
 #include "platform/Value.h"
 
 #include <optional>
@@ -23,7 +24,8 @@ public:
 
     /// The header of the movie at `path`, links followed; absent when there is no plain file, when the file is no
     /// movie, is cut short within its header, or lies about its sizes. Time and memory are bounded whatever the file holds.
-    virtual std::optional<MovieHeader> headerOfMovie(std::string_view path) const = 0;
+    virtual std::optional<MovieHeader> headerOfMovie(
+        std::string_view path, PathKnowledge known = PathKnowledge::none) const = 0;
 };
 
 } // namespace platform

@@ -71,7 +71,8 @@ bool OBMontaroPlugin::init()
 
     setLoadThreadPriority(defaultLoadThreadPriority);
     const Value stored = preferencesOfDomain(OBHostPreferencesDomain).valueForKey(threadPriorityKey);
-    if (const std::optional<double> priority = doubleOfPreference(stored); priority && *priority >= 0.0 && *priority <= 1.0)
+    if (const std::optional<double> priority = doubleOfPreference(stored);
+        priority && *priority >= 0.0 && *priority <= 1.0)
         setLoadThreadPriority(*priority);
     return true;
 }

@@ -31,9 +31,9 @@ inline constexpr ScanRule isVisible { "hidden file",
     [](const platform::FolderItem& item) { return !item.flags.invisible; }, "no file .hidden names it",
     "the file .hidden of its folder names it", "remove its name from the file .hidden of its folder" };
 
-inline constexpr ScanRule isContainer { "folder",
-    [](const platform::FolderItem& item) { return item.flags.container; }, "it is a folder",
-    "it is neither a project nor a folder", "move it out of the library, or share the project that it belongs to" };
+inline constexpr ScanRule isContainer { "folder", [](const platform::FolderItem& item) { return item.flags.container; },
+    "it is a folder", "it is neither a project nor a folder",
+    "move it out of the library, or share the project that it belongs to" };
 
 inline constexpr ScanRule isNotPackage { "package",
     [](const platform::FolderItem& item) { return !item.flags.package; }, "it is a plain folder",

@@ -10,9 +10,9 @@ FileMovies::FileMovies(const FileSystem& files)
 {
 }
 
-std::optional<MovieHeader> FileMovies::headerOfMovie(std::string_view path) const
+std::optional<MovieHeader> FileMovies::headerOfMovie(std::string_view path, PathKnowledge known) const
 {
-    const OpenResult opened = _files.openPlainFile(path);
+    const OpenResult opened = _files.openPlainFile(path, known);
     return opened.file ? readMovieHeader(*opened.file) : std::nullopt;
 }
 

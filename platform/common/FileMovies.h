@@ -12,7 +12,8 @@ public:
     /// `files` outlives this object.
     explicit FileMovies(const FileSystem& files);
 
-    std::optional<MovieHeader> headerOfMovie(std::string_view path) const override;
+    std::optional<MovieHeader> headerOfMovie(
+        std::string_view path, PathKnowledge known = PathKnowledge::none) const override;
 
 private:
     const FileSystem& _files;

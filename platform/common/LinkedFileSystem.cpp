@@ -298,8 +298,14 @@ std::string LinkedFileSystem::resolvedPath(std::string_view path) const
     return placeOf(path, LastLink::followed).path;
 }
 
-OpenResult LinkedFileSystem::openPlainFile(std::string_view path) const
+OpenResult LinkedFileSystem::openPlainFile(std::string_view path, PathKnowledge known) const
 {
+    // What was seen to hold no link need not be walked; the disk tells if that has changed.
+    if (known == PathKnowledge::realPlainFile && !(_table.mayApplyTo(path) && _table.linkAtOrAbove(path))) {
+        OpenResult result = _real.openPlainFile(path, known);
+        if (result.file)
+            return result;
+    }
     return askFollowingLinks(path, askOpen, notOpened);
 }
 

@@ -1,6 +1,7 @@
 #include "platform/linux/FolderOpening.h"
 
 #include "platform/linux/ItemReading.h"
+#include "platform/linux/OpenWithoutLinks.h"
 #include "platform/linux/SystemPath.h"
 
 #include <cerrno>
@@ -8,9 +9,7 @@
 #include <string>
 
 #include <fcntl.h>
-#include <linux/openat2.h>
 #include <sys/stat.h>
-#include <sys/syscall.h>
 
 namespace platform {
 
@@ -41,16 +40,12 @@ namespace {
     }
 
     // Absent when this kernel or its sandbox does not know the call.
-    std::optional<OpenedFolder> openWithoutLinks(const char* path)
+    std::optional<OpenedFolder> openFolderWithoutLinks(const char* path)
     {
-        open_how how {};
-        how.flags = listingFlags;
-        how.resolve = RESOLVE_NO_SYMLINKS;
-        const auto open = [&] { return syscall(SYS_openat2, AT_FDCWD, path, &how, sizeof(how)); };
-        const long number = uninterrupted(open);
+        const int number = openWithoutLinks(path, listingFlags);
         if (number == -1 && (errno == ENOSYS || errno == EPERM))
             return std::nullopt;
-        OpenedFolder folder = opened(static_cast<int>(number));
+        OpenedFolder folder = opened(number);
         if (folder.problem == FileProblem::linksInCircles)
             folder.problem = FileProblem::linkOnTheWay;
         return folder;
@@ -75,7 +70,7 @@ OpenedFolder openFolder(std::string_view path, LinkPolicy links)
         return failed(systemPath.problem());
     if (links == LinkPolicy::follow)
         return openFollowing(AT_FDCWD, systemPath.bytes(), listingFlags);
-    if (auto folder = openWithoutLinks(systemPath.bytes()))
+    if (auto folder = openFolderWithoutLinks(systemPath.bytes()))
         return std::move(*folder);
     return openFolderStepByStep(path);
 }

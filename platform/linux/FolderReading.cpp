@@ -45,8 +45,10 @@ namespace {
     {
         // A file system that never comes to an end (FUSE) must not eat the memory.
         constexpr std::size_t itemsAtMost = 20'000'000;
-        if (const auto status = readItemStatus(_folder, "", AT_EMPTY_PATH))
-            _listing.setFolderStatus(*status);
+        if (_request.folderStatus) {
+            if (const auto status = readItemStatus(_folder, "", AT_EMPTY_PATH))
+                _listing.setFolderStatus(*status);
+        }
         alignas(dirent64) char block[64 * 1024];
         ssize_t length = 0;
         do {

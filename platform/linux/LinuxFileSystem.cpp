@@ -9,6 +9,7 @@
 #include "platform/linux/ItemReading.h"
 #include "platform/linux/PathResolution.h"
 #include "platform/linux/PlainFile.h"
+#include "platform/linux/SeenPlainFile.h"
 #include "platform/linux/SystemPath.h"
 
 #include <cerrno>
@@ -144,12 +145,13 @@ std::string LinuxFileSystem::resolvedPath(std::string_view path) const
     return pathWithLinksResolved(path);
 }
 
-OpenResult LinuxFileSystem::openPlainFile(std::string_view path) const
+OpenResult LinuxFileSystem::openPlainFile(std::string_view path, PathKnowledge known) const
 {
     const SystemPath systemPath(path);
     if (!systemPath.isUsable())
         return { nullptr, systemPath.problem() };
-    OpenedFile file = openPlainFileAt(AT_FDCWD, systemPath.bytes());
+    OpenedFile file = known == PathKnowledge::realPlainFile ? openSeenPlainFile(systemPath.bytes())
+                                                            : openPlainFileAt(AT_FDCWD, systemPath.bytes());
     if (file.problem != FileProblem::none)
         return { nullptr, file.problem };
     return { std::make_unique<LinuxOpenFile>(std::move(file)), FileProblem::none };

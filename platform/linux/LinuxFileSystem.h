@@ -15,7 +15,7 @@ public:
     std::optional<std::string> linkTarget(std::string_view path) const override;
     ItemFlags itemFlags(std::string_view path) const override;
     std::string resolvedPath(std::string_view path) const override;
-    OpenResult openPlainFile(std::string_view path) const override;
+    OpenResult openPlainFile(std::string_view path, PathKnowledge known = PathKnowledge::none) const override;
 };
 
 } // namespace platform

@@ -24,7 +24,7 @@ namespace {
 constexpr std::string_view localizedExtension = "localized";
 
 /// Names and flags of the entries, and of each whether it is a project and since when.
-constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPathComponent, true };
+constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPathComponent, true, true };
 
 /// What all movies of all projects share.
 std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin)
@@ -33,10 +33,11 @@ std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin
         plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey } });
 }
 
-OBMediaGroupRef groupForFolder(OBTypeIdentifierRef type, const Text& path, const Text& parentID, const OBImageRef& icon)
+OBMediaGroupRef groupForFolder(
+    OBTypeIdentifierRef type, std::string_view name, const Text& path, const Text& parentID, const OBImageRef& icon)
 {
     const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
-    group->setName(platform::lastPathComponent(path));
+    group->setName(name);
     group->setParentID(parentID);
     group->setID(path);
     group->setIcon(icon);
@@ -97,16 +98,16 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 {
     if (!path)
         return nullptr;
-    const OBMediaGroupRef folder = groupForFolder(OBMontaroFolderGroupTypeIdentifier, path,
-        platform::pathByRemovingLastComponent(path), scan.projectIcon);
+    const std::string_view name = platform::lastPathComponent(path);
+    const OBMediaGroupRef folder = groupForFolder(
+        OBMontaroFolderGroupTypeIdentifier, name, path, platform::pathByRemovingLastComponent(path), scan.projectIcon);
 
     // A folder may be known to people by a name with an extension that it does not have on disk.
     Text listed = path;
     FolderListing listing = listFolder(path, projectListing);
     folder->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                                        : OBMediaGroup::modDateForFile(path));
-    if (listing.problem() != FileProblem::none
-        && platform::extensionOfName(platform::lastPathComponent(path)) == localizedExtension) {
+    if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
     }
@@ -128,12 +129,12 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
     }
 
     if (folder->childGroups().empty()) {
-        const OBMediaGroupRef placeholder = groupForFolder(listed == _MontaroDefaultPath()
-                ? OBMontaroProjectLibraryGroupTypeIdentifier
-                : OBMontaroFolderGroupTypeIdentifier,
-            listed, listed, scan.projectIcon);
-        placeholder->setModificationDate(listed == path ? folder->modificationDate()
-                                                        : OBMediaGroup::modDateForFile(listed));
+        const OBMediaGroupRef placeholder
+            = groupForFolder(listed == _MontaroDefaultPath() ? OBMontaroProjectLibraryGroupTypeIdentifier
+                                                             : OBMontaroFolderGroupTypeIdentifier,
+                platform::lastPathComponent(listed), listed, listed, scan.projectIcon);
+        placeholder->setModificationDate(
+            listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed));
         scan.addToFlatGroups(placeholder);
     }
     _createMontaroProjectsFolderMediaObjects(folder);
@@ -144,16 +145,14 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 OBMediaGroupRef OBMontaroPlugin::projectGroup(const Text& listedFolder, const FolderItem& item, ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
-    const OBMediaGroupRef project
-        = groupForFolder(OBMontaroProjectGroupTypeIdentifier, path, listedFolder, scan.projectIcon);
-    project->setName(platform::nameWithoutExtension(item.name));
-    project->setModificationDate(
-        item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
+    const OBMediaGroupRef project = groupForFolder(OBMontaroProjectGroupTypeIdentifier,
+        platform::nameWithoutExtension(item.name), path, listedFolder, scan.projectIcon);
+    project->setModificationDate(item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
     scan.addToFlatGroups(project);
 
     const SharedMovies movies = sharedMoviesOfProject(*this, scan.report, path);
-    project->setMediaObjects(OBMediaObjectBatch::objects(
-        scan.movieKind, { movies.folder, movies.listing.pathIsReal() }, movies.files));
+    project->setMediaObjects(
+        OBMediaObjectBatch::objects(scan.movieKind, { movies.folder, movies.listing.pathIsReal() }, movies.files));
     project->setIcon(movies.files.empty() ? scan.emptyProjectIcon : scan.projectIcon);
     noteItemsFound(movies.files.size());
     return project;

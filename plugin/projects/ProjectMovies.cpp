@@ -32,6 +32,7 @@ SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& re
 {
     SharedMovies movies { Text::joined(project, sharedItemsFolder), {}, {} };
     movies.listing = manager.listFolder(movies.folder, {});
+    movies.files.reserve(movies.listing.size());
     for (const platform::FolderItem item : movies.listing) {
         if (report.passes(ScanRules::hasMovieExtension, item, movies.folder))
             movies.files.push_back({ item.name, item.kind == platform::ItemKind::file });
@@ -76,8 +77,7 @@ void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGrou
         }
         const ChosenMovie chosen = chooseRepresentativeMovie(*this, child->mediaObjects());
         if (chosen.movie) {
-            folder->setMediaObjects(
-                folder->ownMediaObjects().appending(makeRepresentative(*this, *child, chosen, {})));
+            folder->setMediaObjects(folder->ownMediaObjects().appending(makeRepresentative(*this, *child, chosen, {})));
         }
     }
 }

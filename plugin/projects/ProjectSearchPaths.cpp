@@ -27,6 +27,6 @@ void OBMontaroPlugin::_prepareMontaroProjectsSearchPaths()
     Locked guard(*_MontaroSearchPathsLock);
     const Text defaultPath = _MontaroDefaultPath();
     _missingMontaroDefaultPath = !defaultPath || !platform().fileSystem.exists(defaultPath);
-    _MontaroSearchPaths.store(std::make_shared<const std::vector<Text>>(
-        foldersToSearch(platform(), defaultPath, MontaroProjectsFolderName)));
+    _MontaroSearchPaths.store(
+        std::make_shared<const std::vector<Text>>(foldersToSearch(platform(), defaultPath, MontaroProjectsFolderName)));
 }

@@ -233,3 +233,25 @@ TEST_CASE("a deep tree is released when it is replaced in the list of its parent
     parent->setChildGroups({});
     CHECK(watched.expired());
 }
+
+TEST_CASE("the media objects of a tree as deep as a path can be are answered and visited")
+{
+    constexpr std::size_t levels = 2000;
+    OBMediaGroupRef top;
+    for (std::size_t level = 0; level < levels; ++level) {
+        const auto movies = OBMediaGroup::initWithTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
+        const auto movie = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "movie");
+        movies->setMediaObjects(OBMediaObjectList().appending(movie));
+        auto group = OBMediaGroup::initWithTypeIdentifier(OBMontaroFolderGroupTypeIdentifier);
+        group->addChildGroup(movies);
+        group->addChildGroup(std::move(top));
+        top = std::move(group);
+    }
+    const OBMediaObjectList objects = top->mediaObjects();
+    top = nullptr;
+    CHECK(objects.size() == levels);
+    CHECK(objects[levels - 1]->name() == "movie");
+    std::size_t seen = 0;
+    objects.visit([&seen](OBMediaObject&) { return ++seen != 0; });
+    CHECK(seen == levels);
+}

@@ -125,14 +125,15 @@ std::vector<std::thread::id> CountingMovies::threads() const
     return _threads;
 }
 
-std::optional<platform::MovieHeader> CountingMovies::headerOfMovie(std::string_view path) const
+std::optional<platform::MovieHeader> CountingMovies::headerOfMovie(
+    std::string_view path, platform::PathKnowledge known) const
 {
     {
         std::lock_guard guard(_lock);
         _read.emplace_back(path);
         _threads.push_back(std::this_thread::get_id());
     }
-    return _movies.headerOfMovie(path);
+    return _movies.headerOfMovie(path, known);
 }
 
 HostMachine::HostMachine()

@@ -99,7 +99,8 @@ public:
     }
     std::vector<std::string> read() const;
     std::vector<std::thread::id> threads() const;
-    std::optional<platform::MovieHeader> headerOfMovie(std::string_view path) const override;
+    std::optional<platform::MovieHeader> headerOfMovie(
+        std::string_view path, platform::PathKnowledge known = platform::PathKnowledge::none) const override;
 
 private:
     platform::FileMovies _movies;

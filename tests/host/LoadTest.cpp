@@ -241,7 +241,7 @@ TEST_CASE("the folders that the last load could not read are told, missing ones 
             return platform::FileProblem::readError;
         if (folder == "/long")
             return platform::FileProblem::pathTooLong;
-        return folder == "/file" ? platform::FileProblem::notAFolder : platform::FileProblem::missing;
+        return folder == "/file" ? platform::FileProblem::notAFolder : platform::FileProblem::none;
     };
     test.script->whenPerforming = [](ScriptedManager& manager) {
         for (const char* folder : { "/unreadable", "/missing", "/file", "/broken", "/long" })

@@ -53,13 +53,13 @@ std::string FaultyFileSystem::resolvedPath(std::string_view path) const
     return _real.resolvedPath(path);
 }
 
-platform::OpenResult FaultyFileSystem::openPlainFile(std::string_view path) const
+platform::OpenResult FaultyFileSystem::openPlainFile(std::string_view path, platform::PathKnowledge known) const
 {
     tell(path);
     const FileProblem problem = whenOpening ? whenOpening(path) : FileProblem::none;
     if (problem != FileProblem::none)
         return { nullptr, problem };
-    return _real.openPlainFile(path);
+    return _real.openPlainFile(path, known);
 }
 
 } // namespace tests

@@ -35,7 +35,8 @@ public:
     std::optional<std::string> linkTarget(std::string_view path) const override;
     platform::ItemFlags itemFlags(std::string_view path) const override;
     std::string resolvedPath(std::string_view path) const override;
-    platform::OpenResult openPlainFile(std::string_view path) const override;
+    platform::OpenResult openPlainFile(
+        std::string_view path, platform::PathKnowledge known = platform::PathKnowledge::none) const override;
 
 private:
     void tell(std::string_view path) const;

@@ -112,11 +112,13 @@ TEST_CASE_TEMPLATE("a listing tells the folder's own facts", Machine, OMBRIX_ALL
     const Machine machine;
     machine.disk.folder("Trip");
     setModificationDate(machine.disk.path("Trip"), { 1'300'000'000, 123'456'789 });
-    const auto listing = machine.files.itemsInFolder(machine.root + "/Trip", {});
+    platform::ListingRequest request;
+    request.folderStatus = true;
+    const auto listing = machine.files.itemsInFolder(machine.root + "/Trip", request);
     REQUIRE(listing.folderStatus());
     CHECK(listing.folderStatus()->kind == ItemKind::folder);
     CHECK(listing.folderStatus()->modificationDate == platform::Date { 1'300'000'000, 123'456'789 });
-    CHECK_FALSE(machine.files.itemsInFolder(machine.root + "/missing", {}).folderStatus());
+    CHECK_FALSE(machine.files.itemsInFolder(machine.root + "/missing", request).folderStatus());
 }
 
 TEST_CASE_TEMPLATE("a listing tells which items hold a marker, and their dates", Machine, OMBRIX_ALL_FILE_MACHINES)

@@ -155,3 +155,16 @@ TEST_CASE_TEMPLATE("a listing that is to stop at links follows none", Machine, O
     CHECK(linesOf(machine.files.itemsInFolder(machine.disk.path("real"), request))
         == Lines { "linked folder container holder-of-link", "project folder container holder" });
 }
+
+TEST_CASE_TEMPLATE("what is known of a path saves calls and changes no answer", Machine, OMBRIX_ALL_FILE_MACHINES)
+{
+    const Machine machine;
+    machine.disk.file("folder/a.mov", "12345");
+    machine.disk.link("way", "folder");
+    const auto known = platform::PathKnowledge::realPlainFile;
+    const auto opened = machine.files.openPlainFile(machine.root + "/folder/a.mov", known);
+    REQUIRE(opened.file);
+    CHECK(opened.file->status().size == 5);
+    CHECK(machine.files.openPlainFile(machine.root + "/missing", known).problem == FileProblem::missing);
+    CHECK(machine.files.openPlainFile(machine.root + "/folder", known).problem == FileProblem::notAPlainFile);
+}

@@ -45,17 +45,18 @@ TEST_CASE("every movie header of the corpus is read or refused")
 
 TEST_CASE("every property list of the corpus is read, and written and read again, or refused with one line")
 {
-    for (const char* name : { "property-list-xml", "property-list-binary" }) {
-        int read = 0;
-        CHECK(replay(name, [&](const std::string& bytes) {
-            const PropertyListResult result = readPropertyList(bytes);
-            CHECK(isOneLine(result.problem));
-            read += result.problem.empty() ? 1 : 0;
-            if (result.problem.empty() && !result.value.isNull())
-                CHECK(readPropertyList(writeXmlPropertyList(result.value)).problem == "");
-        }) >= 3);
-        CHECK(read >= 2);
-    }
+    int read = 0;
+    const auto readTwice = [&](const std::string& bytes) {
+        const PropertyListResult result = readPropertyList(bytes);
+        CHECK(isOneLine(result.problem));
+        if (!result.problem.empty())
+            return;
+        ++read;
+        CHECK(readPropertyList(writeXmlPropertyList(result.value)).problem == "");
+    };
+    CHECK(replay("property-list-xml", readTwice) >= 3);
+    CHECK(replay("property-list-binary", readTwice) >= 3);
+    CHECK(read >= 5);
 }
 
 TEST_CASE("every manifest of the corpus is read or refused with one line")

@@ -1,11 +1,20 @@
 #pragma once
 
 #include <cstdint>
+#include <initializer_list>
 #include <string>
 #include <string_view>
 
 /// Builders of the boxes of a movie, each answering the box's bytes.
 namespace movie {
+
+inline std::string joined(std::initializer_list<std::string_view> parts)
+{
+    std::string bytes;
+    for (std::string_view part : parts)
+        bytes += part;
+    return bytes;
+}
 
 inline std::string number(std::uint64_t value, int size)
 {

@@ -46,9 +46,11 @@ TEST_CASE("a movie's header is found before and after the media data, in boxes o
     const std::string longMovie = longBox("moov", mvhd(600, 1500) + videoTrack(640, 480, 640, 480));
     const std::string lastMovie = lastBox("moov", mvhd(600, 1500) + videoTrack(640, 480, 640, 480));
     const std::string media = box("mdat", zeros(9000));
-    for (const std::string& bytes : { ftyp() + movie + media, ftyp() + media + movie, movie, media + movie,
-             ftyp() + longBox("mdat", zeros(9000)) + movie, ftyp() + media + longMovie, ftyp() + media + lastMovie,
-             ftyp() + movie + lastBox("mdat", zeros(9000)), ftyp() + box("wide", "") + media + movie }) {
+    const std::string longMedia = longBox("mdat", zeros(9000));
+    for (const std::string& bytes : { joined({ ftyp(), movie, media }), joined({ ftyp(), media, movie }), movie,
+             joined({ media, movie }), joined({ ftyp(), longMedia, movie }), joined({ ftyp(), media, longMovie }),
+             joined({ ftyp(), media, lastMovie }), joined({ ftyp(), movie, lastBox("mdat", zeros(9000)) }),
+             joined({ ftyp(), box("wide", ""), media, movie }) }) {
         const auto header = headerOf(bytes);
         REQUIRE(header);
         CHECK(header->resolution == size(640, 480));
@@ -169,6 +171,7 @@ TEST_CASE("a movie whose boxes lie about their sizes has no header")
     std::string huge = longBox("moov", mvhd(600, 1) + track);
     CHECK_FALSE(headerOf(huge.replace(8, 8, number(~std::uint64_t { 0 }, 8))));
     CHECK_FALSE(headerOf(huge.replace(8, 8, number(15, 8))));
+    CHECK_FALSE(headerOf(moov(number(4, 4) + mvhd(600, 1) + track)));
     CHECK_FALSE(headerOf(moov(box("mvhd", zeros(20)) + track)));
     CHECK_FALSE(headerOf(moov(mvhd(600, 1) + trak(box("tkhd", zeros(30)), "vide", stsd(640, 480)))));
     CHECK_FALSE(headerOf(moov(mvhd(600, 1) + videoTrack(640, 480, 640, 480, withSize(pasp(1, 1), 99)))));

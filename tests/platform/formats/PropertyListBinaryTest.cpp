@@ -80,7 +80,8 @@ TEST_CASE("the numbers of a binary property list have signs in eight bytes only"
     CHECK(valueOf("\x14" + number(0, 8) + number(~std::uint64_t { 0 }, 8)) == Value(18446744073709551615.0));
     CHECK(valueOf("\x14" + number(0, 8) + number(5, 8)) == Value(5));
     CHECK(valueOf("\x14" + number(~std::uint64_t { 0 }, 8) + number(~std::uint64_t { 0 }, 8)) == Value(-1));
-    CHECK(problemOf({ "\x14" + number(1, 8) + number(0, 8) }) == "byte 8: an integer is out of range or of an unknown size");
+    CHECK(problemOf({ "\x14" + number(1, 8) + number(0, 8) })
+        == "byte 8: an integer is out of range or of an unknown size");
     CHECK(problemOf({ "\x15" + std::string(32, '\0') }) == "byte 8: an integer is out of range or of an unknown size");
     CHECK(valueOf("\x22" + number(std::bit_cast<std::uint32_t>(1.5f), 4)) == Value(1.5));
     CHECK(valueOf(realBytes('\x23', -0.1)) == Value(-0.1));
@@ -92,8 +93,8 @@ TEST_CASE("the dates of a binary property list count from 2001")
     CHECK(valueOf(realBytes('\x33', 0)) == Value(Date { 978307200, 0 }));
     CHECK(valueOf(realBytes('\x33', 1.5)) == Value(Date { 978307201, 500000000 }));
     CHECK(valueOf(realBytes('\x33', -0.25)) == Value(Date { 978307199, 750000000 }));
-    CHECK(
-        problemOf({ realBytes('\x33', std::numeric_limits<double>::infinity()) }) == "byte 8: a date is out of range or of an unknown size");
+    CHECK(problemOf({ realBytes('\x33', std::numeric_limits<double>::infinity()) })
+        == "byte 8: a date is out of range or of an unknown size");
     CHECK(problemOf({ realBytes('\x33', std::numeric_limits<double>::quiet_NaN()) }) != "");
     CHECK(problemOf({ realBytes('\x33', 1e300) }) != "");
     CHECK(problemOf({ "\x32\x01\x02\x03\x04" }) != "");

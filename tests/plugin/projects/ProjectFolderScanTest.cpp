@@ -365,7 +365,7 @@ TEST_CASE("a folder is a project exactly when an item of the marker's name exist
 TEST_CASE("folders nested deeper than a path can be end in a tree, and the path that is too long is logged once")
 {
     SourceMachine machine;
-    constexpr int levels = 3000;
+    constexpr int levels = 2100;
     makeNestedFolders(machine.projects().path(), "d", levels);
     const auto source = machine.makeSource();
     machine.load(*source);

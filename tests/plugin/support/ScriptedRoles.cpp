@@ -94,13 +94,14 @@ platform::PreferencesAnswer ScriptedPreferences::valuesOfDomain(std::string_view
     return _real.valuesOfDomain(domain);
 }
 
-std::optional<platform::MovieHeader> ScriptedMovies::headerOfMovie(std::string_view path) const
+std::optional<platform::MovieHeader> ScriptedMovies::headerOfMovie(
+    std::string_view path, platform::PathKnowledge knowledge) const
 {
     pathsRead.add(std::string(path));
     if (whenRead)
         whenRead(path);
     const auto known = headers.find(platform::lastPathComponent(path));
-    return known == headers.end() ? _real.headerOfMovie(path) : known->second;
+    return known == headers.end() ? _real.headerOfMovie(path, knowledge) : known->second;
 }
 
 std::optional<platform::ImageResource> ScriptedBundles::imageResource(

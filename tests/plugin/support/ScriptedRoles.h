@@ -134,7 +134,8 @@ public:
     std::function<void(std::string_view path)> whenRead {};
     mutable Trace pathsRead {};
 
-    std::optional<platform::MovieHeader> headerOfMovie(std::string_view path) const override;
+    std::optional<platform::MovieHeader> headerOfMovie(
+        std::string_view path, platform::PathKnowledge known) const override;
 
 private:
     const platform::Movies& _real;

@@ -10,6 +10,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace platform {
@@ -75,16 +76,44 @@ struct ListingRequest {
     bool datesOfHolders = false;
     /// The folder's own facts.
     bool folderStatus = false;
+    /// For every item that holds the marker: the names and kinds of what is in the folder of this name inside it, where
+    /// that needs no link to be followed. Not asked when empty.
+    std::string_view subfolder {};
     LinkPolicy links = LinkPolicy::follow;
+};
+
+class FolderListing;
+struct FolderItem;
+
+/// The items of a folder inside an item of a listing, in the order in which the file system lists them: names and kinds.
+class SubfolderItems {
+public:
+    SubfolderItems(const FolderListing& listing, std::uint32_t first, std::uint32_t count)
+        : _listing(&listing)
+        , _first(first)
+        , _count(count)
+    {
+    }
+    std::size_t size() const noexcept { return _count; }
+    FolderItem operator[](std::size_t index) const;
+
+private:
+    friend class FolderListing;
+    const FolderListing* _listing;
+    std::uint32_t _first;
+    std::uint32_t _count;
 };
 
 /// One entry of a folder, as a listing answers it.
 struct FolderItem {
-    std::string_view name; ///< bytes as on disk; valid while the listing lives
+    std::string_view name {}; ///< bytes as on disk; valid while the listing lives
     ItemKind kind = ItemKind::other;
-    ItemFlags flags;
+    ItemFlags flags {};
     MarkerAnswer marker = MarkerAnswer::absent;
     std::optional<Date> modificationDate {}; ///< where the request asked for it and it could be read
+    /// Where the request asked for it and it could be told in the same pass; nothing in it when the folder is missing.
+    /// Absent, it has to be listed by itself.
+    std::optional<SubfolderItems> subfolder {};
 };
 
 /// The items of one folder in the order in which the file system lists them, without "." and "..".
@@ -117,6 +146,8 @@ public:
             entry.marker };
         if (entry.hasDate)
             item.modificationDate = Date { entry.seconds, entry.nanoseconds };
+        if (entry.hasSubfolder)
+            item.subfolder.emplace(*this, entry.subfolderFirst, entry.subfolderCount);
         return item;
     }
 
@@ -145,26 +176,41 @@ public:
     /// For whoever makes a listing.
     void append(const FolderItem& item);
     void setItem(std::size_t index, const FolderItem& item);
+    /// Adds an item of the subfolder of the item that is appended next.
+    void appendToSubfolder(std::string_view name, ItemKind kind);
+    /// What has been added to the subfolder of the item that is appended next.
+    SubfolderItems takeSubfolder();
     void setFolderStatus(const ItemStatus& status) { _folderStatus = status; }
     void setProblem(FileProblem problem) { _problem = problem; }
     void setPathIsReal(bool isReal) { _pathIsReal = isReal; }
 
 private:
+    friend class SubfolderItems;
+    struct SubfolderEntry {
+        std::uint32_t nameOffset = 0;
+        std::uint32_t nameLength = 0;
+        ItemKind kind = ItemKind::other;
+    };
     struct Entry {
         std::int64_t seconds = 0;
         std::uint32_t nanoseconds = 0;
         std::uint32_t nameOffset = 0;
         std::uint32_t nameLength = 0;
+        std::uint32_t subfolderFirst = 0;
+        std::uint32_t subfolderCount = 0;
         ItemKind kind = ItemKind::other;
         MarkerAnswer marker = MarkerAnswer::absent;
         ItemFlags flags;
         bool hasDate = false;
+        bool hasSubfolder = false;
 
         void take(const FolderItem& item);
     };
 
     std::string _names;
     std::vector<Entry> _entries;
+    std::vector<SubfolderEntry> _subfolderEntries;
+    std::size_t _subfolderStart = 0; // of the item that is appended next
     std::optional<ItemStatus> _folderStatus;
     FileProblem _problem = FileProblem::none;
     bool _pathIsReal = false;
@@ -241,6 +287,31 @@ inline void FolderListing::Entry::take(const FolderItem& item)
         seconds = item.modificationDate->seconds;
         nanoseconds = item.modificationDate->nanoseconds;
     }
+    hasSubfolder = item.subfolder.has_value();
+    subfolderFirst = hasSubfolder ? item.subfolder->_first : 0;
+    subfolderCount = hasSubfolder ? item.subfolder->_count : 0;
+}
+
+inline FolderItem SubfolderItems::operator[](std::size_t index) const
+{
+    const FolderListing::SubfolderEntry& entry = _listing->_subfolderEntries[_first + index];
+    FolderItem item;
+    item.name = std::string_view(_listing->_names).substr(entry.nameOffset, entry.nameLength);
+    item.kind = entry.kind;
+    return item;
+}
+
+inline void FolderListing::appendToSubfolder(std::string_view name, ItemKind kind)
+{
+    _subfolderEntries.push_back(
+        { static_cast<std::uint32_t>(_names.size()), static_cast<std::uint32_t>(name.size()), kind });
+    _names.append(name);
+}
+
+inline SubfolderItems FolderListing::takeSubfolder()
+{
+    const std::size_t first = std::exchange(_subfolderStart, _subfolderEntries.size());
+    return { *this, static_cast<std::uint32_t>(first), static_cast<std::uint32_t>(_subfolderStart - first) };
 }
 
 inline void FolderListing::append(const FolderItem& item)
@@ -250,11 +321,17 @@ inline void FolderListing::append(const FolderItem& item)
         _entries.reserve(8);
         _names.reserve(128);
     }
+    FolderItem added = item;
+    if (item.subfolder && item.subfolder->_listing != this) {
+        for (std::size_t index = 0; index < item.subfolder->size(); ++index)
+            appendToSubfolder((*item.subfolder)[index].name, (*item.subfolder)[index].kind);
+        added.subfolder = takeSubfolder();
+    }
     Entry& entry = _entries.emplace_back();
     entry.nameOffset = static_cast<std::uint32_t>(_names.size());
     entry.nameLength = static_cast<std::uint32_t>(item.name.size());
     _names.append(item.name);
-    entry.take(item);
+    entry.take(added);
 }
 
 inline void FolderListing::setItem(std::size_t index, const FolderItem& item)

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <atomic>
+#include <condition_variable>
 #include <mutex>
 #include <thread>
 
@@ -33,7 +34,30 @@ public:
     bool try_lock() TRY_ACQUIRE(true) { return _mutex.try_lock(); }
 
 private:
+    friend class Condition;
     std::mutex _mutex;
+};
+
+/// `std::condition_variable` for `Mutex`.
+class Condition {
+public:
+    void wait(Mutex& lock) REQUIRES(lock)
+    {
+        std::unique_lock held(lock._mutex, std::adopt_lock);
+        _condition.wait(held);
+        held.release();
+    }
+    template <class Instant> void waitUntil(Mutex& lock, const Instant& instant) REQUIRES(lock)
+    {
+        std::unique_lock held(lock._mutex, std::adopt_lock);
+        _condition.wait_until(held, instant);
+        held.release();
+    }
+    void notifyOne() { _condition.notify_one(); }
+    void notifyAll() { _condition.notify_all(); }
+
+private:
+    std::condition_variable _condition;
 };
 
 /// `std::recursive_mutex` that the compiler's analysis knows.

@@ -94,7 +94,7 @@ void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& r
             objects = objects.appending(child->mediaObjects());
             continue;
         }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, child->mediaObjects());
+        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
         if (chosen.movie)
             objects = objects.appending(makeRepresentative(*this, *child, chosen, projectFormatVersion));
     }

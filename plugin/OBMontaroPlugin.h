@@ -136,8 +136,8 @@ private:
     /// An absolute path for one that begins with "~"; absent while no home folder is known.
     platform::Text expandingTilde(std::string_view path) const;
     void dropAppIcon() NO_THREAD_SAFETY_ANALYSIS;
-    OBMediaGroupRef projectGroup(
-        const platform::Text& listedFolder, const platform::FolderItem& item, ProjectScan& scan);
+    OBMediaGroupRef projectGroup(const platform::Text& listedFolder, const platform::FolderListing& listing,
+        const platform::FolderItem& item, ProjectScan& scan);
 
     // In the order in which they are declared. The locks exist from `init` to `dealloc`.
 

@@ -47,11 +47,13 @@ bool areAllProduced(const OBMediaObjectList& movies)
 
 } // namespace
 
-ChosenMovie chooseRepresentativeMovie(OBMediaManager& manager, const OBMediaObjectList& movies)
+ChosenMovie chooseRepresentativeMovie(OBMediaManager& manager, const OBMediaGroup& project)
 {
+    const OBMediaObjectList movies = project.mediaObjects();
     // Thumbnails that are there already need no turn of the main thread.
     if (areAllProduced(movies))
         return walkMovies(manager, movies);
+    manager.notePathAtWork(project.path());
     ChosenMovie chosen;
     manager.performOnMainThreadAndWait([&] { chosen = walkMovies(manager, movies); });
     return chosen;

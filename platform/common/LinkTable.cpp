@@ -109,6 +109,13 @@ std::vector<std::string> LinkTable::namesInFolder(std::string_view folder) const
     return names;
 }
 
+bool LinkTable::hasNamedLinkBelow(std::string_view folder) const
+{
+    bool isThere = false;
+    forEachNamedLinkBelow(folder, [&isThere](std::string_view) { isThere = true; });
+    return isThere;
+}
+
 std::vector<std::string> LinkTable::namesOfHolders(std::string_view folder, std::string_view entry) const
 {
     std::vector<std::string> names;

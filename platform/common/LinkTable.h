@@ -42,6 +42,9 @@ public:
     /// The link at `path` or, failing that, the nearest above it. `path` is absolute, single slashes, none at its end.
     std::optional<AddedLink> linkAtOrAbove(std::string_view path) const;
 
+    /// Whether a link was named anywhere below `folder`.
+    bool hasNamedLinkBelow(std::string_view folder) const;
+
     /// The names of the links directly in `folder`, in no order.
     std::vector<std::string> namesInFolder(std::string_view folder) const;
 

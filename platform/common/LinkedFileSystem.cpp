@@ -140,6 +140,9 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
     LinkedPlace place = substitutedPlaceOf(folder, LastLink::followed);
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);
+    // What named links change inside the items is told by listing each by itself.
+    if (_table.hasNamedLinkBelow(folder) || _table.hasNamedLinkBelow(place.path))
+        stopping.subfolder = {};
     FolderListing listing = _real.itemsInFolder(place.path, stopping);
     bool isUnsettled = listing.problem() == FileProblem::linkOnTheWay;
     const bool pathIsReal = !isUnsettled && place.path == folder && isPlainlySpelled(folder);
@@ -161,7 +164,12 @@ FolderListing LinkedFileSystem::listingOfWalkedFolder(
     std::string_view folder, const ListingRequest& request, LinkedPlace& place) const
 {
     place = placeOf(folder, LastLink::followed);
-    return place.problem == FileProblem::none ? _real.itemsInFolder(place.path, request) : FolderListing(place.problem);
+    if (place.problem != FileProblem::none)
+        return FolderListing(place.problem);
+    ListingRequest there = request;
+    if (_table.hasNamedLinkBelow(place.path))
+        there.subfolder = {};
+    return _real.itemsInFolder(place.path, there);
 }
 
 /// The listing of `folder` for a caller who wants no link followed.
@@ -214,6 +222,7 @@ void LinkedFileSystem::lookInside(FolderItem& item, const std::string& path, con
 {
     item.marker = exists(pathJoined(path, request.marker)) ? MarkerAnswer::present : MarkerAnswer::absent;
     item.modificationDate.reset();
+    item.subfolder.reset();
     if (item.marker == MarkerAnswer::absent || !request.datesOfHolders)
         return;
     if (const std::optional<ItemStatus> holder = status(path))

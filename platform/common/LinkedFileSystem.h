@@ -31,8 +31,7 @@ public:
     std::optional<std::string> linkTarget(std::string_view path) const override;
     ItemFlags itemFlags(std::string_view path) const override;
     std::string resolvedPath(std::string_view path) const override;
-    OpenResult openPlainFile(
-        std::string_view path, PathKnowledge known = PathKnowledge::none) const override;
+    OpenResult openPlainFile(std::string_view path, PathKnowledge known = PathKnowledge::none) const override;
     const FileSystem& withoutAddedLinks() const override { return _real.withoutAddedLinks(); }
 
 private:

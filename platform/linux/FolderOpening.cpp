@@ -40,9 +40,9 @@ namespace {
     }
 
     // Absent when this kernel or its sandbox does not know the call.
-    std::optional<OpenedFolder> openFolderWithoutLinks(const char* path)
+    std::optional<OpenedFolder> openFolderWithoutLinks(int parent, const char* path)
     {
-        const int number = openWithoutLinks(path, listingFlags);
+        const int number = openWithoutLinks(parent, path, listingFlags);
         if (number == -1 && (errno == ENOSYS || errno == EPERM))
             return std::nullopt;
         OpenedFolder folder = opened(number);
@@ -70,9 +70,17 @@ OpenedFolder openFolder(std::string_view path, LinkPolicy links)
         return failed(systemPath.problem());
     if (links == LinkPolicy::follow)
         return openFollowing(AT_FDCWD, systemPath.bytes(), listingFlags);
-    if (auto folder = openFolderWithoutLinks(systemPath.bytes()))
+    if (auto folder = openFolderWithoutLinks(AT_FDCWD, systemPath.bytes()))
         return std::move(*folder);
     return openFolderStepByStep(path);
+}
+
+OpenedFolder openFolderIn(int parent, const char* path, LinkPolicy links)
+{
+    if (links == LinkPolicy::follow)
+        return openFollowing(parent, path, listingFlags);
+    auto folder = openFolderWithoutLinks(parent, path);
+    return folder ? std::move(*folder) : failed(FileProblem::linkOnTheWay);
 }
 
 OpenedFolder openFolderStepByStep(std::string_view path)

@@ -1,6 +1,7 @@
 #include "platform/linux/FolderReading.h"
 
 #include "platform/linux/Descriptor.h"
+#include "platform/linux/FolderOpening.h"
 #include "platform/linux/HiddenNames.h"
 #include "platform/linux/ItemReading.h"
 
@@ -29,8 +30,10 @@ namespace {
     private:
         void takeBlock(const char* block, std::size_t length);
         void take(const dirent64& entry);
-        ItemKind kindOfItem(const dirent64& entry) const;
+        static ItemKind kindOfItem(int folder, const dirent64& entry);
         MarkerAnswer markerInside(const char* name, ItemKind kind);
+        std::optional<SubfolderItems> itemsOfSubfolder(const char* holder);
+        bool readSubfolder(int folder);
         void hideNamed();
 
         int _folder;
@@ -79,7 +82,7 @@ namespace {
             return;
         FolderItem item;
         item.name = name;
-        item.kind = kindOfItem(entry);
+        item.kind = kindOfItem(_folder, entry);
         item.flags = flagsOfItem(name, item.kind);
         if (_asksForMarker)
             item.marker = markerInside(entry.d_name, item.kind);
@@ -87,11 +90,13 @@ namespace {
             if (const auto status = readItemStatus(_folder, entry.d_name, 0))
                 item.modificationDate = status->modificationDate;
         }
+        if (!_request.subfolder.empty() && item.marker == MarkerAnswer::present)
+            item.subfolder = itemsOfSubfolder(entry.d_name);
         _sawHiddenNames = _sawHiddenNames || name == HiddenNames::fileName;
         _listing.append(item);
     }
 
-    ItemKind FolderReader::kindOfItem(const dirent64& entry) const
+    ItemKind FolderReader::kindOfItem(int folder, const dirent64& entry)
     {
         switch (entry.d_type) {
         case DT_REG:
@@ -101,7 +106,7 @@ namespace {
         case DT_LNK:
             return ItemKind::symbolicLink;
         case DT_UNKNOWN: {
-            const auto status = readItemStatus(_folder, entry.d_name, AT_SYMLINK_NOFOLLOW);
+            const auto status = readItemStatus(folder, entry.d_name, AT_SYMLINK_NOFOLLOW);
             return status ? status->kind : ItemKind::other;
         }
         default:
@@ -124,6 +129,34 @@ namespace {
         if (uninterrupted(ask) == -1)
             return MarkerAnswer::absent;
         return S_ISLNK(facts.st_mode) ? MarkerAnswer::link : MarkerAnswer::present;
+    }
+
+    // Absent when a link is in the way or the folder cannot be read: whoever asks for it alone is told why.
+    std::optional<SubfolderItems> FolderReader::itemsOfSubfolder(const char* holder)
+    {
+        _markerPath.assign(holder).append(1, '/').append(_request.subfolder);
+        const OpenedFolder subfolder = openFolderIn(_folder, _markerPath.c_str(), _request.links);
+        const bool isNone = subfolder.problem == FileProblem::missing || subfolder.problem == FileProblem::notAFolder;
+        const bool isRead = subfolder.descriptor.isOpen() && readSubfolder(subfolder.descriptor.number());
+        const SubfolderItems items = _listing.takeSubfolder();
+        return isNone || isRead ? std::optional(items) : std::nullopt;
+    }
+
+    bool FolderReader::readSubfolder(int folder)
+    {
+        alignas(dirent64) char block[32 * 1024];
+        for (;;) {
+            const ssize_t length = uninterrupted([&] { return getdents64(folder, block, sizeof(block)); });
+            if (length <= 0)
+                return length == 0;
+            for (ssize_t offset = 0; offset < length;) {
+                const auto* entry = reinterpret_cast<const dirent64*>(block + offset);
+                const std::string_view name = entry->d_name;
+                if (name != "." && name != "..")
+                    _listing.appendToSubfolder(name, kindOfItem(folder, *entry));
+                offset += entry->d_reclen;
+            }
+        }
     }
 
     // Looks up each line among the items, not each item among the lines: the folder bounds the memory, not the file.

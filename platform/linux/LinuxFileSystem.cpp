@@ -12,6 +12,7 @@
 #include "platform/linux/SeenPlainFile.h"
 #include "platform/linux/SystemPath.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <vector>
@@ -62,7 +63,10 @@ namespace {
         ItemStatus status() const override { return _file.status; }
         std::size_t read(std::uint64_t offset, std::span<std::byte> buffer) const override
         {
-            return readFully(_file.descriptor.number(), offset, buffer);
+            // Asked for no more than there is, the system need not be asked again where the file ends.
+            const std::uint64_t rest = _file.status.size - std::min(offset, _file.status.size);
+            const std::size_t length = static_cast<std::size_t>(std::min<std::uint64_t>(rest, buffer.size()));
+            return readFully(_file.descriptor.number(), offset, buffer.first(length));
         }
 
     private:

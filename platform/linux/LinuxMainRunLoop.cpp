@@ -3,6 +3,10 @@
 #include <algorithm>
 #include <atomic>
 
+#include <linux/futex.h>
+#include <sys/syscall.h>
+#include <unistd.h>
+
 namespace platform {
 
 namespace {
@@ -21,17 +25,19 @@ namespace {
 
 } // namespace
 
-/// A thread that waits for its call. Shared, so that whoever wakes it may still hold it when it has gone on.
+/// A thread that waits for its call. Shared, so that whoever wakes it may still hold it when it has gone on. Waits by
+/// futex(2) itself: what the language offers first spins, while this wait lasts as long as reading a movie.
 class LinuxMainRunLoop::Waiter {
 public:
     void wake(bool hasRun)
     {
         _state.store(hasRun ? ran : dropped, std::memory_order_release);
-        _state.notify_one();
+        syscall(SYS_futex, &_state, FUTEX_WAKE_PRIVATE, 1, nullptr, nullptr, 0);
     }
-    bool wait() const
+    bool wait()
     {
-        _state.wait(waiting, std::memory_order_acquire);
+        while (_state.load(std::memory_order_acquire) == waiting)
+            syscall(SYS_futex, &_state, FUTEX_WAIT_PRIVATE, waiting, nullptr, nullptr, 0);
         return _state.load(std::memory_order_acquire) == ran;
     }
 
@@ -40,6 +46,7 @@ private:
     static constexpr int ran = 1;
     static constexpr int dropped = 2;
     std::atomic<int> _state { waiting };
+    static_assert(sizeof(_state) == sizeof(int), "a futex is the int itself");
 };
 
 void LinuxMainRunLoop::run()
@@ -79,7 +86,7 @@ void LinuxMainRunLoop::endModal()
         = std::find_if(_modalEnds.rbegin(), _modalEnds.rend(), [](const bool* isOver) { return !*isOver; });
     if (innermost != _modalEnds.rend())
         **innermost = true;
-    _changed.notify_all();
+    _changed.notifyAll();
 }
 
 void LinuxMainRunLoop::quit()
@@ -91,7 +98,7 @@ void LinuxMainRunLoop::quit()
         _isQuit = true;
         calls.swap(_calls);
         delayed.swap(_delayed);
-        _changed.notify_all();
+        _changed.notifyAll();
     }
     // What the dropped calls held is released outside of the lock, for that may call anything.
     for (const Call& call : calls) {
@@ -134,18 +141,22 @@ void LinuxMainRunLoop::performAfterDelay(std::chrono::nanoseconds delay, RunLoop
         return;
     _delayed.emplace(instantAfter(delay), std::move(delayedCall));
     if (_isWaiting)
-        _changed.notify_one();
+        _changed.notifyOne();
 }
 
 // Whether the loop will still come to it.
 bool LinuxMainRunLoop::enqueue(Call call)
 {
-    Locked guard(_lock);
-    if (_isQuit)
-        return false;
-    _calls.push_back(std::move(call));
-    if (_isWaiting)
-        _changed.notify_one();
+    bool isAwaited = false;
+    {
+        Locked guard(_lock);
+        if (_isQuit)
+            return false;
+        _calls.push_back(std::move(call));
+        isAwaited = _isWaiting;
+    }
+    if (isAwaited)
+        _changed.notifyOne(); // with the lock free, or the main thread would wake only to wait for it
     return true;
 }
 
@@ -202,7 +213,7 @@ void LinuxMainRunLoop::wait(RunLoopModes mode)
     } else {
         // A copy: the call may be dropped while nobody holds the lock.
         const Instant due = delayed->first;
-        _changed.wait_until(_lock, due);
+        _changed.waitUntil(_lock, due);
     }
     _isWaiting = false;
 }

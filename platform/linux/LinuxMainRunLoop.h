@@ -3,7 +3,6 @@
 #include "platform/MainRunLoop.h"
 #include "platform/ThreadSafety.h"
 
-#include <condition_variable>
 #include <deque>
 #include <map>
 #include <memory>
@@ -50,7 +49,7 @@ private:
     void wait(RunLoopModes mode) REQUIRES(_lock);
 
     mutable Mutex _lock;
-    std::condition_variable_any _changed; ///< something that the main thread waits for
+    Condition _changed; ///< something that the main thread waits for
     std::deque<Call> _calls GUARDED_BY(_lock);
     Delayed _delayed GUARDED_BY(_lock);
     std::vector<bool*> _modalEnds GUARDED_BY(

@@ -9,12 +9,12 @@
 
 namespace platform {
 
-int openWithoutLinks(const char* path, int flags)
+int openWithoutLinks(int parent, const char* path, int flags)
 {
     open_how how {};
     how.flags = static_cast<unsigned>(flags);
     how.resolve = RESOLVE_NO_SYMLINKS;
-    const auto open = [&] { return syscall(SYS_openat2, AT_FDCWD, path, &how, sizeof(how)); };
+    const auto open = [&] { return syscall(SYS_openat2, parent, path, &how, sizeof(how)); };
     return static_cast<int>(uninterrupted(open));
 }
 

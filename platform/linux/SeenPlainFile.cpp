@@ -10,7 +10,7 @@ namespace platform {
 OpenedFile openSeenPlainFile(const char* path)
 {
     OpenedFile file;
-    file.descriptor = Descriptor(openWithoutLinks(path, O_RDONLY | O_CLOEXEC | O_NOCTTY | O_NONBLOCK));
+    file.descriptor = Descriptor(openWithoutLinks(AT_FDCWD, path, O_RDONLY | O_CLOEXEC | O_NOCTTY | O_NONBLOCK));
     if (file.descriptor.isOpen()) {
         const auto status = readItemStatus(file.descriptor.number(), "", AT_EMPTY_PATH);
         if (status && status->kind == ItemKind::file) {

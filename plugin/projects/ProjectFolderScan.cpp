@@ -23,8 +23,9 @@ namespace {
 
 constexpr std::string_view localizedExtension = "localized";
 
-/// Names and flags of the entries, and of each whether it is a project and since when.
-constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPathComponent, true, true };
+/// Names and flags of the entries, and of each whether it is a project, since when, and what was shared from it.
+constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPathComponent, true, true,
+    sharedItemsFolder };
 
 /// What all movies of all projects share.
 std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin)
@@ -118,7 +119,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
             || !scan.report.passes(ScanRules::isVisible, item, listed))
             continue;
         if (item.marker == platform::MarkerAnswer::present) {
-            folder->addChildGroup(projectGroup(listed, item, scan));
+            folder->addChildGroup(projectGroup(listed, listing, item, scan));
         } else if (scan.report.passes(ScanRules::isContainer, item, listed)
             && scan.report.passes(ScanRules::isNotPackage, item, listed)) {
             const OBMediaGroupRef subfolder
@@ -142,7 +143,8 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 }
 
 /// One project of `listedFolder`. It shows in the flat list before its movies are known.
-OBMediaGroupRef OBMontaroPlugin::projectGroup(const Text& listedFolder, const FolderItem& item, ProjectScan& scan)
+OBMediaGroupRef OBMontaroPlugin::projectGroup(
+    const Text& listedFolder, const FolderListing& listing, const FolderItem& item, ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
     const OBMediaGroupRef project = groupForFolder(OBMontaroProjectGroupTypeIdentifier,
@@ -150,9 +152,9 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(const Text& listedFolder, const Fo
     project->setModificationDate(item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
     scan.addToFlatGroups(project);
 
-    const SharedMovies movies = sharedMoviesOfProject(*this, scan.report, path);
-    project->setMediaObjects(
-        OBMediaObjectBatch::objects(scan.movieKind, { movies.folder, movies.listing.pathIsReal() }, movies.files));
+    const SharedMovies movies = item.subfolder ? sharedMoviesOfListedProject(scan.report, path, listing, item)
+                                               : sharedMoviesOfProject(*this, scan.report, path);
+    project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.folder, movies.files));
     project->setIcon(movies.files.empty() ? scan.emptyProjectIcon : scan.projectIcon);
     noteItemsFound(movies.files.size());
     return project;

@@ -17,7 +17,6 @@ using platform::Value;
 
 namespace {
 
-constexpr std::string_view sharedItemsFolder = "/Shared Items";
 constexpr const char* projectsPasteboardType = "OBMontaroProjectsPboardType";
 
 } // namespace
@@ -28,15 +27,26 @@ Value OBMontaroPlugin::supportedPasteboardTypes()
     return Value::List { types };
 }
 
+SharedMovies::SharedMovies(const Text& project)
+    : folder { Text::joined(project, "/", sharedItemsFolder) }
+{
+}
+
 SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& report, const Text& project)
 {
-    SharedMovies movies { Text::joined(project, sharedItemsFolder), {}, {} };
-    movies.listing = manager.listFolder(movies.folder, {});
-    movies.files.reserve(movies.listing.size());
-    for (const platform::FolderItem item : movies.listing) {
-        if (report.passes(ScanRules::hasMovieExtension, item, movies.folder))
-            movies.files.push_back({ item.name, item.kind == platform::ItemKind::file });
-    }
+    SharedMovies movies(project);
+    movies.listing = manager.listFolder(movies.folder.path, {});
+    movies.folder.pathIsReal = movies.listing.pathIsReal();
+    movies.take(report, movies.listing);
+    return movies;
+}
+
+SharedMovies sharedMoviesOfListedProject(const ScanReport& report, const Text& project,
+    const platform::FolderListing& library, const platform::FolderItem& item)
+{
+    SharedMovies movies(project);
+    movies.folder.pathIsReal = library.pathIsReal() && item.kind == platform::ItemKind::folder;
+    movies.take(report, *item.subfolder);
     return movies;
 }
 
@@ -45,7 +55,7 @@ std::vector<std::string> OBMontaroPlugin::_renderedMoviesPathsForProjectPath(con
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     std::vector<std::string> paths;
     for (const OBFileOfFolder& file : movies.files)
-        paths.push_back(platform::pathJoined(movies.folder, file.name));
+        paths.push_back(platform::pathJoined(movies.folder.path, file.name));
     return paths;
 }
 
@@ -54,7 +64,7 @@ std::optional<std::string> OBMontaroPlugin::_previewFileForProjectPath(const Tex
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     if (movies.files.empty())
         return std::nullopt;
-    return platform::pathJoined(movies.folder, movies.files.front().name);
+    return platform::pathJoined(movies.folder.path, movies.files.front().name);
 }
 
 void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder)
@@ -75,7 +85,7 @@ void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGrou
             folder->setMediaObjects(folder->ownMediaObjects().appending(below.prefix(taken)));
             continue;
         }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, child->mediaObjects());
+        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
         if (chosen.movie) {
             folder->setMediaObjects(folder->ownMediaObjects().appending(makeRepresentative(*this, *child, chosen, {})));
         }

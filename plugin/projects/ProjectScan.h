@@ -8,6 +8,7 @@
 #include "platform/FileSystem.h"
 
 #include <memory>
+#include <string_view>
 #include <vector>
 
 /// What one scan of the project libraries carries through its folders.
@@ -24,12 +25,31 @@ struct ProjectScan {
     }
 };
 
-/// The listing of a project's folder of shared movies, and which of its items are movies.
+/// The folder in a project in which its shared movies lie.
+inline constexpr std::string_view sharedItemsFolder = "Shared Items";
+
+/// What is in a project's folder of shared movies that is a movie, in listing order.
 struct SharedMovies {
-    platform::Text folder;
-    platform::FolderListing listing;
-    std::vector<OBFileOfFolder> files; ///< names belong to the listing
+    explicit SharedMovies(const platform::Text& project);
+
+    OBFolderOfFiles folder;
+    platform::FolderListing listing {}; ///< where the folder was listed by itself
+    std::vector<OBFileOfFolder> files {}; ///< names belong to the listing that they were taken from
+
+    template <class Items> void take(const ScanReport& report, const Items& items)
+    {
+        files.reserve(items.size());
+        for (std::size_t index = 0; index < items.size(); ++index) {
+            const platform::FolderItem item = items[index];
+            if (report.passes(ScanRules::hasMovieExtension, item, folder.path))
+                files.push_back({ item.name, item.kind == platform::ItemKind::file });
+        }
+    }
 };
 
-/// The movies that were shared from `project`, in listing order; none when the folder is missing.
+/// The movies that were shared from `project`; none when the folder is missing.
 SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& report, const platform::Text& project);
+
+/// The same for a project whose listing, that of its item in `library`, told them already.
+SharedMovies sharedMoviesOfListedProject(const ScanReport& report, const platform::Text& project,
+    const platform::FolderListing& library, const platform::FolderItem& item);

@@ -20,7 +20,10 @@ platform::FolderListing FaultyFileSystem::itemsInFolder(
 {
     tell(folder);
     const FileProblem problem = whenListing ? whenListing(folder) : FileProblem::none;
-    return problem == FileProblem::none ? _real.itemsInFolder(folder, request) : platform::FolderListing(problem);
+    // Each folder is asked for by itself, so that each can fail.
+    platform::ListingRequest alone = request;
+    alone.subfolder = {};
+    return problem == FileProblem::none ? _real.itemsInFolder(folder, alone) : platform::FolderListing(problem);
 }
 
 std::optional<platform::ItemStatus> FaultyFileSystem::status(std::string_view path) const

@@ -13,7 +13,8 @@
 // Makes a large library to measure on: COUNT projects with three movies each, a hundred projects a folder and ten such
 // folders on a shelf. The same COUNT gives the same names and bytes everywhere, so figures can be compared.
 //
-// FOLDER/machine.json describes the machine; FOLDER/home serves as HOME just as well, its desktop entry names the editor.
+// FOLDER/machine.json describes the machine; FOLDER/home serves as HOME just as well, its desktop entry names the
+// editor.
 
 namespace {
 

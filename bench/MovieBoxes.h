@@ -21,7 +21,8 @@ struct MovieFacts {
 };
 
 /// Reads the movie that is open at `descriptor` with as few calls as its layout allows, and of it only the boxes that
-/// tell size and duration. `buffer` is where it reads to: one page is enough for a movie whose header lies at the front.
+/// tell size and duration. `buffer` is where it reads to: one page is enough for a movie whose header lies at the
+/// front.
 ///
 /// For movies that smallMovie made, or like ones: it trusts what it reads no further than the buffer goes.
 MovieFacts readMovieFacts(int descriptor, std::span<char> buffer);

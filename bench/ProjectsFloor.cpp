@@ -135,7 +135,8 @@ bool isMovieName(std::string_view name)
         && (extension == "mov" || extension == "m4v" || extension == "mp4" || extension == "3gp");
 }
 
-/// Calls `each` with the name and kind of every entry of the open folder; "." and ".." are told apart by their full stop.
+/// Calls `each` with the name and kind of every entry of the open folder; "." and ".." are told apart by their full
+/// stop.
 template <typename Each> void listFolder(int folder, char* buffer, const Each& each)
 {
     while (true) {

@@ -1,8 +1,8 @@
 // Loads of one manager: who asked, which load answers whom, and who is told.
 //
 // The one surprise: `loadData` is an operation that plug-ins override and that must end up in the base class, which is
-// where the load runs. So the load thread calls `loadData`, and the base operation knows by a mark of the thread that it is
-// being called from there.
+// where the load runs. So the load thread calls `loadData`, and the base operation knows by a mark of the thread that
+// it is being called from there.
 
 #include "host/ManagerState.h"
 
@@ -52,7 +52,7 @@ OBLoadProgress ManagerState::Progress::now() const
     return { isLoading, foldersDone, foldersKnown, itemsFound, itemsSkipped, path, since };
 }
 
-void ManagerState::requestTree(OBExecutor executor, std::function<void(OBLoadResult)> completion)
+void ManagerState::requestTree(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
 {
     OBLoadResult ready { OBLoadOutcome::loaded, root.load() };
     bool start = false;
@@ -203,7 +203,8 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
         std::lock_guard guard(_lock);
         if (std::exchange(_loadActive, false))
             gate.end();
-        // Asked again, a load that gave no whole tree starts over; by itself it does not, or a cancel would never be one.
+        // Asked again, a load that gave no whole tree starts over; by itself it does not, or a cancel would never be
+        // one.
         _needsReload = _needsReload || outcome != OBLoadOutcome::loaded;
         const auto later = std::stable_partition(
             _waiters.begin(), _waiters.end(), [this](const Waiter& waiter) { return waiter.load <= _loadNumber; });
@@ -249,11 +250,12 @@ void ManagerState::performLoad()
 {
     // A source that asks for a load while it loads gets one afterwards.
     loadingOnThisThread = nullptr;
-    if (OBMediaGroupRef group = _manager.performLoadData())
-        _manager.setRootMediaGroup(std::move(group));
+    if (const OBMediaGroupRef group = _manager.performLoadData())
+        _manager.setRootMediaGroup(group);
 }
 
-/// Nothing here waits: what is at work sees the cancel, what sleeps wakes, and each keeps the manager alive until it returns.
+/// Nothing here waits: what is at work sees the cancel, what sleeps wakes, and each keeps the manager alive until it
+/// returns.
 void ManagerState::end()
 {
     std::vector<Waiter> waiting;

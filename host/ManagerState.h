@@ -22,11 +22,11 @@ struct ManagerObserver {
     std::atomic<bool> takenBack { false };
 };
 
-/// What the base class keeps for one manager: the installed tree, the loads that were asked for, who listens, and what is
-/// at work.
+/// What the base class keeps for one manager: the installed tree, the loads that were asked for, who listens, and what
+/// is at work.
 ///
-/// Loads run one at a time on a thread that lives while there are loads to run. A request joins the load at work unless that
-/// is being cancelled or is out of date already; then it gets the next one.
+/// Loads run one at a time on a thread that lives while there are loads to run. A request joins the load at work unless
+/// that is being cancelled or is out of date already; then it gets the next one.
 struct ManagerState {
     ManagerState(OBMediaManager& manager, const OBManagerContext& context);
 
@@ -60,7 +60,7 @@ struct ManagerState {
     };
 
     // Loading. Each of these takes the lock itself and calls nothing out while it holds it.
-    void requestTree(OBExecutor executor, std::function<void(OBLoadResult)> completion);
+    void requestTree(const OBExecutor& executor, std::function<void(OBLoadResult)> completion);
     void requestLoad(Job job);
     void setNeedsReload(bool needed);
     void setAutoReload(bool enabled);

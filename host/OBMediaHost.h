@@ -17,8 +17,8 @@ class PluginLibrary;
 
 /// How an application wants its host.
 struct OBHostOptions {
-    /// Folders that are searched for bundles, in order, before the installed ones. Of two bundles with one identifier the
-    /// first found is used.
+    /// Folders that are searched for bundles, in order, before the installed ones. Of two bundles with one identifier
+    /// the first found is used.
     std::vector<std::string> pluginFolders {};
     OBLogSink logSink {};
 };
@@ -40,8 +40,8 @@ struct OBManagerResult {
 
 /// An application's host: finds plug-ins and makes their managers. One at a time in a process.
 ///
-/// The manager that it hands out ends when the application has dropped the last reference to it. The host may be destroyed
-/// while threads of its managers still run; the platform has to outlive them.
+/// The manager that it hands out ends when the application has dropped the last reference to it. The host may be
+/// destroyed while threads of its managers still run; the platform has to outlive them.
 class OB_EXPORT OBMediaHost {
 public:
     OBMediaHost(const platform::Platform& platform, OBHostOptions options);

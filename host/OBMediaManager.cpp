@@ -114,7 +114,7 @@ OBMediaGroupRef OBMediaManager::rootMediaGroup() const
     return _state->root.load();
 }
 
-void OBMediaManager::setRootMediaGroup(OBMediaGroupRef group)
+void OBMediaManager::setRootMediaGroup(const OBMediaGroupRef& group)
 {
     _state->publishRoot(group);
 }
@@ -243,9 +243,10 @@ void OBMediaManager::observeNotification(
     _state->addNotification(center, center.addObserver(name, nullptr, call));
 }
 
-void OBMediaManager::requestRootMediaGroup(OBExecutor executor, std::function<void(OBLoadResult)> completion)
+void OBMediaManager::requestRootMediaGroup(
+    const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
 {
-    _state->requestTree(std::move(executor), std::move(completion));
+    _state->requestTree(executor, std::move(completion));
 }
 
 void OBMediaManager::cancelLoad()

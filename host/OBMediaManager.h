@@ -61,10 +61,10 @@ private:
 
 /// One source of media: the base class of every source plug-in, and what an application drives it by.
 ///
-/// Contents: what a plug-in overrides (identity, loading, messages); the services it calls on itself; what an application
-/// calls. The framework makes a manager through its plug-in's class, calls `init`, and hands it out; when the application
-/// has dropped its last reference the manager ends: registrations are taken back, sleeps end, a cancel is pending, and
-/// `dealloc` runs when the last call in flight has returned. Nobody waits for that.
+/// Contents: what a plug-in overrides (identity, loading, messages); the services it calls on itself; what an
+/// application calls. The framework makes a manager through its plug-in's class, calls `init`, and hands it out; when
+/// the application has dropped its last reference the manager ends: registrations are taken back, sleeps end, a cancel
+/// is pending, and `dealloc` runs when the last call in flight has returned. Nobody waits for that.
 class OB_EXPORT OBMediaManager : public OBPathWatcherObserver, public std::enable_shared_from_this<OBMediaManager> {
 public:
     explicit OBMediaManager(const OBManagerContext& context);
@@ -113,7 +113,7 @@ public:
     /// The installed tree, at once; null before the first load.
     OBMediaGroupRef rootMediaGroup() const;
     /// Publishes a tree, new or changed in place.
-    void setRootMediaGroup(OBMediaGroupRef group);
+    void setRootMediaGroup(const OBMediaGroupRef& group);
     /// Whether whoever scans is to stop.
     bool isCancelLoadRequestPending() const noexcept;
     /// True until the first `loadData` has returned.
@@ -153,7 +153,7 @@ public:
     // What an application calls. Any thread.
 
     /// Delivers the tree through `executor`, after a load if one is needed. Answers at once.
-    void requestRootMediaGroup(OBExecutor executor, std::function<void(OBLoadResult)> completion);
+    void requestRootMediaGroup(const OBExecutor& executor, std::function<void(OBLoadResult)> completion);
     /// Asks the loads and reloads at work to stop; void when none is at work.
     void cancelLoad();
     /// Calls back through `executor` until the observation is dropped. Where automatic reloads are enabled, whoever

@@ -11,7 +11,8 @@ class OBMediaManager;
 
 /// The class operations of a plug-in's manager, which the framework calls without an instance, and its factory.
 ///
-/// A plug-in's library holds one, for as long as the process lives, and hands it out through its C entry point. Any thread.
+/// A plug-in's library holds one, for as long as the process lives, and hands it out through its C entry point. Any
+/// thread.
 class OB_EXPORT OBMediaManagerClass {
 public:
     virtual ~OBMediaManagerClass();
@@ -24,7 +25,8 @@ public:
     virtual std::unique_ptr<OBMediaManager> alloc(const OBManagerContext& context) const = 0;
 };
 
-/// The C function by which a plug-in's library hands out its class; it may answer null when it does not want to be loaded.
+/// The C function by which a plug-in's library hands out its class; it may answer null when it does not want to be
+/// loaded.
 using OBPluginEntryPoint = const OBMediaManagerClass* (*)();
 
 /// The name of that function.

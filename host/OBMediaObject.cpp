@@ -32,8 +32,8 @@ struct OBMediaObject::OwnFields {
     Value::Dictionary attributes;
 };
 
-/// What a movie's header told, and the picture that stands for the movie. Refers to the folder's block instead of keeping
-/// a path of its own; never to the object, which owns it.
+/// What a movie's header told, and the picture that stands for the movie. Refers to the folder's block instead of
+/// keeping a path of its own; never to the object, which owns it.
 class OBMediaObject::MovieThumbnail final : public OBImage {
 public:
     MovieThumbnail(const platform::MovieHeader& header, std::shared_ptr<const OBMediaFolder> folder, Text path,

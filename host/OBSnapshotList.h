@@ -7,8 +7,9 @@
 #include <utility>
 #include <vector>
 
-/// An immutable list that is cheap to copy and cheap to extend: `appending` answers a longer list and leaves this one as
-/// it is, sharing its storage where that has room, so that building a list of n elements takes time in proportion to n.
+/// An immutable list that is cheap to copy and cheap to extend: `appending` answers a longer list and leaves this one
+/// as it is, sharing its storage where that has room, so that building a list of n elements takes time in proportion to
+/// n.
 ///
 /// A list may be read on any thread while another thread makes a longer one from it.
 template <class T> class OBSnapshotList {
@@ -64,8 +65,8 @@ private:
             , elements(std::move(initial))
         {
         }
-        /// Whether the caller may write the element at `count`: only the longest list may, once, and only into room that
-        /// is there, since readers of shorter lists hold on to the addresses.
+        /// Whether the caller may write the element at `count`: only the longest list may, once, and only into room
+        /// that is there, since readers of shorter lists hold on to the addresses.
         bool claim(std::size_t count)
         {
             return count < elements.capacity() && used.compare_exchange_strong(count, count + 1);

@@ -7,11 +7,12 @@
 
 /// Counts the loads and reloads of one manager that are at work, and carries the request to cancel them.
 ///
-/// A request stands until everything that was at work when it came has ended; work that wants to begin meanwhile waits for
-/// that, so a request reaches what it was meant for and nothing later. Any thread.
+/// A request stands until everything that was at work when it came has ended; work that wants to begin meanwhile waits
+/// for that, so a request reaches what it was meant for and nothing later. Any thread.
 class WorkGate {
 public:
-    /// Begins a piece of work, after a pending cancel has ended. False once the gate is closed: the work must not begin.
+    /// Begins a piece of work, after a pending cancel has ended. False once the gate is closed: the work must not
+    /// begin.
     bool begin()
     {
         std::unique_lock guard(_lock);

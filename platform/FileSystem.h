@@ -85,7 +85,8 @@ struct ListingRequest {
 class FolderListing;
 struct FolderItem;
 
-/// The items of a folder inside an item of a listing, in the order in which the file system lists them: names and kinds.
+/// The items of a folder inside an item of a listing, in the order in which the file system lists them: names and
+/// kinds.
 class SubfolderItems {
 public:
     SubfolderItems(const FolderListing& listing, std::uint32_t first, std::uint32_t count)
@@ -127,11 +128,11 @@ public:
     {
     }
 
-    /// Why there are no items, or `none`. A folder that was read and is empty has no problem; one of which the disk gave
-    /// only a part answers that part, and `readError`.
+    /// Why there are no items, or `none`. A folder that was read and is empty has no problem; one of which the disk
+    /// gave only a part answers that part, and `readError`.
     FileProblem problem() const noexcept { return _problem; }
-    /// The folder's own facts, links followed, taken while it was listed; absent when it could not be listed, and when the
-    /// request did not ask for them.
+    /// The folder's own facts, links followed, taken while it was listed; absent when it could not be listed, and when
+    /// the request did not ask for them.
     const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
 
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
@@ -264,7 +265,8 @@ public:
     virtual ItemFlags itemFlags(std::string_view path) const = 0;
 
     /// The real path: every symbolic link on the way resolved. A link that leads nowhere gives the place it names; a
-    /// link in circles gives the real path of its folder, and its name. Never empty; what does not exist stays as written.
+    /// link in circles gives the real path of its folder, and its name. Never empty; what does not exist stays as
+    /// written.
     virtual std::string resolvedPath(std::string_view path) const = 0;
 
     /// Opens the plain file at `path` for reading, links followed. Never opens a pipe, device or socket.

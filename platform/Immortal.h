@@ -4,7 +4,8 @@
 
 namespace platform {
 
-/// A value with static storage that is never destroyed: threads that the end of the process does not join may still use it.
+/// A value with static storage that is never destroyed: threads that the end of the process does not join may still use
+/// it.
 template <class T> class Immortal {
 public:
     Immortal() { new (_storage) T(); }

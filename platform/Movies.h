@@ -23,7 +23,8 @@ public:
     virtual ~Movies() = default;
 
     /// The header of the movie at `path`, links followed; absent when there is no plain file, when the file is no
-    /// movie, is cut short within its header, or lies about its sizes. Time and memory are bounded whatever the file holds.
+    /// movie, is cut short within its header, or lies about its sizes. Time and memory are bounded whatever the file
+    /// holds.
     virtual std::optional<MovieHeader> headerOfMovie(
         std::string_view path, PathKnowledge known = PathKnowledge::none) const = 0;
 };

@@ -68,8 +68,8 @@ constexpr std::string_view pathRelativeTo(std::string_view path, std::string_vie
     return path;
 }
 
-/// Where the full stop stands that begins the extension of `name`; npos when it has none, which is so when its only full
-/// stop stands first or last.
+/// Where the full stop stands that begins the extension of `name`; npos when it has none, which is so when its only
+/// full stop stands first or last.
 constexpr std::size_t extensionStart(std::string_view name) noexcept
 {
     const std::size_t last = name.rfind('.');

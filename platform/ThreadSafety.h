@@ -70,8 +70,8 @@ private:
     std::recursive_mutex _mutex;
 };
 
-/// A lock of one byte for records of which there are very many: held for a few instructions and never across a call out,
-/// so whoever finds it held lets the holder run and looks again.
+/// A lock of one byte for records of which there are very many: held for a few instructions and never across a call
+/// out, so whoever finds it held lets the holder run and looks again.
 class CAPABILITY("mutex") SmallLock {
 public:
     void lock() ACQUIRE()

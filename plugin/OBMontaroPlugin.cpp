@@ -1,7 +1,7 @@
 // Construction, teardown and identity.
 //
-// The one surprise: the order of both is part of what the class promises. The icons need their lock, the first reading of
-// the preferences runs before its lock exists, and teardown empties what the class shares, so that a later instance
+// The one surprise: the order of both is part of what the class promises. The icons need their lock, the first reading
+// of the preferences runs before its lock exists, and teardown empties what the class shares, so that a later instance
 // makes it again.
 
 #include "plugin/OBMontaroPlugin.h"

@@ -33,7 +33,8 @@ using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList
 ///   identity and lifecycle   OBMontaroPlugin.cpp
 ///   load cycle               LoadCycle.cpp
 ///   editor                   EditorDiscovery.cpp
-///   projects                 projects/ProjectSearchPaths.cpp, ProjectFolderScan.cpp, ProjectMovies.cpp, ProjectReload.cpp
+///   projects                 projects/ProjectSearchPaths.cpp, ProjectFolderScan.cpp, ProjectMovies.cpp,
+///                            ProjectReload.cpp
 ///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventPreference.cpp, EventReload.cpp
 ///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp
 ///   user interaction         ui/Icons.cpp
@@ -62,8 +63,8 @@ public:
     OBMediaGroupList mediaGroups() override;
     OBMediaGroupList movieGroups() override;
     platform::Text defaultNoDataMessage(const OBMediaGroupRef& group) override;
-    /// Builds the root group's own media objects from its direct children: one representative a project, and all objects
-    /// of any other group.
+    /// Builds the root group's own media objects from its direct children: one representative a project, and all
+    /// objects of any other group.
     void _setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root);
 
     // Editor
@@ -99,12 +100,12 @@ public:
     /// The event folder in the user's home; absent while no home folder is known. Asked for once a process.
     platform::Text _MontaroDefaultEventsFolderPath();
     void _prepareMontaroEventsSearchPaths();
-    /// Scans all event libraries into one library group; null when the walk was cancelled. With `updateRoot`, puts it into
-    /// the installed tree too.
+    /// Scans all event libraries into one library group; null when the walk was cancelled. With `updateRoot`, puts it
+    /// into the installed tree too.
     OBMediaGroupRef _reloadMontaroEvents_updateRootMediaGroup(const platform::Text& parentID, bool updateRoot);
     OBMediaGroupRef _reloadMontaroEvents();
-    /// Puts the scanned events in place of the root's old ones, or nothing when they hold no media object. `library` may be
-    /// null.
+    /// Puts the scanned events in place of the root's old ones, or nothing when they hold no media object. `library`
+    /// may be null.
     void finishReloadMontaroEvents(const OBMediaGroupRef& library);
     /// Reads the editor's choice of order.
     void _checkMontaroPreferences();

@@ -7,8 +7,8 @@
 #include <array>
 #include <string_view>
 
-/// One reason for which a scan takes an item or keeps it out. The scans apply these and nothing else, so that whoever asks
-/// why something is not listed is told by the rule that decided.
+/// One reason for which a scan takes an item or keeps it out. The scans apply these and nothing else, so that whoever
+/// asks why something is not listed is told by the rule that decided.
 struct ScanRule {
     std::string_view name; ///< what the rule is about
     bool (*passes)(const platform::FolderItem& item);

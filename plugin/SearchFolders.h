@@ -6,9 +6,9 @@
 #include <string_view>
 #include <vector>
 
-/// The folders called `folderName` that may hold a library, in the order in which they are searched: the default one where
-/// it is known, one a local volume (by display name), the one at the top of the boot volume, one a removable medium (by
-/// path). Whether they exist is not asked, and a volume that is listed twice is searched twice.
+/// The folders called `folderName` that may hold a library, in the order in which they are searched: the default one
+/// where it is known, one a local volume (by display name), the one at the top of the boot volume, one a removable
+/// medium (by path). Whether they exist is not asked, and a volume that is listed twice is searched twice.
 std::vector<platform::Text> foldersToSearch(
     const platform::Platform& platform, const platform::Text& defaultFolder, std::string_view folderName);
 

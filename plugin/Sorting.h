@@ -6,8 +6,8 @@
 #include <utility>
 #include <vector>
 
-/// The groups sorted by `comparison`, which answers -1, 0 or +1 for two groups: top-down merge sort, n elements being cut
-/// after n/2. Where the comparison is 0, the element of the first part comes first. The comparison need not be
+/// The groups sorted by `comparison`, which answers -1, 0 or +1 for two groups: top-down merge sort, n elements being
+/// cut after n/2. Where the comparison is 0, the element of the first part comes first. The comparison need not be
 /// transitive (events without a year equal everything), so the way of sorting is part of the result.
 template <class Comparison>
 std::vector<OBMediaGroupRef> sortedGroups(std::vector<OBMediaGroupRef> groups, const Comparison& comparison)

@@ -14,9 +14,9 @@ struct TreeLoad {
     std::chrono::nanoseconds duration {};
 };
 
-/// Loads the tree once and waits for it. The calling thread runs the main loop meanwhile, and so is the main thread until
-/// this returns; the loop has ended then, and with it the time in which thumbnails can be produced.
-/// Progress is told on standard error.
+/// Loads the tree once and waits for it. The calling thread runs the main loop meanwhile, and so is the main thread
+/// until this returns; the loop has ended then, and with it the time in which thumbnails can be produced. Progress is
+/// told on standard error.
 TreeLoad loadTree(const std::shared_ptr<OBMediaManager>& manager);
 
 } // namespace apps

@@ -22,11 +22,11 @@ struct AddedLink {
     std::string target;
 };
 
-/// Where a machine adds links: at paths that were named one by one, and at "/Volumes/NAME" for every mounted volume that
-/// a person sees as NAME.
+/// Where a machine adds links: at paths that were named one by one, and at "/Volumes/NAME" for every mounted volume
+/// that a person sees as NAME.
 ///
-/// A named link wins over a volume's; of two volumes with one name the first wins, local volumes before removable media;
-/// a folder that really stands at "/Volumes/NAME" wins over a volume. Volumes are asked only about paths below
+/// A named link wins over a volume's; of two volumes with one name the first wins, local volumes before removable
+/// media; a folder that really stands at "/Volumes/NAME" wins over a volume. Volumes are asked only about paths below
 /// "/Volumes", and only when they may have changed. Any thread.
 class LinkTable {
 public:

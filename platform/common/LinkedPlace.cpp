@@ -47,7 +47,8 @@ namespace {
         const LinkTable& _table;
         std::string _text;
         std::size_t _walked = 0; ///< so much of the text is known to hold no link
-        /// The text as it stood at the last link that the path itself, and no link's target, names: the answer for circles.
+        /// The text as it stood at the last link that the path itself, and no link's target, names: the answer for
+        /// circles.
         std::string _outermost;
         std::size_t _outermostTail;
         std::optional<AddedLink> _lastLink;

@@ -75,7 +75,7 @@ struct DescribedPlatform::Roles {
     FileMetadataIndex metadataIndex { fileSystem, movies };
 };
 
-DescribedPlatform::DescribedPlatform(MachineDescription description, const Platform& base)
+DescribedPlatform::DescribedPlatform(const MachineDescription& description, const Platform& base)
     : _roles(std::make_unique<Roles>(description, base))
     , _base(base)
 {

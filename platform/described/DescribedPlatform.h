@@ -8,14 +8,14 @@
 
 namespace platform {
 
-/// The machine that a description tells of, laid over another: files, links, volumes, the editor and the preferences are
-/// those of the description, everything else is the other machine's.
+/// The machine that a description tells of, laid over another: files, links, volumes, the editor and the preferences
+/// are those of the description, everything else is the other machine's.
 ///
 /// File contents stay real. Links that the other machine adds to those on disk do not exist here.
 class DescribedPlatform {
 public:
     /// The roles of `base` outlive this object.
-    DescribedPlatform(MachineDescription description, const Platform& base);
+    DescribedPlatform(const MachineDescription& description, const Platform& base);
     ~DescribedPlatform();
 
     /// Valid while this object lives.

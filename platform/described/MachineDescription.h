@@ -21,8 +21,8 @@ struct DescribedVolume {
     friend bool operator==(const DescribedVolume&, const DescribedVolume&) = default;
 };
 
-/// What a file says of the machine that programs are to run on. Paths are absolute, with single slashes, without "." and
-/// ".." and without a slash at the end.
+/// What a file says of the machine that programs are to run on. Paths are absolute, with single slashes, without "."
+/// and ".." and without a slash at the end.
 struct MachineDescription {
     std::optional<std::string> home;
     std::vector<DescribedVolume> localVolumes;
@@ -41,8 +41,8 @@ struct MachineDescriptionResult {
 inline constexpr std::size_t largestMachineDescription = std::size_t { 16 } << 20;
 
 /// Reads a description, a JSON object with the keys home, localVolumes, removableMedia, links and editor, each of which
-/// may be left out; `folder` is the absolute path to which relative ones are added. Refuses whatever else it finds: other
-/// keys, keys that occur twice, wrong types, empty paths, a link at the root.
+/// may be left out; `folder` is the absolute path to which relative ones are added. Refuses whatever else it finds:
+/// other keys, keys that occur twice, wrong types, empty paths, a link at the root.
 MachineDescriptionResult readMachineDescription(std::string_view bytes, std::string_view folder);
 
 } // namespace platform

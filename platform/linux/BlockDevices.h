@@ -21,7 +21,8 @@ class BlockDevices {
 public:
     explicit BlockDevices(SystemFolders folders);
 
-    /// Whether `mount` lies on a removable or hot-pluggable device. `table` is asked what holds the file of a loop device.
+    /// Whether `mount` lies on a removable or hot-pluggable device. `table` is asked what holds the file of a loop
+    /// device.
     bool isRemovable(const Mount& mount, const MountTable& table) const;
 
     /// The label that udev found on the device of `mount` (/dev/disk/by-label); empty when it knows none.

@@ -20,8 +20,8 @@ OpenedFolder openFolder(std::string_view path, LinkPolicy links);
 /// whether a link is in the way.
 OpenedFolder openFolderIn(int parent, const char* path, LinkPolicy links);
 
-/// What `openFolder` does with LinkPolicy::stop on kernels before 5.6 and in sandboxes that refuse openat2(2): opens one
-/// component after the other, none of which may be a link. Slower, with the same answers.
+/// What `openFolder` does with LinkPolicy::stop on kernels before 5.6 and in sandboxes that refuse openat2(2): opens
+/// one component after the other, none of which may be a link. Slower, with the same answers.
 OpenedFolder openFolderStepByStep(std::string_view path);
 
 } // namespace platform

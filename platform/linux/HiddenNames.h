@@ -14,8 +14,8 @@ class HiddenNames {
 public:
     static constexpr const char* fileName = ".hidden";
 
-    /// Reads the `.hidden` of the open folder `folder`, where there is one: a plain file, or a link to one. Of a file of
-    /// more than 16 MiB what lies beyond is not read.
+    /// Reads the `.hidden` of the open folder `folder`, where there is one: a plain file, or a link to one. Of a file
+    /// of more than 16 MiB what lies beyond is not read.
     static HiddenNames readIn(int folder);
 
     explicit HiddenNames(std::vector<char> text)

@@ -55,8 +55,8 @@ namespace {
         return byte >= 'A' && byte <= 'Z' ? static_cast<char>(byte - 'A' + 'a') : byte;
     }
 
-    // Equal by simple case folding to `word`, which is of lower-case ASCII letters. Of the letters beyond ASCII two fold to
-    // one of ASCII: the Kelvin sign to k and the long s to s.
+    // Equal by simple case folding to `word`, which is of lower-case ASCII letters. Of the letters beyond ASCII two
+    // fold to one of ASCII: the Kelvin sign to k and the long s to s.
     bool foldsTo(std::string_view text, std::string_view word)
     {
         constexpr std::string_view kelvinSign = "\u212a";

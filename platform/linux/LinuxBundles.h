@@ -16,7 +16,8 @@ public:
     StringTableAnswer readStringTable(std::string_view folder, std::string_view language) const override;
     std::optional<ImageResource> imageResource(std::string_view folder, std::string_view name) const override;
     LibraryAnswer loadLibrary(const std::string& path, const char* symbol) override;
-    /// `ombrix/plugins` beside the framework's library; else below the `lib` folder that belongs to the program's `bin`.
+    /// `ombrix/plugins` beside the framework's library; else below the `lib` folder that belongs to the program's
+    /// `bin`.
     std::string installedPluginsFolder() const override;
 
 private:

@@ -20,8 +20,9 @@ namespace platform {
 
 namespace {
 
-    // Asks for what the kernel holds already, so that a disk that sleeps is not woken and a server that is gone not waited
-    // for. What cannot be looked at (another user's FUSE volume) is taken for the folder that it nearly always is.
+    // Asks for what the kernel holds already, so that a disk that sleeps is not woken and a server that is gone not
+    // waited for. What cannot be looked at (another user's FUSE volume) is taken for the folder that it nearly always
+    // is.
     bool isFolder(const std::string& mountPoint)
     {
         struct statx facts;

@@ -21,7 +21,8 @@ public:
     std::vector<std::string> removableMedia() const override;
     std::string displayName(std::string_view path) const override;
     std::optional<std::string> fileSystemType(std::string_view path) const override;
-    /// Counts the changes of the mount table. A label that is written anew while its volume stays mounted does not count.
+    /// Counts the changes of the mount table. A label that is written anew while its volume stays mounted does not
+    /// count.
     std::uint64_t generation() const override EXCLUDES(_lock);
 
 private:

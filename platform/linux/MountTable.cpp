@@ -76,8 +76,8 @@ namespace {
         return mount;
     }
 
-    // Which mounts a path can reach. A mount hangs on its parent at its mount point; another child of that parent, mounted
-    // later at the same point or on a folder above it, leads every path away from it.
+    // Which mounts a path can reach. A mount hangs on its parent at its mount point; another child of that parent,
+    // mounted later at the same point or on a folder above it, leads every path away from it.
     class Reachability {
     public:
         explicit Reachability(const std::vector<Mount>& mounts)
@@ -177,8 +177,8 @@ namespace {
                 [&](std::string_view folder) { return isSameOrBelow(mountPoint, folder); });
     }
 
-    // A subvolume of btrfs is mounted by its path within the file system, which the options repeat; a folder inside one,
-    // mounted elsewhere, has a longer path.
+    // A subvolume of btrfs is mounted by its path within the file system, which the options repeat; a folder inside
+    // one, mounted elsewhere, has a longer path.
     bool isWholeSubvolume(const Mount& mount)
     {
         if (mount.fileSystemType != "btrfs")

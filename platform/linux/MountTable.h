@@ -42,7 +42,8 @@ public:
     /// Reads the table of this process from `procFolder`; empty when it cannot be read.
     static MountTable read(const std::string& procFolder);
 
-    /// Whether anything was mounted or unmounted since the table was opened as `openTable`, or since this was last asked.
+    /// Whether anything was mounted or unmounted since the table was opened as `openTable`, or since this was last
+    /// asked.
     static bool hasChanged(int openTable);
 
     /// The mounts that a path can reach, in mount order: without those that a later mount covers, at the same point or
@@ -60,8 +61,8 @@ private:
     std::vector<Mount> _mounts;
 };
 
-/// Whether a person would call what is mounted there a disk: on a block device, of FUSE or of ZFS, mounted whole (or as a
-/// subvolume of btrfs), and none of the system's own. Looks at the line only; touches nothing.
+/// Whether a person would call what is mounted there a disk: on a block device, of FUSE or of ZFS, mounted whole (or as
+/// a subvolume of btrfs), and none of the system's own. Looks at the line only; touches nothing.
 bool isLocalVolume(const Mount& mount);
 
 } // namespace platform

@@ -19,8 +19,9 @@ namespace {
         return file;
     }
 
-    // Without waiting, in case something else has taken the file's place since it was looked at. Only a plain file answers
-    // that this would block: somebody holds a lease on it (fcntl(2), as file servers do), who has to be waited for.
+    // Without waiting, in case something else has taken the file's place since it was looked at. Only a plain file
+    // answers that this would block: somebody holds a lease on it (fcntl(2), as file servers do), who has to be waited
+    // for.
     int openForReading(int folder, const char* path)
     {
         constexpr int flags = O_RDONLY | O_CLOEXEC | O_NOCTTY;

@@ -10,8 +10,8 @@ namespace platform {
 
 namespace {
 
-    // A full pipe whose reader made it answer at once instead of waiting. Whether it can be written to again; a reader that
-    // has stopped reading loses the rest of the line rather than stop this program.
+    // A full pipe whose reader made it answer at once instead of waiting. Whether it can be written to again; a reader
+    // that has stopped reading loses the rest of the line rather than stop this program.
     bool waitUntilWritable(int descriptor)
     {
         constexpr int longestWait = 1000; // milliseconds

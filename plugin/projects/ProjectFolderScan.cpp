@@ -1,7 +1,7 @@
 // Project libraries become folder and project groups.
 //
-// The one surprise: what comes out is what the libraries hold, merged; the group of a library itself lives for one scan,
-// tagged as a project group.
+// The one surprise: what comes out is what the libraries hold, merged; the group of a library itself lives for one
+// scan, tagged as a project group.
 
 #include "plugin/MontaroConstants.h"
 #include "plugin/SharedValues.h"

@@ -1,7 +1,7 @@
 // What a mounted volume means for the events.
 //
-// The one surprise: the folder is sought below the fixed root of all volumes, under the name that people see, and not at the
-// mount point itself.
+// The one surprise: the folder is sought below the fixed root of all volumes, under the name that people see, and not
+// at the mount point itself.
 
 #include "plugin/MontaroConstants.h"
 #include "plugin/OBMontaroPlugin.h"

@@ -15,8 +15,8 @@
 using namespace tests;
 
 // Each folder here is one shape of library, named after the rule that it shows: `machine.json` describes the machine,
-// `library.txt` its files, `tree.json` is the tree that the program prints, `reason.txt` says in a line why it is right.
-// No folder of a library holds two items that show, for the order in which a disk lists them is its own.
+// `library.txt` its files, `tree.json` is the tree that the program prints, `reason.txt` says in a line why it is
+// right. No folder of a library holds two items that show, for the order in which a disk lists them is its own.
 
 namespace {
 

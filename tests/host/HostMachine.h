@@ -115,8 +115,8 @@ public:
     std::vector<std::string> preferredLanguages() const override { return languages; }
 };
 
-/// A machine with real files in a folder of its own, real threads and a real main thread; time stands still, and bundles,
-/// preferences and languages are what a test says.
+/// A machine with real files in a folder of its own, real threads and a real main thread; time stands still, and
+/// bundles, preferences and languages are what a test says.
 class HostMachine {
 public:
     HostMachine();

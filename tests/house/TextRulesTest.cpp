@@ -12,7 +12,8 @@ using namespace house;
 
 namespace {
 
-// A text that no file may hold. A '#' in it stands for any digit. Each is written in two pieces, so that this file passes.
+// A text that no file may hold. A '#' in it stands for any digit. Each is written in two pieces, so that this file
+// passes.
 struct ForbiddenText {
     std::string text;
     std::string reason;

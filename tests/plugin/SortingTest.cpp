@@ -24,7 +24,8 @@ int compared(const platform::Text& receiver, const platform::Text& other)
         *groupOfType(OBMontaroFolderGroupTypeIdentifier, other));
 }
 
-/// The root's children after a reload that finds projects of these names, in this order; null is a group without a name.
+/// The root's children after a reload that finds projects of these names, in this order; null is a group without a
+/// name.
 std::string sortedNames(const std::vector<const char*>& names)
 {
     SourceMachine machine;

@@ -8,8 +8,8 @@ namespace tests {
 
 /// Passes every call on to another file system, except those that a test breaks.
 ///
-/// A test sets the hooks before other threads come in; a hook is called before the call is passed on, on the thread that
-/// asks. It may block, count, or change the disk.
+/// A test sets the hooks before other threads come in; a hook is called before the call is passed on, on the thread
+/// that asks. It may block, count, or change the disk.
 class FaultyFileSystem : public platform::FileSystem {
 public:
     /// `real` outlives this object.

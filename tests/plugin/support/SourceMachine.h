@@ -27,11 +27,12 @@
 
 namespace tests {
 
-/// Which code the source runs: that of its bundle, or the same linked into the test program, whose class tests can name.
+/// Which code the source runs: that of its bundle, or the same linked into the test program, whose class tests can
+/// name.
 enum class SourceCode { linked, bundled };
 
-/// A machine with a host for the source: a real disk, a home on it, the editor installed, nothing mounted; a main thread
-/// that runs from construction to destruction.
+/// A machine with a host for the source: a real disk, a home on it, the editor installed, nothing mounted; a main
+/// thread that runs from construction to destruction.
 ///
 /// On the disk lie `home`, `Volumes` (served at "/Volumes"), and what stands at the top of the boot volume, in `boot`.
 class SourceMachine {
@@ -126,8 +127,8 @@ private:
     std::thread _mainThread;
 };
 
-/// A load that waits before it has asked for anything, so that a cancel can be made to stand for as long as a test likes.
-/// It cannot be the first load of its machine's source unless a test wants that load cancelled.
+/// A load that waits before it has asked for anything, so that a cancel can be made to stand for as long as a test
+/// likes. It cannot be the first load of its machine's source unless a test wants that load cancelled.
 class HeldLoad {
 public:
     HeldLoad(SourceMachine& machine, OBMediaManager& manager);

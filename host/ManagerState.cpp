@@ -54,10 +54,11 @@ OBLoadProgress ManagerState::Progress::now() const
 
 void ManagerState::requestTree(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
 {
-    OBLoadResult ready { OBLoadOutcome::loaded, root.load() };
+    OBLoadResult ready;
     bool start = false;
     {
         std::lock_guard guard(_lock);
+        ready.rootMediaGroup = root.load();
         if (_ended) {
             ready = { OBLoadOutcome::ended, nullptr };
         } else {

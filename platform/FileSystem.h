@@ -40,7 +40,9 @@ enum class LinkPolicy : std::uint8_t {
 /// What whoever names a path has seen of it before.
 enum class PathKnowledge : std::uint8_t {
     none,
-    realPlainFile, ///< a plain file, by a path without symbolic links; saves looking again before it is opened
+    /// A plain file, by a path without symbolic links: saves looking again before it is opened. Where that is no longer
+    /// so, a file system answers `linkOnTheWay` or why it is no plain file, and follows nothing.
+    realPlainFile,
 };
 
 /// Facts about one item.
@@ -187,6 +189,7 @@ public:
 
 private:
     friend class SubfolderItems;
+    FolderItem adopted(const FolderItem& item);
     struct SubfolderEntry {
         std::uint32_t nameOffset = 0;
         std::uint32_t nameLength = 0;
@@ -316,6 +319,18 @@ inline SubfolderItems FolderListing::takeSubfolder()
     return { *this, static_cast<std::uint32_t>(first), static_cast<std::uint32_t>(_subfolderStart - first) };
 }
 
+/// `item`, with what it tells of a subfolder kept in this listing.
+inline FolderItem FolderListing::adopted(const FolderItem& item)
+{
+    FolderItem own = item;
+    if (item.subfolder && item.subfolder->_listing != this) {
+        for (std::size_t index = 0; index < item.subfolder->size(); ++index)
+            appendToSubfolder((*item.subfolder)[index].name, (*item.subfolder)[index].kind);
+        own.subfolder = takeSubfolder();
+    }
+    return own;
+}
+
 inline void FolderListing::append(const FolderItem& item)
 {
     if (_entries.empty()) {
@@ -323,22 +338,18 @@ inline void FolderListing::append(const FolderItem& item)
         _entries.reserve(8);
         _names.reserve(128);
     }
-    FolderItem added = item;
-    if (item.subfolder && item.subfolder->_listing != this) {
-        for (std::size_t index = 0; index < item.subfolder->size(); ++index)
-            appendToSubfolder((*item.subfolder)[index].name, (*item.subfolder)[index].kind);
-        added.subfolder = takeSubfolder();
-    }
+    const FolderItem own = adopted(item);
     Entry& entry = _entries.emplace_back();
     entry.nameOffset = static_cast<std::uint32_t>(_names.size());
     entry.nameLength = static_cast<std::uint32_t>(item.name.size());
     _names.append(item.name);
-    entry.take(added);
+    entry.take(own);
 }
 
 inline void FolderListing::setItem(std::size_t index, const FolderItem& item)
 {
-    _entries[index].take(item);
+    const FolderItem own = adopted(item);
+    _entries[index].take(own);
 }
 
 } // namespace platform

@@ -65,22 +65,27 @@ OBMediaGroupRef OBMontaroPlugin::performLoadData()
     root->setIcon(sharedValues().smallAppIcon.load());
     root->setDynamicMediaObjects(false);
 
+    registerQueries();
+    root->setChildGroups(_reloadMontaroProjects(false));
+    root->addChildGroup(_reloadMontaroEvents_updateRootMediaGroup(root->ID(), false));
+    _setMediaObjectsForRootMediaGroup(root);
+    return root;
+}
+
+/// The framework may be gone while the last load still runs; then there is nobody to register with.
+void OBMontaroPlugin::registerQueries()
+{
     const auto watcher = OBPathWatcher::sharedPathWatcher();
+    if (!watcher)
+        return;
     std::vector<std::string> projectScope;
     if (const Text path = _MontaroDefaultPath())
         projectScope.push_back(path.string());
     watcher->watchQuery_observer_queryScope_queryRunMode(
         projectQuery, this, std::move(projectScope), OBQueryRunModeLive);
-    {
-        Locked guard(*_MontaroEventsSearchPathsLock);
-        watcher->watchQuery_observer_queryScope_queryRunMode(
-            movieQuery, this, strings(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
-    }
-
-    root->setChildGroups(_reloadMontaroProjects(false));
-    root->addChildGroup(_reloadMontaroEvents_updateRootMediaGroup(root->ID(), false));
-    _setMediaObjectsForRootMediaGroup(root);
-    return root;
+    Locked guard(*_MontaroEventsSearchPathsLock);
+    watcher->watchQuery_observer_queryScope_queryRunMode(
+        movieQuery, this, strings(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
 }
 
 void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root)

@@ -133,6 +133,7 @@ private:
     std::optional<double> pluginVersionNumber() const override;
     std::optional<std::string> pluginVersionString() const override;
 
+    void registerQueries();
     bool addEventsSearchPath(const platform::Text& path);
     /// An absolute path for one that begins with "~"; absent while no home folder is known.
     platform::Text expandingTilde(std::string_view path) const;

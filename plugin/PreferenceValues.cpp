@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cstdint>
 #include <limits>
 #include <string_view>
 #include <system_error>
@@ -35,16 +36,23 @@ bool booleanOfText(std::string_view text)
     return !text.empty() && std::string_view("YyTt123456789").find(text.front()) != std::string_view::npos;
 }
 
-/// Whether a decimal number that no double can hold is too large for one, not too small.
+/// Whether a decimal number that no double can hold is too large for one, not too small: where its first digit stands
+/// relative to the full stop, moved by the exponent.
 bool isLarge(std::string_view number)
 {
-    const std::size_t exponentStart = std::min(number.find_first_of("eE"), number.size());
-    const std::string_view digits = number.substr(0, exponentStart);
+    const std::string_view digits = number.substr(0, number.find_first_of("eE"));
+    const std::size_t firstDigit = digits.find_first_of("123456789");
+    if (firstDigit == std::string_view::npos)
+        return false;
     const std::size_t point = std::min(digits.find('.'), digits.size());
-    const std::size_t firstDigit = std::min(digits.find_first_of("123456789"), digits.size());
-    if (exponentStart != number.size())
-        return number.substr(exponentStart + 1, 1) != "-";
-    return firstDigit < point;
+    const auto place = static_cast<std::int64_t>(point) - static_cast<std::int64_t>(firstDigit);
+    std::string_view exponentText = number.substr(std::min(digits.size() + 1, number.size()));
+    const bool isNegative = takeSign(exponentText);
+    std::int64_t exponent = 0;
+    const auto [end, error] = std::from_chars(exponentText.data(), exponentText.data() + exponentText.size(), exponent);
+    if (error == std::errc::result_out_of_range)
+        return !isNegative;
+    return place + (isNegative ? -exponent : exponent) > 0;
 }
 
 double doubleOfText(std::string_view text)

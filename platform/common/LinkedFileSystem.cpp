@@ -141,7 +141,7 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);
     // What named links change inside the items is told by listing each by itself.
-    if (_table.hasNamedLinkBelow(folder) || _table.hasNamedLinkBelow(place.path))
+    if (_table.hasNamedLinks() && (place.path != folder || _table.hasNamedLinkBelow(folder)))
         stopping.subfolder = {};
     FolderListing listing = _real.itemsInFolder(place.path, stopping);
     bool isUnsettled = listing.problem() == FileProblem::linkOnTheWay;
@@ -167,7 +167,7 @@ FolderListing LinkedFileSystem::listingOfWalkedFolder(
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);
     ListingRequest there = request;
-    if (_table.hasNamedLinkBelow(place.path))
+    if (_table.hasNamedLinks())
         there.subfolder = {};
     return _real.itemsInFolder(place.path, there);
 }
@@ -178,7 +178,10 @@ FolderListing LinkedFileSystem::listingThatStops(std::string_view folder, const 
     const std::string path = lexicallyNormalised(folder);
     if (_table.mayApplyTo(path) && _table.linkAtOrAbove(path))
         return FolderListing(FileProblem::linkOnTheWay);
-    FolderListing listing = _real.itemsInFolder(path, request);
+    ListingRequest there = request;
+    if (_table.hasNamedLinkBelow(path))
+        there.subfolder = {};
+    FolderListing listing = _real.itemsInFolder(path, there);
     const std::vector<std::string> added = _table.namesInFolder(path);
     for (std::size_t index = 0; !added.empty() && index < listing.size(); ++index) {
         const FolderItem item = listing[index];
@@ -309,7 +312,7 @@ std::string LinkedFileSystem::resolvedPath(std::string_view path) const
 
 OpenResult LinkedFileSystem::openPlainFile(std::string_view path, PathKnowledge known) const
 {
-    // What was seen to hold no link need not be walked; the disk tells if that has changed.
+    // What was seen to hold no link need not be walked: the disk refuses, and follows nothing, if that has changed.
     if (known == PathKnowledge::realPlainFile && !(_table.mayApplyTo(path) && _table.linkAtOrAbove(path))) {
         OpenResult result = _real.openPlainFile(path, known);
         if (result.file)

@@ -75,10 +75,8 @@ OpenedFolder openFolder(std::string_view path, LinkPolicy links)
     return openFolderStepByStep(path);
 }
 
-OpenedFolder openFolderIn(int parent, const char* path, LinkPolicy links)
+OpenedFolder openFolderIn(int parent, const char* path)
 {
-    if (links == LinkPolicy::follow)
-        return openFollowing(parent, path, listingFlags);
     auto folder = openFolderWithoutLinks(parent, path);
     return folder ? std::move(*folder) : failed(FileProblem::linkOnTheWay);
 }

@@ -90,7 +90,7 @@ namespace {
             if (const auto status = readItemStatus(_folder, entry.d_name, 0))
                 item.modificationDate = status->modificationDate;
         }
-        if (!_request.subfolder.empty() && item.marker == MarkerAnswer::present)
+        if (!_request.subfolder.empty() && item.marker == MarkerAnswer::present && item.kind == ItemKind::folder)
             item.subfolder = itemsOfSubfolder(entry.d_name);
         _sawHiddenNames = _sawHiddenNames || name == HiddenNames::fileName;
         _listing.append(item);
@@ -135,7 +135,7 @@ namespace {
     std::optional<SubfolderItems> FolderReader::itemsOfSubfolder(const char* holder)
     {
         _markerPath.assign(holder).append(1, '/').append(_request.subfolder);
-        const OpenedFolder subfolder = openFolderIn(_folder, _markerPath.c_str(), _request.links);
+        const OpenedFolder subfolder = openFolderIn(_folder, _markerPath.c_str());
         const bool isNone = subfolder.problem == FileProblem::missing || subfolder.problem == FileProblem::notAFolder;
         const bool isRead = subfolder.descriptor.isOpen() && readSubfolder(subfolder.descriptor.number());
         const SubfolderItems items = _listing.takeSubfolder();
@@ -144,8 +144,9 @@ namespace {
 
     bool FolderReader::readSubfolder(int folder)
     {
+        constexpr int blocksAtMost = 1000; // some hundred thousand items; more are listed by themselves
         alignas(dirent64) char block[32 * 1024];
-        for (;;) {
+        for (int count = 0; count < blocksAtMost; ++count) {
             const ssize_t length = uninterrupted([&] { return getdents64(folder, block, sizeof(block)); });
             if (length <= 0)
                 return length == 0;
@@ -157,6 +158,7 @@ namespace {
                 offset += entry->d_reclen;
             }
         }
+        return false;
     }
 
     // Looks up each line among the items, not each item among the lines: the folder bounds the memory, not the file.

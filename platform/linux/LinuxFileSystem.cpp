@@ -18,6 +18,7 @@
 #include <vector>
 
 #include <fcntl.h>
+#include <linux/limits.h>
 #include <pwd.h>
 #include <unistd.h>
 
@@ -104,7 +105,11 @@ FolderListing LinuxFileSystem::itemsInFolder(std::string_view folder, const List
     const OpenedFolder opened = openFolder(folder, request.links);
     if (opened.problem != FileProblem::none)
         return FolderListing(opened.problem);
-    FolderListing listing = readOpenFolder(opened.descriptor.number(), request);
+    // What lies too deep to be named by its whole path is not to be reached from here either.
+    ListingRequest reachable = request;
+    if (folder.size() + NAME_MAX + request.subfolder.size() + 2 >= PATH_MAX)
+        reachable.subfolder = {};
+    FolderListing listing = readOpenFolder(opened.descriptor.number(), reachable);
     listing.setPathIsReal(
         request.links == LinkPolicy::stop && isLexicallyNormalised(folder) && !hasDotComponent(folder));
     return listing;

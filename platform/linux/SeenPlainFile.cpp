@@ -3,6 +3,8 @@
 #include "platform/linux/ItemReading.h"
 #include "platform/linux/OpenWithoutLinks.h"
 
+#include <cerrno>
+
 #include <fcntl.h>
 
 namespace platform {
@@ -11,14 +13,17 @@ OpenedFile openSeenPlainFile(const char* path)
 {
     OpenedFile file;
     file.descriptor = Descriptor(openWithoutLinks(AT_FDCWD, path, O_RDONLY | O_CLOEXEC | O_NOCTTY | O_NONBLOCK));
-    if (file.descriptor.isOpen()) {
-        const auto status = readItemStatus(file.descriptor.number(), "", AT_EMPTY_PATH);
-        if (status && status->kind == ItemKind::file) {
-            file.status = *status;
-            return file;
-        }
+    if (!file.descriptor.isOpen()) {
+        const bool isUntold = errno == ELOOP || errno == ENOSYS || errno == EPERM;
+        file.problem = isUntold ? FileProblem::linkOnTheWay : problemOfError(errno);
+        return file;
     }
-    return openPlainFileAt(AT_FDCWD, path);
+    const auto status = readItemStatus(file.descriptor.number(), "", AT_EMPTY_PATH);
+    if (status && status->kind == ItemKind::file)
+        file.status = *status;
+    else
+        file.problem = status ? FileProblem::notAPlainFile : FileProblem::readError;
+    return file;
 }
 
 } // namespace platform

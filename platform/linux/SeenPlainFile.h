@@ -5,7 +5,7 @@
 namespace platform {
 
 /// Opens the plain file at the absolute `path`, which was seen to be one and to hold no link, without looking a second
-/// time beforehand. Where that has changed meanwhile, and where the system cannot tell, as `openPlainFileAt`.
+/// time beforehand. `linkOnTheWay` where a link is in the way now, or where the system cannot tell.
 OpenedFile openSeenPlainFile(const char* path);
 
 } // namespace platform

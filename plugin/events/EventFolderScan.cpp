@@ -25,7 +25,8 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
                 break;
             // Asked of the folder that holds the library, while the library is what is watched.
             const Text parent = platform::pathByRemovingLastComponent(path);
-            if (OBPathWatcher::sharedPathWatcher()->watchPathIsUnique_observer(parent, this))
+            const auto watcher = OBPathWatcher::sharedPathWatcher();
+            if (watcher && watcher->watchPathIsUnique_observer(parent, this))
                 _watchPath(path);
         }
     }

@@ -31,6 +31,10 @@ inline constexpr std::string_view sharedItemsFolder = "Shared Items";
 /// What is in a project's folder of shared movies that is a movie, in listing order.
 struct SharedMovies {
     explicit SharedMovies(const platform::Text& project);
+    SharedMovies(const SharedMovies&) = delete;
+    SharedMovies& operator=(const SharedMovies&) = delete;
+    SharedMovies(SharedMovies&&) = default;
+    SharedMovies& operator=(SharedMovies&&) = default;
 
     OBFolderOfFiles folder;
     platform::FolderListing listing {}; ///< where the folder was listed by itself

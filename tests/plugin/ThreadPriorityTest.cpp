@@ -79,9 +79,20 @@ TEST_CASE("a stored text that does not start with a number is a priority of 0")
 
 TEST_CASE("a stored text that reads as a number outside 0.0 to 1.0 leaves 0.5")
 {
-    for (const char* text : { "2", "-0.5", "1.0001", "1e400", "-1e400" }) {
+    const std::string large(400, '9');
+    for (const std::string& text : { std::string("2"), std::string("-0.5"), std::string("1.0001"), std::string("1e400"),
+             std::string("-1e400"), large, large + "e-1" }) {
         CAPTURE(text);
-        CHECK(priorityWhenStored(text) == 0.5);
+        CHECK(priorityWhenStored(platform::Text(text)) == 0.5);
+    }
+}
+
+TEST_CASE("a stored text whose number is too small to tell from nothing counts as 0.0")
+{
+    const std::string zeros(400, '0');
+    for (const std::string& text : { "0." + zeros + "1", "0." + zeros + "1e5", std::string("1e-400") }) {
+        CAPTURE(text);
+        CHECK(priorityWhenStored(platform::Text(text)) == 0.0);
     }
 }
 

@@ -3,6 +3,7 @@
 #include "host/FrameworkCore.h"
 #include "host/PluginLibrary.h"
 
+#include <set>
 #include <utility>
 
 OBMediaHost::OBMediaHost(const platform::Platform& platform, OBHostOptions options)
@@ -26,8 +27,9 @@ std::vector<OBPluginInfo> OBMediaHost::plugins()
 
 std::vector<OBPluginInfo> OBMediaHost::tryAllPlugins()
 {
+    std::set<std::string> tried;
     for (const OBPluginInfo& plugin : _plugins->plugins()) {
-        if (plugin.reason.empty())
+        if (plugin.reason.empty() && tried.insert(plugin.identifier).second)
             createManager(plugin.identifier);
     }
     return _plugins->plugins();

@@ -243,8 +243,7 @@ void OBMediaManager::observeNotification(
     _state->addNotification(center, center.addObserver(name, nullptr, call));
 }
 
-void OBMediaManager::requestRootMediaGroup(
-    const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
+void OBMediaManager::requestRootMediaGroup(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
 {
     _state->requestTree(executor, std::move(completion));
 }

@@ -100,11 +100,7 @@ PluginLibrary::PluginLibrary(FrameworkCore& core, std::vector<std::string> folde
                 _plugins.begin(), _plugins.end(), [&](const Plugin& other) { return other.info.path == path; });
             if (known != _plugins.end())
                 continue;
-            Plugin plugin = readBundle(std::move(path));
-            const Plugin* first = find(plugin.info.identifier);
-            if (first && first->info.reason.empty() && plugin.info.reason.empty())
-                plugin.info.reason = "the plug-in is there already, in " + first->info.path;
-            _plugins.push_back(std::move(plugin));
+            _plugins.push_back(readBundle(std::move(path)));
         }
     }
 }
@@ -150,9 +146,10 @@ void PluginLibrary::load(Plugin& plugin, std::vector<std::string>& toLog)
         return;
     const std::string file = platform::pathJoined(plugin.info.path, plugin.manifest.library);
     const platform::LibraryAnswer library = _core.platform().bundles.loadLibrary(file, OBPluginEntryPointName);
-    plugin.info.reason = library.problem;
-    if (!library.entryPoint)
+    if (!library.problem.empty() || !library.entryPoint) {
+        plugin.info.reason = library.problem.empty() ? plugin.manifest.library + ": offers no source" : library.problem;
         return;
+    }
     const auto entryPoint = reinterpret_cast<OBPluginEntryPoint>(library.entryPoint);
     plugin.info.reason = textOfThrown([&] { plugin.managerClass = entryPoint(); });
     if (plugin.info.reason.empty() && !plugin.managerClass)
@@ -181,16 +178,36 @@ Value PluginLibrary::stringTable(const Plugin& plugin, std::vector<std::string>&
     return {};
 }
 
+/// The bundle that is used for `identifier`, loaded: one that turns out to be damaged leaves its place to the next, and the
+/// one that loads takes it for good. Refused when all are; null when there is none.
+PluginLibrary::Plugin* PluginLibrary::loaded(std::string_view identifier, std::vector<std::string>& toLog)
+{
+    Plugin* plugin = find(identifier);
+    while (plugin && plugin->info.reason.empty() && !plugin->managerClass) {
+        load(*plugin, toLog);
+        if (plugin->managerClass)
+            refuseOthers(*plugin);
+        plugin = find(identifier);
+    }
+    return plugin;
+}
+
+void PluginLibrary::refuseOthers(const Plugin& used)
+{
+    for (Plugin& plugin : _plugins) {
+        if (&plugin != &used && plugin.info.identifier == used.info.identifier && plugin.info.reason.empty())
+            plugin.info.reason = "the plug-in is there already, in " + used.info.path;
+    }
+}
+
 const OBMediaManagerClass* PluginLibrary::managerClass(std::string_view identifier)
 {
     std::vector<std::string> toLog;
     const OBMediaManagerClass* managerClass = nullptr;
     {
         Locked guard(_lock);
-        if (Plugin* plugin = find(identifier)) {
-            load(*plugin, toLog);
-            managerClass = plugin->info.reason.empty() ? plugin->managerClass : nullptr;
-        }
+        const Plugin* plugin = loaded(identifier, toLog);
+        managerClass = plugin && plugin->info.reason.empty() ? plugin->managerClass : nullptr;
     }
     log(toLog);
     return managerClass;
@@ -209,10 +226,9 @@ OBManagerResult PluginLibrary::createManager(const std::shared_ptr<FrameworkCore
     std::vector<std::string> toLog;
     {
         Locked guard(_lock);
-        Plugin* plugin = find(identifier);
+        const Plugin* plugin = loaded(identifier, toLog);
         if (!plugin)
-            return { nullptr, "no plug-in called " + std::string(identifier) };
-        load(*plugin, toLog);
+            return { nullptr, std::string(identifier) + ": there is no such plug-in" };
         if (!plugin->info.reason.empty())
             return { nullptr, plugin->info.path + ": " + plugin->info.reason };
         managerClass = plugin->managerClass;

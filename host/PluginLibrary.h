@@ -32,7 +32,9 @@ private:
 
     Plugin readBundle(std::string path) const;
     Plugin* find(std::string_view identifier) REQUIRES(_lock);
+    Plugin* loaded(std::string_view identifier, std::vector<std::string>& toLog) REQUIRES(_lock);
     void load(Plugin& plugin, std::vector<std::string>& toLog) REQUIRES(_lock);
+    void refuseOthers(const Plugin& used) REQUIRES(_lock);
     platform::Value stringTable(const Plugin& plugin, std::vector<std::string>& toLog) const;
     void log(const std::vector<std::string>& lines);
     void refuse(std::string_view identifier, const std::string& reason);

@@ -64,7 +64,7 @@ TEST_CASE("a plug-in that is not there has neither class nor manager, and that i
     CHECK(test.host().managerClass("") == nullptr);
     const OBManagerResult result = test.host().createManager("org.test.Unknown");
     CHECK(result.manager == nullptr);
-    CHECK(result.problem == "no plug-in called org.test.Unknown");
+    CHECK(result.problem == "org.test.Unknown: there is no such plug-in");
 }
 
 TEST_CASE("a manager knows its plug-in's identifier and bundle")
@@ -115,13 +115,27 @@ TEST_CASE("of two plug-ins with one identifier the first is used, and the other 
     MadeUpBundle& second = test.machine.addBundle("more/Copy.obplugin", TestHost::identifier);
     second.manifest.version = "2.0";
     test.options.pluginFolders.push_back(test.machine.folder.path("more"));
+    CHECK(test.manager()->pluginBundle().manifest().version == "1.0");
     const auto plugins = test.host().plugins();
     REQUIRE(plugins.size() == 2);
+    CHECK(plugins[0].loaded);
     CHECK(plugins[0].reason.empty());
+    CHECK_FALSE(plugins[1].loaded);
     CHECK(plugins[1].reason.find(test.bundleFolder()) != std::string::npos);
-    CHECK(test.manager()->pluginBundle().manifest().version == "1.0");
-    CHECK(test.host().plugins()[0].loaded);
-    CHECK_FALSE(test.host().plugins()[1].loaded);
+}
+
+TEST_CASE("a plug-in whose library is damaged leaves its place to another with its identifier")
+{
+    TestHost test;
+    test.bundle().libraryProblem = "it is no library";
+    MadeUpBundle& second = test.machine.addBundle("more/Copy.obplugin", TestHost::identifier);
+    second.manifest.version = "2.0";
+    test.options.pluginFolders.push_back(test.machine.folder.path("more"));
+    CHECK(test.manager()->pluginBundle().manifest().version == "2.0");
+    const auto plugins = test.host().plugins();
+    REQUIRE(plugins.size() == 2);
+    CHECK(plugins[0].reason == "it is no library");
+    CHECK(plugins[1].loaded);
 }
 
 TEST_CASE("a refused plug-in does not stand in the way of another with its identifier")

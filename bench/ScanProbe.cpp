@@ -64,8 +64,8 @@ platform::Platform withRoles(
     const platform::Platform& base, platform::Movies& movies, platform::MainRunLoop& mainRunLoop)
 {
     return { base.fileSystem, base.volumes, base.workspace, base.preferences, base.metadataIndex, movies,
-        base.notifications, base.workspaceNotifications, base.clock, base.threads, mainRunLoop, base.console,
-        base.bundles, base.languages };
+        base.notifications, base.workspaceNotifications, base.clock, base.calendar, base.threads, mainRunLoop,
+        base.console, base.bundles, base.languages };
 }
 
 double secondsOf(clockid_t clock)

@@ -1,6 +1,7 @@
 #include "host/OBMediaManager.h"
 
 #include "host/ManagerState.h"
+#include "host/OrderedWork.h"
 #include "platform/Clock.h"
 #include "platform/FileSystem.h"
 #include "platform/MainRunLoop.h"
@@ -179,11 +180,23 @@ Value OBMediaManager::preferencesOfDomain(std::string_view domain)
 
 platform::FolderListing OBMediaManager::listFolder(const Text& path, const platform::ListingRequest& request)
 {
-    using platform::FileProblem;
+    platform::FolderListing listing = readFolder(path, request);
+    noteFolderRead(path, listing.problem());
+    return listing;
+}
+
+platform::FolderListing OBMediaManager::readFolder(const Text& path, const platform::ListingRequest& request)
+{
     _state->beginPath(path);
     platform::FolderListing listing = platform().fileSystem.itemsInFolder(path, request);
     _state->progress.foldersDone.fetch_add(1, std::memory_order_relaxed);
-    switch (listing.problem()) {
+    return listing;
+}
+
+void OBMediaManager::noteFolderRead(const Text& path, platform::FileProblem problem)
+{
+    using platform::FileProblem;
+    switch (problem) {
     case FileProblem::none:
     case FileProblem::missing:
     case FileProblem::notAFolder:
@@ -192,9 +205,8 @@ platform::FolderListing OBMediaManager::listFolder(const Text& path, const platf
         _state->core->logOnce(path.string() + ": listed as empty: the path is too long for the system", this);
         [[fallthrough]];
     default:
-        _state->noteProblem(path, listing.problem());
+        _state->noteProblem(path, problem);
     }
-    return listing;
 }
 
 void OBMediaManager::noteFoldersFound(std::uint64_t count)
@@ -225,6 +237,13 @@ std::shared_ptr<OBScanObserver> OBMediaManager::scanObserver() const
 bool OBMediaManager::performOnMainThreadAndWait(const std::function<void()>& call)
 {
     return platform().mainRunLoop.performAndWait(call);
+}
+
+void OBMediaManager::performInOrder(std::size_t count, const std::function<void(std::size_t)>& job,
+    const std::function<void(std::size_t)>& take)
+{
+    const auto start = [this](std::function<void()> body) { return startThread("ob-scan", std::move(body)); };
+    std::make_shared<OrderedWork>(platform(), start, count, job)->perform(take);
 }
 
 bool OBMediaManager::startThread(const std::string& name, std::function<void()> body)

@@ -133,6 +133,9 @@ public:
     platform::Value preferencesOfDomain(std::string_view domain);
     /// Lists a folder for a scan: keeps the progress and notes why a folder that is there cannot be read.
     platform::FolderListing listFolder(const platform::Text& path, const platform::ListingRequest& request);
+    /// The two halves of that, for whoever lists on several threads and notes in order.
+    platform::FolderListing readFolder(const platform::Text& path, const platform::ListingRequest& request);
+    void noteFolderRead(const platform::Text& path, platform::FileProblem problem);
     /// For the progress: folders that will be listed, media objects made, items that a rule kept out.
     void noteFoldersFound(std::uint64_t count);
     void noteItemsFound(std::uint64_t count);
@@ -144,6 +147,10 @@ public:
 
     /// Runs `call` on the main thread and waits; false, with `call` not run, when the main loop has ended.
     bool performOnMainThreadAndWait(const std::function<void()>& call);
+    /// Calls `job` once for each index below `count`, on this thread and a few others, and `take` for each in order, on
+    /// this thread alone. When it returns no thread is inside `job` any more. The calls must not throw.
+    void performInOrder(std::size_t count, const std::function<void(std::size_t index)>& job,
+        const std::function<void(std::size_t index)>& take);
     /// Runs `body` on a thread of its own, which keeps this manager alive. False when there is none to be had.
     bool startThread(const std::string& name, std::function<void()> body);
     /// Calls `handler` for notifications called `name` until the manager ends.

@@ -55,6 +55,14 @@ struct ItemStatus {
     Date creationDate;
 };
 
+/// What a list of files shows of one, and what it is ordered by.
+struct FileFacts {
+    Date creationDate; ///< as in `ItemStatus`
+    std::uint64_t size = 0; ///< bytes
+
+    friend bool operator==(const FileFacts&, const FileFacts&) = default;
+};
+
 /// The flags by which a browser decides whether and how it shows an item.
 struct ItemFlags {
     bool invisible = false; ///< its name begins with a full stop, or its folder's `.hidden` names it
@@ -81,6 +89,8 @@ struct ListingRequest {
     /// For every item that holds the marker: the names and kinds of what is in the folder of this name inside it, where
     /// that needs no link to be followed. Not asked when empty.
     std::string_view subfolder {};
+    /// The size and the creation date of every item that is neither a folder, nor a link, nor hidden by its name.
+    bool fileFacts = false;
     LinkPolicy links = LinkPolicy::follow;
 };
 
@@ -114,6 +124,7 @@ struct FolderItem {
     ItemFlags flags {};
     MarkerAnswer marker = MarkerAnswer::absent;
     std::optional<Date> modificationDate {}; ///< where the request asked for it and it could be read
+    std::optional<FileFacts> facts {}; ///< likewise
     /// Where the request asked for it and it could be told in the same pass; nothing in it when the folder is missing.
     /// Absent, it has to be listed by itself.
     std::optional<SubfolderItems> subfolder {};
@@ -139,6 +150,9 @@ public:
 
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
     bool pathIsReal() const noexcept { return _pathIsReal; }
+    /// The folder's real path where the listing came by it on the way and it is another than the one asked for; empty
+    /// otherwise.
+    const std::string& otherRealPath() const noexcept { return _otherRealPath; }
 
     std::size_t size() const noexcept { return _entries.size(); }
     bool empty() const noexcept { return _entries.empty(); }
@@ -149,6 +163,8 @@ public:
             entry.marker };
         if (entry.hasDate)
             item.modificationDate = Date { entry.seconds, entry.nanoseconds };
+        if (entry.hasFacts)
+            item.facts = FileFacts { { entry.seconds, entry.nanoseconds }, entry.size };
         if (entry.hasSubfolder)
             item.subfolder.emplace(*this, entry.subfolderFirst, entry.subfolderCount);
         return item;
@@ -186,6 +202,7 @@ public:
     void setFolderStatus(const ItemStatus& status) { _folderStatus = status; }
     void setProblem(FileProblem problem) { _problem = problem; }
     void setPathIsReal(bool isReal) { _pathIsReal = isReal; }
+    void setOtherRealPath(std::string path) { _otherRealPath = std::move(path); }
 
 private:
     friend class SubfolderItems;
@@ -195,8 +212,10 @@ private:
         std::uint32_t nameLength = 0;
         ItemKind kind = ItemKind::other;
     };
+    /// Folders have a modification date and other items have facts, so one date serves both.
     struct Entry {
         std::int64_t seconds = 0;
+        std::uint64_t size = 0;
         std::uint32_t nanoseconds = 0;
         std::uint32_t nameOffset = 0;
         std::uint32_t nameLength = 0;
@@ -206,6 +225,7 @@ private:
         MarkerAnswer marker = MarkerAnswer::absent;
         ItemFlags flags;
         bool hasDate = false;
+        bool hasFacts = false;
         bool hasSubfolder = false;
 
         void take(const FolderItem& item);
@@ -218,6 +238,7 @@ private:
     std::optional<ItemStatus> _folderStatus;
     FileProblem _problem = FileProblem::none;
     bool _pathIsReal = false;
+    std::string _otherRealPath;
 };
 
 /// A plain file that is open for reading; closed when destroyed. One thread at a time.
@@ -288,9 +309,12 @@ inline void FolderListing::Entry::take(const FolderItem& item)
     marker = item.marker;
     flags = item.flags;
     hasDate = item.modificationDate.has_value();
-    if (hasDate) {
-        seconds = item.modificationDate->seconds;
-        nanoseconds = item.modificationDate->nanoseconds;
+    hasFacts = !hasDate && item.facts.has_value();
+    if (hasDate || hasFacts) {
+        const Date date = hasDate ? *item.modificationDate : item.facts->creationDate;
+        seconds = date.seconds;
+        nanoseconds = date.nanoseconds;
+        size = hasFacts ? item.facts->size : 0;
     }
     hasSubfolder = item.subfolder.has_value();
     subfolderFirst = hasSubfolder ? item.subfolder->_first : 0;

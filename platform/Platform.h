@@ -3,6 +3,7 @@
 namespace platform {
 
 class Bundles;
+class Calendar;
 class Clock;
 class Console;
 class FileSystem;
@@ -29,6 +30,7 @@ struct Platform {
     NotificationCenter& notifications; ///< the process's default centre
     NotificationCenter& workspaceNotifications; ///< volumes mounted
     Clock& clock;
+    Calendar& calendar;
     Threads& threads;
     MainRunLoop& mainRunLoop;
     Console& console;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <functional>
 #include <string>
 
@@ -18,6 +19,10 @@ public:
     /// Sets the nice value (0 normal to 19 lowest) of the calling thread alone. Where the system refuses, nothing
     /// changes.
     virtual void setNiceOfCurrentThread(int nice) = 0;
+
+    /// How long the calling thread has been on a processor. Compared with the time that has passed, it tells whether
+    /// the thread works or waits.
+    virtual std::chrono::nanoseconds processorTimeOfCurrentThread() const = 0;
 };
 
 } // namespace platform

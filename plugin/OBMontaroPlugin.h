@@ -14,7 +14,9 @@
 #include <string_view>
 #include <vector>
 
+struct EventClips;
 struct EventScan;
+struct FoundEvent;
 struct ProjectScan;
 
 /// An ordered list of folders to search; immutable, replaced whole. Null until it has been prepared.
@@ -35,7 +37,8 @@ using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList
 ///   editor                   EditorDiscovery.cpp
 ///   projects                 projects/ProjectSearchPaths.cpp, ProjectFolderScan.cpp, ProjectMovies.cpp,
 ///                            ProjectReload.cpp
-///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventPreference.cpp, EventReload.cpp
+///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventClips.cpp, EventYears.cpp,
+///                            EventOrder.cpp, EventPreference.cpp, EventReload.cpp
 ///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp
 ///   user interaction         ui/Icons.cpp
 ///   operators' questions     Inspection.cpp
@@ -104,6 +107,12 @@ public:
     /// into the installed tree too.
     OBMediaGroupRef _reloadMontaroEvents_updateRootMediaGroup(const platform::Text& parentID, bool updateRoot);
     OBMediaGroupRef _reloadMontaroEvents();
+    /// One library's events, below a group that carries them; null for a folder that lists nothing.
+    OBMediaGroupRef _createMontaroEventsFolderForPath(const platform::Text& path, EventScan& scan);
+    /// Whether a folder is an event.
+    bool _isMTEvent(std::string_view path);
+    /// When a clip was recorded, where its file says so; it then bears that date for a name. Any thread.
+    virtual std::optional<platform::Date> _dateFromExtendedFileAttributeAtPath(std::string_view path);
     /// Puts the scanned events in place of the root's old ones, or nothing when they hold no media object. `library`
     /// may be null.
     void finishReloadMontaroEvents(const OBMediaGroupRef& library);
@@ -140,6 +149,14 @@ private:
     void dropAppIcon() NO_THREAD_SAFETY_ANALYSIS;
     OBMediaGroupRef projectGroup(const platform::Text& listedFolder, const platform::FolderListing& listing,
         const platform::FolderItem& item, ProjectScan& scan);
+
+    class ClipReader;
+    void walkEventLibraries(OBMediaGroup& collected, EventScan& scan);
+    OBMediaGroupRef eventGroup(
+        const platform::Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan);
+    EventClips clipsOfEvent(const platform::Text& event, const EventScan& scan);
+    void groupEventsByYear(OBMediaGroup& library, const OBMediaGroupList& events, const EventScan& scan);
+    void sortEventsWithinYears(const OBMediaGroup& library);
 
     // In the order in which they are declared. The locks exist from `init` to `dealloc`.
 

@@ -16,6 +16,9 @@ public:
     {
     }
 
+    /// Whether somebody is told of each decision.
+    bool isObserved() const { return _observer != nullptr; }
+
     /// Whether `item` of `folder` passes `rule`.
     bool passes(const ScanRule& rule, const platform::FolderItem& item, std::string_view folder) const
     {

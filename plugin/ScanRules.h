@@ -39,6 +39,19 @@ inline constexpr ScanRule isNotPackage { "package",
     [](const platform::FolderItem& item) { return !item.flags.package; }, "it is a plain folder",
     "its extension makes it a package, which is shown as one file", "remove its extension" };
 
+inline constexpr ScanRule isEventFolder { "folder",
+    [](const platform::FolderItem& item) { return item.flags.container; }, "it is a folder", "it is no folder",
+    "put it into the folder \"Original Media\" of an event" };
+
+inline constexpr ScanRule hasEventMarker { "event",
+    [](const platform::FolderItem& item) { return item.marker == platform::MarkerAnswer::present; },
+    "it holds CurrentVersion.mtrevent", "it holds no CurrentVersion.mtrevent",
+    "open the event in Montaro, which marks it" };
+
+inline constexpr ScanRule isNoFolder { "kind", [](const platform::FolderItem& item) { return !item.flags.container; },
+    "it is no folder (a clip needs no particular extension)", "it is a folder, and folders of clips are not entered",
+    "move the clips in it one folder up" };
+
 inline constexpr ScanRule hasMovieExtension { "extension",
     [](const platform::FolderItem& item) {
         return std::find(movieExtensions.begin(), movieExtensions.end(), platform::extensionOfName(item.name))

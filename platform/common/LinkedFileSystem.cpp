@@ -154,6 +154,8 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
     if (isUnsettled || (listing.problem() != FileProblem::none && !isPlainlySpelled(folder)))
         listing = listingOfWalkedFolder(folder, stopping, place);
     listing.setPathIsReal(pathIsReal);
+    if (!pathIsReal && isPlainlySpelled(place.path))
+        listing.setOtherRealPath(place.path);
     if (!listing.empty())
         lookThroughLinks(listing, { pathWithoutTrailingSlashes(folder), place.path }, request);
     return listing;
@@ -205,6 +207,7 @@ void LinkedFileSystem::lookThroughLinks(
         if (isAddedAsSpelled || contains(onDisk.links, item.name)) {
             item.kind = ItemKind::symbolicLink;
             item.flags.container = item.flags.package = false;
+            item.facts.reset();
         }
         const bool holdsAsSpelled = contains(asSpelled.holders, item.name);
         if (item.kind == ItemKind::symbolicLink)

@@ -95,6 +95,7 @@ Platform DescribedPlatform::platform() const
         .notifications = _base.notifications,
         .workspaceNotifications = _base.workspaceNotifications,
         .clock = _base.clock,
+        .calendar = _base.calendar,
         .threads = _base.threads,
         .mainRunLoop = _base.mainRunLoop,
         .console = _base.console,

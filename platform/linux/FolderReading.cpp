@@ -31,6 +31,7 @@ namespace {
         void takeBlock(const char* block, std::size_t length);
         void take(const dirent64& entry);
         static ItemKind kindOfItem(int folder, const dirent64& entry);
+        void readFacts(FolderItem& item, const char* name);
         MarkerAnswer markerInside(const char* name, ItemKind kind);
         std::optional<SubfolderItems> itemsOfSubfolder(const char* holder);
         bool readSubfolder(int folder);
@@ -84,6 +85,8 @@ namespace {
         item.name = name;
         item.kind = kindOfItem(_folder, entry);
         item.flags = flagsOfItem(name, item.kind);
+        if (_request.fileFacts)
+            readFacts(item, entry.d_name);
         if (_asksForMarker)
             item.marker = markerInside(entry.d_name, item.kind);
         if (_request.datesOfHolders && item.marker != MarkerAnswer::absent) {
@@ -112,6 +115,23 @@ namespace {
         default:
             return ItemKind::other;
         }
+    }
+
+    // Who replaces a file by a link or a folder while it is listed gets what stands there now, without facts.
+    void FolderReader::readFacts(FolderItem& item, const char* name)
+    {
+        const auto isAsked = [&] {
+            return item.kind != ItemKind::folder && item.kind != ItemKind::symbolicLink && !item.flags.invisible;
+        };
+        if (!isAsked())
+            return;
+        const auto status = readItemStatus(_folder, name, AT_SYMLINK_NOFOLLOW);
+        if (!status)
+            return;
+        item.kind = status->kind;
+        item.flags = flagsOfItem(item.name, item.kind);
+        if (isAsked())
+            item.facts = FileFacts { status->creationDate, status->size };
     }
 
     MarkerAnswer FolderReader::markerInside(const char* name, ItemKind kind)

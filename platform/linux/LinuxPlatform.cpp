@@ -7,6 +7,7 @@
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/LocalNotificationCenter.h"
 #include "platform/linux/LinuxBundles.h"
+#include "platform/linux/LinuxCalendar.h"
 #include "platform/linux/LinuxClock.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/LinuxLanguages.h"
@@ -32,6 +33,7 @@ struct LinuxPlatform::Roles {
     LocalNotificationCenter notifications {};
     LocalNotificationCenter workspaceNotifications {};
     LinuxClock clock {};
+    LinuxCalendar calendar {};
     LinuxThreads threads {};
     LinuxMainRunLoop mainRunLoop {};
     StandardErrorConsole console {};
@@ -49,8 +51,8 @@ LinuxPlatform::~LinuxPlatform() = default;
 Platform LinuxPlatform::platform()
 {
     return { _roles->linkedFiles, _roles->volumes, _roles->workspace, _roles->preferences, _roles->metadataIndex,
-        _roles->movies, _roles->notifications, _roles->workspaceNotifications, _roles->clock, _roles->threads,
-        _roles->mainRunLoop, _roles->console, _roles->bundles, _roles->languages };
+        _roles->movies, _roles->notifications, _roles->workspaceNotifications, _roles->clock, _roles->calendar,
+        _roles->threads, _roles->mainRunLoop, _roles->console, _roles->bundles, _roles->languages };
 }
 
 } // namespace platform

@@ -1,6 +1,7 @@
 #include "platform/linux/LinuxThreads.h"
 
 #include <cstddef>
+#include <ctime>
 #include <memory>
 #include <utility>
 
@@ -53,6 +54,13 @@ void LinuxThreads::setNiceOfCurrentThread(int nice)
 {
     // On Linux the nice value belongs to the thread, whatever POSIX says of processes.
     setpriority(PRIO_PROCESS, static_cast<id_t>(gettid()), nice);
+}
+
+std::chrono::nanoseconds LinuxThreads::processorTimeOfCurrentThread() const
+{
+    timespec time {};
+    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &time);
+    return std::chrono::seconds(time.tv_sec) + std::chrono::nanoseconds(time.tv_nsec);
 }
 
 } // namespace platform

@@ -9,6 +9,7 @@ class LinuxThreads : public Threads {
 public:
     bool startDetached(const std::string& name, std::function<void()> body) override;
     void setNiceOfCurrentThread(int nice) override;
+    std::chrono::nanoseconds processorTimeOfCurrentThread() const override;
 };
 
 } // namespace platform

@@ -1,4 +1,6 @@
-// Event libraries become one library group.
+// Event libraries become one library group of years and events.
+//
+// The one surprise: whether a library is watched is asked of the folder that holds it.
 
 #include "plugin/MontaroConstants.h"
 #include "plugin/SharedValues.h"
@@ -8,37 +10,85 @@
 #include "host/OBPathWatcher.h"
 #include "platform/PathText.h"
 
+#include <vector>
+
+using platform::Date;
+using platform::FolderItem;
+using platform::FolderListing;
 using platform::Locked;
 using platform::Text;
+using platform::Value;
+
+namespace {
+
+/// Names and flags of the entries, and of each whether it is an event, and since when.
+constexpr platform::ListingRequest eventListing { MontaroEventIdentifierPathComponent, true, true };
+
+OBMediaGroupRef makeGroup(
+    OBTypeIdentifierRef type, const Text& name, const Text& identifier, const Text& parentID, const OBImageRef& icon)
+{
+    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    group->setName(name);
+    group->setID(identifier);
+    group->setParentID(parentID);
+    group->setIcon(icon);
+    return group;
+}
+
+/// What all clips of all events share. They are the editor's own files, so they bear the editor's identifier.
+std::shared_ptr<const OBMediaObjectKind> clipKind()
+{
+    return std::make_shared<const OBMediaObjectKind>(OBMediaObjectKind { OBMediaTypeMovie, OBMediaSourceTypePlugin,
+        MontaroBundleIdentifier, sharedValues().smallAppIcon.load(), { OBMontaroProjectPathKey } });
+}
+
+std::vector<FoundEvent> eventsInLibrary(const ScanReport& report, const Text& library, const FolderListing& listing)
+{
+    std::vector<FoundEvent> events;
+    for (const FolderItem item : listing) {
+        if (report.passes(ScanRules::nameIsNotHidden, item, library)
+            && report.passes(ScanRules::isVisible, item, library)
+            && report.passes(ScanRules::isEventFolder, item, library)
+            && report.passes(ScanRules::hasEventMarker, item, library))
+            events.push_back({ item.name, Text::joined(library, "/", item.name), item.modificationDate });
+    }
+    return events;
+}
+
+void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newestFirst)
+{
+    const std::optional<int> year = dates.creationYear(newestFirst);
+    if (!year)
+        return;
+    Value::Dictionary attributes = event.attributes();
+    attributes.emplace_back(OBMontaroEventCreationYear, *year);
+    if (dates.oldest())
+        attributes.emplace_back(OBMontaroEventOldestClipDate, *dates.oldest());
+    if (dates.newest())
+        attributes.emplace_back(OBMontaroEventNewestClipDate, *dates.newest());
+    event.setAttributes(std::move(attributes));
+}
+
+} // namespace
 
 OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const Text& parentID, bool updateRoot)
 {
     _poolingEventsReload = false;
-    EventScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>() };
+    EventScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), clipKind(),
+        localizedString("MontaroClipNameDisplayFormat"), sharedValues().eventIcon.load(),
+        sharedValues().calendarIcon.load() };
     _flatEventGroupsList.store(scan.flatGroups);
+    const Text name = localizedString("MontaroEventLibrary");
+    const OBMediaGroupRef collected = makeGroup(OBMontaroRootGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
 
-    {
-        Locked guard(*_MontaroEventsSearchPathsLock);
-        const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
-        for (const Text& path : paths ? *paths : std::vector<Text>()) {
-            if (isCancelLoadRequestPending())
-                break;
-            // Asked of the folder that holds the library, while the library is what is watched.
-            const Text parent = platform::pathByRemovingLastComponent(path);
-            const auto watcher = OBPathWatcher::sharedPathWatcher();
-            if (watcher && watcher->watchPathIsUnique_observer(parent, this))
-                _watchPath(path);
-        }
-    }
+    walkEventLibraries(*collected, scan);
     if (isCancelLoadRequestPending())
         return nullptr;
 
-    const Text libraryName = localizedString("MontaroEventLibrary");
-    const OBMediaGroupRef library = OBMediaGroup::initWithTypeIdentifier(OBMontaroEventLibraryGroupTypeIdentifier);
-    library->setName(libraryName);
-    library->setID(libraryName);
-    library->setParentID(parentID);
-    library->setIcon(sharedValues().eventIcon.load());
+    const OBMediaGroupRef library
+        = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
+    groupEventsByYear(*library, collected->childGroups(), scan);
+    sortEventsWithinYears(*library);
     if (!isCancelLoadRequestPending() && updateRoot) {
         finishReloadMontaroEvents(library);
         if (const OBMediaGroupRef root = rootMediaGroup()) {
@@ -47,4 +97,84 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
         }
     }
     return library;
+}
+
+/// Collects the events of all libraries, one folder after the other.
+void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& scan)
+{
+    Locked guard(*_MontaroEventsSearchPathsLock);
+    const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
+    for (const Text& path : paths ? *paths : std::vector<Text>()) {
+        if (isCancelLoadRequestPending())
+            return;
+        if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
+            carrier->setParentID(OBMontaro);
+            carrier->setID(path);
+            collected.addChildGroups(carrier->childGroups());
+        }
+        // Asked of the folder that holds the library, while the library is what is watched.
+        const auto watcher = OBPathWatcher::sharedPathWatcher();
+        if (watcher && watcher->watchPathIsUnique_observer(platform::pathByRemovingLastComponent(path), this))
+            _watchPath(path);
+    }
+}
+
+bool OBMontaroPlugin::_isMTEvent(std::string_view path)
+{
+    return platform().fileSystem.exists(platform::pathJoined(path, MontaroEventIdentifierPathComponent));
+}
+
+OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& path, EventScan& scan)
+{
+    if (!path)
+        return nullptr;
+    const FolderListing listing = listFolder(path, eventListing);
+    if (listing.empty())
+        return nullptr;
+    const OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
+        localizedString("MontaroEventLibrary"), path, path, scan.calendarIcon);
+    carrier->setPath(path);
+    carrier->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
+                                                        : OBMediaGroup::modDateForFile(path));
+
+    const std::vector<FoundEvent> events = eventsInLibrary(scan.report, path, listing);
+    noteFoldersFound(events.size());
+    std::vector<EventClips> clips(events.size());
+    const auto read = [&](std::size_t index) { clips[index] = clipsOfEvent(events[index].path, scan); };
+    const auto take = [&](std::size_t index) {
+        carrier->addChildGroup(eventGroup(path, events[index], std::exchange(clips[index], {}), scan));
+    };
+    if (scan.report.isObserved()) {
+        // Whoever is told of decisions is told of them in their order.
+        for (std::size_t index = 0; index < events.size(); ++index) {
+            read(index);
+            take(index);
+        }
+    } else {
+        performInOrder(events.size(), read, take);
+    }
+    return carrier;
+}
+
+/// One event of `library`; null when it has no clips. It shows in the flat list as soon as its folder of clips has been
+/// found to hold something.
+OBMediaGroupRef OBMontaroPlugin::eventGroup(
+    const Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan)
+{
+    noteFolderRead(clips.folder, clips.problem);
+    if (!clips.hasEntries)
+        return nullptr;
+    const OBMediaGroupRef event
+        = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
+    event->setPath(found.path);
+    event->setModificationDate(
+        found.modificationDate ? found.modificationDate : OBMediaGroup::modDateForFile(found.path));
+    scan.addToFlatGroups(event);
+
+    event->setMediaObjects(clips.clips);
+    noteItemsFound(clips.clips.size());
+    if (clips.clips.empty())
+        return nullptr;
+    setAttributesOfClips(*event, clips.dates, _mostRecentEventFirst);
+    return event;
 }

@@ -2,9 +2,48 @@
 
 #include "plugin/OBMontaroPlugin.h"
 #include "plugin/ScanReport.h"
+#include "plugin/events/ClipDates.h"
 
-/// What one scan of the event libraries carries through its folders.
+#include "host/OBMediaObject.h"
+#include "host/OBMediaObjectList.h"
+#include "platform/FileSystem.h"
+
+#include <memory>
+#include <optional>
+#include <string_view>
+#include <utility>
+
+/// What one scan of the event libraries carries through its folders. Several threads read it; the list of groups is
+/// extended by the scanning thread alone.
 struct EventScan {
     ScanReport report;
     MontaroFlatGroupList flatGroups;
+    std::shared_ptr<const OBMediaObjectKind> clipKind;
+    platform::Text clipNameFormat; ///< of clips that carry the date of their recording
+    OBImageRef eventIcon;
+    OBImageRef calendarIcon;
+
+    void addToFlatGroups(OBMediaGroupRef group)
+    {
+        flatGroups->update([&](OBMediaGroupList groups) { return groups.appending(std::move(group)); });
+    }
 };
+
+/// An event folder that was found in a library.
+struct FoundEvent {
+    platform::Text name;
+    platform::Text path;
+    std::optional<platform::Date> modificationDate;
+};
+
+/// What the folder of an event's clips held when it was read.
+struct EventClips {
+    platform::Text folder {};
+    platform::FileProblem problem = platform::FileProblem::none;
+    bool hasEntries = false; ///< of any kind, clips or not
+    OBMediaObjectList clips {};
+    ClipDates dates {};
+};
+
+/// The folder in an event in which its clips lie.
+inline constexpr std::string_view clipsFolder = "Original Media";

@@ -160,6 +160,7 @@ platform::Platform HostMachine::platform()
         .notifications = base.notifications,
         .workspaceNotifications = base.workspaceNotifications,
         .clock = base.clock,
+        .calendar = base.calendar,
         .threads = threads,
         .mainRunLoop = mainRunLoop,
         .console = base.console,

@@ -60,11 +60,13 @@ private:
 class RecordingThreads : public platform::Threads {
 public:
     std::atomic<bool> refuses { false };
+    std::atomic<std::chrono::nanoseconds> processorTime {}; ///< of every thread
     std::vector<int> niceValues() const;
     std::vector<std::string> started() const;
 
     bool startDetached(const std::string& name, std::function<void()> body) override;
     void setNiceOfCurrentThread(int nice) override;
+    std::chrono::nanoseconds processorTimeOfCurrentThread() const override { return processorTime.load(); }
 
 private:
     platform::LinuxThreads _threads {};

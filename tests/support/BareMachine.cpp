@@ -79,6 +79,7 @@ platform::Platform BareMachine::platform()
         .notifications = notifications,
         .workspaceNotifications = workspaceNotifications,
         .clock = clock,
+        .calendar = _calendar,
         .threads = _threads,
         .mainRunLoop = _mainRunLoop,
         .console = console,

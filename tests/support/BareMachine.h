@@ -11,6 +11,7 @@
 #include "platform/common/FileMovies.h"
 #include "platform/common/FilePreferences.h"
 #include "platform/common/LocalNotificationCenter.h"
+#include "platform/linux/LinuxCalendar.h"
 #include "tests/support/RecordingConsole.h"
 #include "tests/support/VirtualClock.h"
 
@@ -72,6 +73,7 @@ private:
     public:
         bool startDetached(const std::string& name, std::function<void()> body) override;
         void setNiceOfCurrentThread(int) override { }
+        std::chrono::nanoseconds processorTimeOfCurrentThread() const override { return {}; }
     };
     class LoopInPlace : public platform::MainRunLoop {
     public:
@@ -107,6 +109,7 @@ private:
     platform::FilePreferences _preferences;
     platform::FileMovies _movies;
     platform::FileMetadataIndex _metadataIndex;
+    platform::LinuxCalendar _calendar {};
     ThreadsOfProcess _threads {};
     LoopInPlace _mainRunLoop {};
     NoBundles _bundles {};

@@ -182,6 +182,10 @@ public:
         return _real.startDetached(name, std::move(body));
     }
     void setNiceOfCurrentThread(int nice) override { niceValues.add(std::to_string(nice)); }
+    std::chrono::nanoseconds processorTimeOfCurrentThread() const override
+    {
+        return _real.processorTimeOfCurrentThread();
+    }
 
 private:
     platform::Threads& _real;

@@ -64,7 +64,7 @@ SourceMachine::~SourceMachine()
 platform::Platform SourceMachine::platform()
 {
     return { files, volumes, workspace, preferences, metadataIndex, movies, notifications, workspaceNotifications,
-        clock, threads, mainRunLoop, console, bundles, languages };
+        clock, calendar, threads, mainRunLoop, console, bundles, languages };
 }
 
 LibraryBuilder SourceMachine::volumeProjects(const std::string& name) const

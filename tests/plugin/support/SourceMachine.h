@@ -7,6 +7,7 @@
 #include "platform/common/LinkTable.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/linux/LinuxBundles.h"
+#include "platform/linux/LinuxCalendar.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "platform/linux/LinuxMainRunLoop.h"
 #include "platform/linux/LinuxThreads.h"
@@ -108,6 +109,7 @@ public:
     platform::LocalNotificationCenter notifications {};
     RecordingCenter workspaceNotifications {};
     VirtualClock clock {};
+    platform::LinuxCalendar calendar {};
     RecordingThreads threads { _linuxThreads };
     platform::LinuxMainRunLoop mainRunLoop {};
     RecordingConsole console {};

@@ -1,0 +1,97 @@
+#include "host/OrderedWork.h"
+
+#include "platform/Clock.h"
+#include "platform/Threads.h"
+
+#include <algorithm>
+#include <utility>
+
+OrderedWork::OrderedWork(
+    const platform::Platform& platform, ThreadStarter startThread, std::size_t count, const Job& job)
+    : _platform(platform)
+    , _startThread(std::move(startThread))
+    , _count(count)
+    , _job(job)
+    , _done(count)
+{
+}
+
+void OrderedWork::perform(const Job& take)
+{
+    std::unique_lock guard(_lock);
+    for (std::size_t index = 0; index < _count; ++index) {
+        while (!_done[index]) {
+            startThreads(guard);
+            if (canClaim())
+                runClaimed(guard);
+            else if (!_done[index])
+                _changed.wait(guard);
+        }
+        guard.unlock();
+        take(index);
+        guard.lock();
+        _taken = index + 1;
+        _changed.notify_all();
+    }
+}
+
+bool OrderedWork::canClaim() const
+{
+    return _next < std::min(_count, _taken + jobsAhead);
+}
+
+/// A further thread, until there is nothing left to begin or fewer threads will do.
+void OrderedWork::help()
+{
+    std::unique_lock guard(_lock);
+    while (_next < _count && _helpers < _threadsWanted) {
+        if (canClaim())
+            runClaimed(guard);
+        else
+            _changed.wait(guard);
+    }
+    --_helpers;
+}
+
+void OrderedWork::runClaimed(std::unique_lock<std::mutex>& guard)
+{
+    const std::size_t index = _next++;
+    guard.unlock();
+    const std::chrono::nanoseconds began = _platform.clock.monotonic();
+    const std::chrono::nanoseconds beganOnProcessor = _platform.threads.processorTimeOfCurrentThread();
+    _job(index);
+    const std::chrono::nanoseconds onProcessor = _platform.threads.processorTimeOfCurrentThread() - beganOnProcessor;
+    const std::chrono::nanoseconds passed = _platform.clock.monotonic() - began;
+    guard.lock();
+    _done[index] = true;
+    noteTimes(passed, onProcessor);
+    _changed.notify_all();
+}
+
+void OrderedWork::noteTimes(std::chrono::nanoseconds passed, std::chrono::nanoseconds onProcessor)
+{
+    _passed += passed;
+    _onProcessor += onProcessor;
+    if (++_timedJobs < jobsBetweenLooks)
+        return;
+    const bool mostlyWaits = _onProcessor * 2 < _passed;
+    _threadsWanted = mostlyWaits ? std::min(_threadsWanted * 2, threadsThatWait) : threadsAtWork;
+    _timedJobs = 0;
+    _passed = _onProcessor = {};
+}
+
+/// Helpers are started where enough is left for them to do; where the system gives none, this thread does it all.
+void OrderedWork::startThreads(std::unique_lock<std::mutex>& guard)
+{
+    while (_helpers + 1 < _threadsWanted && _next + jobsForAThread <= _count) {
+        ++_helpers;
+        guard.unlock();
+        const bool isStarted = _startThread([work = shared_from_this()] { work->help(); });
+        guard.lock();
+        if (!isStarted) {
+            --_helpers;
+            _threadsWanted = _helpers + 1;
+            return;
+        }
+    }
+}

@@ -5,6 +5,7 @@
 #include "host/OBMediaManager.h"
 
 #include <memory>
+#include <string>
 #include <string_view>
 
 /// Applies rules for one scan: counts what they keep out, and tells the observer, if there is one, what they decided.
@@ -30,11 +31,42 @@ public:
         return passed;
     }
 
+    /// What was found at one path beyond the rules for single items. `finding` answers an OBScanDecision, and is called
+    /// only where somebody listens.
+    template <class Finding> void found(const Finding& finding) const
+    {
+        if (_observer)
+            _observer->scanDecided(finding());
+    }
+    /// Likewise, of something that keeps the path out.
+    template <class Finding> void keptOut(const Finding& finding) const
+    {
+        _manager.noteItemsSkipped(1);
+        found(finding);
+    }
+
+    void libraryBegan(std::string_view path) const
+    {
+        if (_observer)
+            _observer->libraryBegan(std::string(path));
+    }
+    void objectMade(const std::string& path, const OBMediaObjectRef& object) const
+    {
+        if (_observer)
+            _observer->objectMade(path, object);
+    }
+
 private:
     void tell(const ScanRule& rule, bool passed, const platform::FolderItem& item, std::string_view folder) const
     {
-        _observer->scanDecided({ rule.name, platform::pathJoined(folder, item.name), passed,
-            std::string(passed ? rule.passed : rule.failed), std::string(passed ? std::string_view() : rule.remedy) });
+        _observer->scanDecided({ .rule = rule.name,
+            .path = platform::pathJoined(folder, item.name),
+            .passed = passed,
+            .text = std::string(passed ? rule.passed : rule.failed),
+            .remedy = std::string(passed ? std::string_view() : rule.remedy),
+            .itself = {},
+            .inside = std::string(rule.inside),
+            .insideRemedy = {} });
     }
 
     OBMediaManager& _manager;

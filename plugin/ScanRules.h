@@ -15,6 +15,7 @@ struct ScanRule {
     std::string_view passed; ///< what is so when it passes, for people
     std::string_view failed; ///< what is so when it does not
     std::string_view remedy; ///< what would make it pass
+    std::string_view inside {}; ///< why nothing in what passes is listed, unless further rules say so
 };
 
 namespace ScanRules {
@@ -31,6 +32,12 @@ inline constexpr ScanRule isVisible { "hidden file",
     [](const platform::FolderItem& item) { return !item.flags.invisible; }, "no file .hidden names it",
     "the file .hidden of its folder names it", "remove its name from the file .hidden of its folder" };
 
+inline constexpr ScanRule hasProjectMarker { "project",
+    [](const platform::FolderItem& item) { return item.marker == platform::MarkerAnswer::present; },
+    "it holds CurrentVersion.mtrproject", "it holds no CurrentVersion.mtrproject",
+    "open the project in Montaro, which marks it",
+    "of a project only the movies directly in its folder \"Shared Items\" are listed" };
+
 inline constexpr ScanRule isContainer { "folder", [](const platform::FolderItem& item) { return item.flags.container; },
     "it is a folder", "it is neither a project nor a folder",
     "move it out of the library, or share the project that it belongs to" };
@@ -46,11 +53,12 @@ inline constexpr ScanRule isEventFolder { "folder",
 inline constexpr ScanRule hasEventMarker { "event",
     [](const platform::FolderItem& item) { return item.marker == platform::MarkerAnswer::present; },
     "it holds CurrentVersion.mtrevent", "it holds no CurrentVersion.mtrevent",
-    "open the event in Montaro, which marks it" };
+    "open the event in Montaro, which marks it",
+    "of an event only the clips directly in its folder \"Original Media\" are listed" };
 
 inline constexpr ScanRule isNoFolder { "kind", [](const platform::FolderItem& item) { return !item.flags.container; },
     "it is no folder (a clip needs no particular extension)", "it is a folder, and folders of clips are not entered",
-    "move the clips in it one folder up" };
+    "move the clips in it one folder up", "a clip is not looked into" };
 
 inline constexpr ScanRule hasMovieExtension { "extension",
     [](const platform::FolderItem& item) {
@@ -59,6 +67,6 @@ inline constexpr ScanRule hasMovieExtension { "extension",
     },
     "its extension is a project movie's",
     "its extension is not one of mov, m4v, mp4, 3gp (case matters for project movies)",
-    "give it the extension mov, m4v, mp4 or 3gp" };
+    "give it the extension mov, m4v, mp4 or 3gp", "a movie is not looked into" };
 
 } // namespace ScanRules

@@ -2,7 +2,7 @@
 
 #include "platform/FileSystem.h"
 #include "platform/PathText.h"
-#include "platform/common/FileProblemText.h"
+#include "platform/FileProblemText.h"
 #include "platform/common/WholeFile.h"
 #include "platform/formats/PropertyList.h"
 

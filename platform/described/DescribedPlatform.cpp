@@ -5,7 +5,7 @@
 #include "platform/common/FileMetadataIndex.h"
 #include "platform/common/FileMovies.h"
 #include "platform/common/FilePreferences.h"
-#include "platform/common/FileProblemText.h"
+#include "platform/FileProblemText.h"
 #include "platform/common/LexicalPath.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/WholeFile.h"

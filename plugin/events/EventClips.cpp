@@ -4,6 +4,7 @@
 // and placed as that is.
 
 #include "plugin/MontaroConstants.h"
+#include "plugin/ScanFindings.h"
 #include "plugin/events/EventScan.h"
 
 #include "host/OBConstants.h"
@@ -57,10 +58,13 @@ private:
     Date _last { 0, 0 }; // before the first: no date was asked for yet
 };
 
-/// Where a file lies, and what is known of it.
+/// A file that becomes a clip.
 struct FoundFile {
-    std::string_view path {};
+    std::string_view entry; ///< what the folder of clips calls it
+    std::string_view path; ///< where it lies; elsewhere for a link
     const std::optional<platform::FileFacts>& facts;
+    bool isLinked = false;
+    bool isPlainFile = false;
 };
 
 } // namespace
@@ -82,13 +86,14 @@ public:
     EventClips read();
 
 private:
-    void take(const FolderItem& item);
-    void takeLink(const FolderItem& link);
-    void takeRecorded(std::string_view path, const Date& recorded);
+    Text realFolder() const;
+    std::string entryPath(std::string_view name) const { return platform::pathJoined(_result.folder, name); }
     bool isClip(const FolderItem& item) const;
+    void takeLink(const FolderItem& link);
+    void take(const FoundFile& file);
+    int yearOf(const FoundFile& file, const std::optional<Date>& recorded);
     std::optional<Date> fileDate(const FoundFile& file) const;
-    void countYear(const std::optional<Date>& recorded, const FoundFile& file);
-    void addClip(std::string_view name, std::string_view path);
+    void addClip(std::string_view name, const FoundFile& file);
     void addPlainClips();
 
     OBMontaroPlugin& _plugin;
@@ -96,7 +101,6 @@ private:
     YearsOfDates _years;
     const platform::FolderListing _listing;
     Text _realFolder {};
-    std::string _path {}; // of the file at hand; its folder and the slash stay
     std::vector<OBFileOfFolder> _plainClips {}; // not yet among the clips
     EventClips _result {};
 };
@@ -105,21 +109,32 @@ EventClips OBMontaroPlugin::ClipReader::read()
 {
     if (!_result.hasEntries)
         return std::move(_result);
-    _realFolder = _listing.pathIsReal()    ? _result.folder
-        : _listing.otherRealPath().empty() ? Text(_plugin.platform().fileSystem.resolvedPath(_result.folder))
-                                           : Text(_listing.otherRealPath());
-    _path = platform::pathJoined(_realFolder, "");
+    _scan.report.found([&] { return ScanFindings::moviesFolder(_result.folder, "event", _listing.size()); });
+    _realFolder = realFolder();
     _plainClips.reserve(_listing.size());
+    std::string path(_realFolder);
     for (const FolderItem item : _listing) {
         if (!_scan.report.passes(ScanRules::nameIsNotHidden, item, _result.folder))
             continue;
-        if (item.kind == ItemKind::symbolicLink)
+        if (item.kind == ItemKind::symbolicLink) {
             takeLink(item);
-        else if (isClip(item))
-            take(item);
+        } else if (isClip(item)) {
+            path.resize(_realFolder.size());
+            path.append(1, '/').append(item.name);
+            take({ item.name, path, item.facts, false, item.kind == ItemKind::file });
+        }
     }
     addPlainClips();
     return std::move(_result);
+}
+
+Text OBMontaroPlugin::ClipReader::realFolder() const
+{
+    if (_listing.pathIsReal())
+        return _result.folder;
+    if (!_listing.otherRealPath().empty())
+        return _listing.otherRealPath();
+    return _plugin.platform().fileSystem.resolvedPath(_result.folder);
 }
 
 bool OBMontaroPlugin::ClipReader::isClip(const FolderItem& item) const
@@ -128,23 +143,11 @@ bool OBMontaroPlugin::ClipReader::isClip(const FolderItem& item) const
         && _scan.report.passes(ScanRules::isNoFolder, item, _result.folder);
 }
 
-void OBMontaroPlugin::ClipReader::take(const FolderItem& item)
-{
-    _path.resize(_realFolder.size());
-    _path.append(1, '/').append(item.name);
-    const FoundFile file { _path, item.facts };
-    const std::optional<Date> recorded = _plugin._dateFromExtendedFileAttributeAtPath(_path);
-    if (recorded)
-        addClip(_plugin.platform().calendar.textOfDate(*recorded, _scan.clipNameFormat), _path);
-    else
-        _plainClips.push_back({ item.name, item.kind == ItemKind::file });
-    countYear(recorded, file);
-}
-
 void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
 {
     const platform::FileSystem& files = _plugin.platform().fileSystem;
-    const std::string path = files.resolvedPath(platform::pathJoined(_result.folder, link.name));
+    const std::string path = files.resolvedPath(entryPath(link.name));
+    _scan.report.found([&] { return ScanFindings::linkedClip(entryPath(link.name), path); });
     FolderItem target;
     target.name = link.name;
     target.flags = files.itemFlags(path);
@@ -153,11 +156,36 @@ void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
     std::optional<platform::FileFacts> facts;
     if (const auto status = files.status(path))
         facts = { status->creationDate, status->size };
-    const std::optional<Date> recorded = _plugin._dateFromExtendedFileAttributeAtPath(path);
-    addClip(recorded ? _plugin.platform().calendar.textOfDate(*recorded, _scan.clipNameFormat)
-                     : std::string(platform::nameWithoutExtension(platform::lastPathComponent(path))),
-        path);
-    countYear(recorded, { path, facts });
+    take({ link.name, path, facts, true });
+}
+
+/// A file among the clips is named and placed as its folder says; any other is a clip by itself.
+void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
+{
+    const std::optional<Date> recorded = _plugin._dateFromExtendedFileAttributeAtPath(file.path);
+    if (recorded)
+        addClip(_plugin.platform().calendar.textOfDate(*recorded, _scan.clipNameFormat), file);
+    else if (file.isLinked)
+        addClip(platform::nameWithoutExtension(platform::lastPathComponent(file.path)), file);
+    else
+        _plainClips.push_back({ file.entry, file.isPlainFile });
+    const int year = yearOf(file, recorded);
+    _scan.report.found([&] { return ScanFindings::yearOfClip(entryPath(file.entry), year); });
+}
+
+/// The year of a clip is that of its recording where that can be a year of a clip, else that of its file. Counts it for
+/// the event.
+int OBMontaroPlugin::ClipReader::yearOf(const FoundFile& file, const std::optional<Date>& recorded)
+{
+    int year = recorded ? _plugin.platform().calendar.yearOfDate(*recorded) : yearOfNoDate;
+    std::optional<Date> date = recorded;
+    if (year < 0 || year > latestRecordedYear) {
+        const std::optional<Date> ofFile = fileDate(file);
+        year = ofFile ? _years.yearOf(*ofFile) : yearOfNoDate;
+        date = recorded ? recorded : ofFile;
+    }
+    _result.dates.take(year, date);
+    return year;
 }
 
 std::optional<Date> OBMontaroPlugin::ClipReader::fileDate(const FoundFile& file) const
@@ -169,24 +197,10 @@ std::optional<Date> OBMontaroPlugin::ClipReader::fileDate(const FoundFile& file)
     return changed.date() ? std::optional(*changed.date()) : std::nullopt;
 }
 
-/// The year of a clip is that of its recording where that can be a year of a clip, else that of its file.
-void OBMontaroPlugin::ClipReader::countYear(const std::optional<Date>& recorded, const FoundFile& file)
-{
-    if (recorded) {
-        const int year = _plugin.platform().calendar.yearOfDate(*recorded);
-        if (year >= 0 && year <= latestRecordedYear) {
-            _result.dates.take(year, recorded);
-            return;
-        }
-    }
-    const std::optional<Date> date = fileDate(file);
-    _result.dates.take(date ? _years.yearOf(*date) : yearOfNoDate, recorded ? recorded : date);
-}
-
-/// A clip that does not bear the name of a file of this folder.
-void OBMontaroPlugin::ClipReader::addClip(std::string_view name, std::string_view path)
+void OBMontaroPlugin::ClipReader::addClip(std::string_view name, const FoundFile& file)
 {
     addPlainClips();
+    const Text path = file.path;
     const OBMediaObjectRef clip = OBMediaObject::initWithMediaType_name(_scan.clipKind->mediaType, name);
     clip->setMediaSourceType(_scan.clipKind->mediaSourceType);
     clip->setSourcePluginIdentifier(_scan.clipKind->sourcePluginIdentifier);
@@ -194,12 +208,17 @@ void OBMontaroPlugin::ClipReader::addClip(std::string_view name, std::string_vie
     clip->setAttribute_forKey(path, OBMontaroProjectPathKey);
     clip->setIcon(_scan.clipKind->icon);
     _result.clips = _result.clips.appending(clip);
+    _scan.report.objectMade(entryPath(file.entry), clip);
 }
 
 void OBMontaroPlugin::ClipReader::addPlainClips()
 {
-    _result.clips
-        = _result.clips.appending(OBMediaObjectBatch::objects(_scan.clipKind, { _realFolder, true }, _plainClips));
+    const OBMediaObjectList clips = OBMediaObjectBatch::objects(_scan.clipKind, { _realFolder, true }, _plainClips);
+    if (_scan.report.isObserved() && _realFolder != _result.folder) {
+        for (std::size_t index = 0; index < clips.size(); ++index)
+            _scan.report.objectMade(entryPath(_plainClips[index].name), clips[index]);
+    }
+    _result.clips = _result.clips.appending(clips);
     _plainClips.clear();
 }
 

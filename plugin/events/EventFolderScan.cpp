@@ -3,6 +3,7 @@
 // The one surprise: whether a library is watched is asked of the folder that holds it.
 
 #include "plugin/MontaroConstants.h"
+#include "plugin/ScanFindings.h"
 #include "plugin/SharedValues.h"
 #include "plugin/events/EventScan.h"
 
@@ -104,9 +105,13 @@ void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& sca
 {
     Locked guard(*_MontaroEventsSearchPathsLock);
     const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
-    for (const Text& path : paths ? *paths : std::vector<Text>()) {
+    const std::size_t count = paths ? paths->size() : 0;
+    for (std::size_t index = 0; index < count; ++index) {
         if (isCancelLoadRequestPending())
             return;
+        const Text& path = (*paths)[index];
+        scan.report.libraryBegan(path);
+        scan.report.found([&] { return ScanFindings::searchedLibrary(path, "events", index, count); });
         if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
             carrier->setParentID(OBMontaro);
             carrier->setID(path);
@@ -129,6 +134,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     if (!path)
         return nullptr;
     const FolderListing listing = listFolder(path, eventListing);
+    scan.report.found([&] { return ScanFindings::listedFolder(path, listing); });
     if (listing.empty())
         return nullptr;
     const OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
@@ -162,8 +168,10 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
     const Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan)
 {
     noteFolderRead(clips.folder, clips.problem);
-    if (!clips.hasEntries)
+    if (!clips.hasEntries) {
+        scan.report.keptOut([&] { return ScanFindings::eventWithoutClipsFolder(found.path, clips.problem); });
         return nullptr;
+    }
     const OBMediaGroupRef event
         = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
     event->setPath(found.path);
@@ -173,8 +181,10 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
 
     event->setMediaObjects(clips.clips);
     noteItemsFound(clips.clips.size());
-    if (clips.clips.empty())
+    if (clips.clips.empty()) {
+        scan.report.keptOut([&] { return ScanFindings::eventWithoutClips(found.path); });
         return nullptr;
+    }
     setAttributesOfClips(*event, clips.dates, _mostRecentEventFirst);
     return event;
 }

@@ -4,6 +4,7 @@
 // scan, tagged as a project group.
 
 #include "plugin/MontaroConstants.h"
+#include "plugin/ScanFindings.h"
 #include "plugin/SharedValues.h"
 #include "plugin/projects/ProjectScan.h"
 
@@ -34,6 +35,15 @@ std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin
         plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey } });
 }
 
+/// What is no project is not left out for that.
+bool isProject(const ScanReport& report, const FolderItem& item, const Text& folder)
+{
+    if (ScanRules::hasProjectMarker.passes(item))
+        return report.passes(ScanRules::hasProjectMarker, item, folder);
+    report.found([&] { return ScanFindings::noProject(platform::pathJoined(folder, item.name)); });
+    return false;
+}
+
 OBMediaGroupRef groupForFolder(
     OBTypeIdentifierRef type, std::string_view name, const Text& path, const Text& parentID, const OBImageRef& icon)
 {
@@ -59,9 +69,13 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
     {
         Locked guard(*_MontaroSearchPathsLock);
         const MontaroSearchPaths paths = _MontaroSearchPaths.load();
-        for (const Text& path : paths ? *paths : std::vector<Text>()) {
+        const std::size_t count = paths ? paths->size() : 0;
+        for (std::size_t index = 0; index < count; ++index) {
             if (isCancelLoadRequestPending())
                 break;
+            const Text& path = (*paths)[index];
+            scan.report.libraryBegan(path);
+            scan.report.found([&] { return ScanFindings::searchedLibrary(path, "projects", index, count); });
             if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
                 library->setName(localizedString("MontaroProjectLibrary"));
                 library->setTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
@@ -114,11 +128,12 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
     }
 
     noteFoldersFound(listing.size());
+    scan.report.found([&] { return ScanFindings::listedFolder(listed, listing); });
     for (const FolderItem item : listing) {
         if (!scan.report.passes(ScanRules::nameIsNotHidden, item, listed)
             || !scan.report.passes(ScanRules::isVisible, item, listed))
             continue;
-        if (item.marker == platform::MarkerAnswer::present) {
+        if (isProject(scan.report, item, listed)) {
             folder->addChildGroup(projectGroup(listed, listing, item, scan));
         } else if (scan.report.passes(ScanRules::isContainer, item, listed)
             && scan.report.passes(ScanRules::isNotPackage, item, listed)) {

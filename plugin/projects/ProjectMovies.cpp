@@ -37,6 +37,8 @@ SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& re
     SharedMovies movies(project);
     movies.listing = manager.listFolder(movies.folder.path, {});
     movies.folder.pathIsReal = movies.listing.pathIsReal();
+    if (movies.listing.empty())
+        report.found([&] { return ScanFindings::listedFolder(movies.folder.path, movies.listing); });
     movies.take(report, movies.listing);
     return movies;
 }

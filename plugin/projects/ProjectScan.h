@@ -1,6 +1,7 @@
 #pragma once
 
 #include "plugin/OBMontaroPlugin.h"
+#include "plugin/ScanFindings.h"
 #include "plugin/ScanReport.h"
 
 #include "host/OBMediaObject.h"
@@ -42,6 +43,8 @@ struct SharedMovies {
 
     template <class Items> void take(const ScanReport& report, const Items& items)
     {
+        if (items.size() != 0)
+            report.found([&] { return ScanFindings::moviesFolder(folder.path, "project", items.size()); });
         files.reserve(items.size());
         for (std::size_t index = 0; index < items.size(); ++index) {
             const platform::FolderItem item = items[index];

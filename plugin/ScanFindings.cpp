@@ -1,0 +1,113 @@
+#include "plugin/ScanFindings.h"
+
+#include "platform/FileProblemText.h"
+
+#include <string>
+
+using platform::FileProblem;
+
+namespace {
+
+std::string ordinal(std::size_t number)
+{
+    const std::size_t last = number % 10;
+    const bool isTeen = number % 100 / 10 == 1;
+    const char* ending = isTeen || last == 0 || last > 3 ? "th" : last == 1 ? "st" : last == 2 ? "nd" : "rd";
+    return std::to_string(number) + ending;
+}
+
+std::string entriesText(std::size_t count)
+{
+    return std::to_string(count) + (count == 1 ? " entry" : " entries");
+}
+
+OBScanDecision finding(std::string_view rule, std::string_view path, std::string text)
+{
+    OBScanDecision decision;
+    decision.rule = rule;
+    decision.path = std::string(path);
+    decision.text = std::move(text);
+    return decision;
+}
+
+std::string remedyOfProblem(FileProblem problem, std::string_view path)
+{
+    switch (problem) {
+    case FileProblem::notPermitted:
+        return "allow reading it: chmod u+rx '" + std::string(path) + "'";
+    case FileProblem::pathTooLong:
+        return "move it to a place with a shorter path";
+    default:
+        return {};
+    }
+}
+
+} // namespace
+
+OBScanDecision ScanFindings::searchedLibrary(
+    std::string_view path, std::string_view what, std::size_t index, std::size_t count)
+{
+    OBScanDecision decision = finding("search folder", path,
+        ordinal(index + 1) + " of " + std::to_string(count) + " that are searched for " + std::string(what));
+    decision.itself = "a library shows what it holds, not itself";
+    return decision;
+}
+
+OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform::FolderListing& listing)
+{
+    if (listing.problem() == FileProblem::none || !listing.empty())
+        return finding("listing", path, "it holds " + entriesText(listing.size()));
+    const std::string problem(platform::textOfFileProblem(listing.problem()));
+    OBScanDecision decision = finding("listing", path, "what it holds is not listed: " + problem);
+    decision.inside = "the folder that holds it cannot be listed: " + problem;
+    decision.insideRemedy = remedyOfProblem(listing.problem(), path);
+    return decision;
+}
+
+OBScanDecision ScanFindings::noProject(std::string_view path)
+{
+    return finding("project", path, "it holds no CurrentVersion.mtrproject, so it is no project");
+}
+
+OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries)
+{
+    OBScanDecision decision = finding("movies folder", path, "it holds " + entriesText(entries));
+    decision.itself = "a folder of movies is shown as its " + std::string(shownAs);
+    return decision;
+}
+
+OBScanDecision ScanFindings::eventWithoutClipsFolder(std::string_view path, FileProblem problem)
+{
+    const bool isMissing = problem == FileProblem::missing || problem == FileProblem::notAFolder;
+    OBScanDecision decision = finding("clips folder", path,
+        isMissing ? "it has no folder \"Original Media\""
+            : problem == FileProblem::none
+            ? "its folder \"Original Media\" is empty"
+            : "its folder \"Original Media\" cannot be listed: " + std::string(platform::textOfFileProblem(problem)));
+    decision.passed = false;
+    decision.remedy = problem == FileProblem::none || isMissing
+        ? "put its clips into a folder \"Original Media\""
+        : remedyOfProblem(problem, std::string(path) + "/Original Media");
+    return decision;
+}
+
+OBScanDecision ScanFindings::eventWithoutClips(std::string_view path)
+{
+    OBScanDecision decision = finding("clips", path, "nothing in its folder \"Original Media\" is a clip");
+    decision.passed = false;
+    decision.remedy = "put a clip into its folder \"Original Media\"";
+    return decision;
+}
+
+OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target)
+{
+    return finding("link", path, "it leads to " + std::string(target));
+}
+
+OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year)
+{
+    OBScanDecision decision = finding("year", path,
+        year < 0 ? std::string("it has no date, so its year is -1") : "it was made in " + std::to_string(year));
+    decision.inside = "a clip is not looked into";
+    return decision;
+}

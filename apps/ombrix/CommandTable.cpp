@@ -5,6 +5,8 @@
 namespace ombrix {
 namespace {
 
+    constexpr std::size_t anyNumber = static_cast<std::size_t>(-1);
+
     constexpr OptionInfo json { "--json", "", "", "print one JSON document, every key always there" };
     constexpr OptionInfo zero { "-0", "", "", "end every path with a zero byte instead of a line feed" };
     constexpr OptionInfo group { "--group", "", "ID", "the group; the first with that ID counts" };
@@ -52,6 +54,15 @@ namespace {
         { "ombrix info --json | jq .canLoadData", "whether a tree can be loaded" },
     };
 
+    constexpr OptionInfo explainOptions[] {
+        { "-0", "", "", "read paths from standard input, each ended by a zero byte: -0 -" },
+        { "--json", "", "", "print one JSON document a path, one a line" },
+    };
+    constexpr Example explainExamples[] {
+        { "ombrix explain final.MOV", "why a file is, or is not, listed" },
+        { "find ~/Movies -print0 | ombrix explain -0 - --json", "every file there is" },
+    };
+
     constexpr OptionInfo messageOptions[] { group };
     constexpr Example messageExamples[] {
         { "ombrix message --group Montaro", "why the whole tree is empty" },
@@ -88,6 +99,10 @@ namespace {
             pathsOptions, pathsExamples, runPaths },
         { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
             "Prints what is known of the source without loading its tree.", infoOptions, infoExamples, runInfo },
+        { "explain", Intent::ask, "PATH...", anyNumber, "say why files and folders are or are not in the tree",
+            "Loads once and prints, for each path, every rule that it met on its way, the\n"
+            "verdict, and what would make it appear. The path need not exist.",
+            explainOptions, explainExamples, runExplain },
         { "message", Intent::ask, "", 0, "say what an empty group tells the user",
             "Loads once and prints the text that is shown for the group while it is empty;\n"
             "nothing when there is none.",

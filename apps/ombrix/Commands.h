@@ -11,6 +11,7 @@ int runGroups(Program& program);
 int runObjects(Program& program);
 int runPaths(Program& program);
 int runInfo(Program& program);
+int runExplain(Program& program);
 int runMessage(Program& program);
 int runPlugins(Program& program);
 int runHelp(Program& program);

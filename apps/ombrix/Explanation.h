@@ -1,0 +1,62 @@
+#pragma once
+
+#include "apps/ombrix/ScanRecord.h"
+#include "apps/ombrix/TreePlaces.h"
+#include "platform/FileSystem.h"
+
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace ombrix {
+
+/// One rule that was met on the way to a path.
+struct ExplainedStep {
+    std::string rule;
+    std::string path;
+    bool passed = true;
+    std::string text;
+};
+
+/// Why a path is, or is not, in the tree.
+struct Explanation {
+    std::string path;
+    std::vector<TreePlace> places {}; ///< the records that stand for it; none when it is not listed
+    std::vector<ExplainedStep> steps {}; ///< in the order in which the scan meets them, the deciding one last
+    std::string remedy {}; ///< what would make it appear; empty when nothing is known
+
+    bool isListed() const { return !places.empty(); }
+};
+
+/// Explains paths by what a scan told of them and by the tree that it made, which therefore never disagree.
+class Explainer {
+public:
+    /// All that is handed over outlives this object. `folders` are those that are searched.
+    Explainer(const platform::FileSystem& fileSystem, const std::vector<std::string>& folders, const ScanRecord& record,
+        const TreePlaces& places)
+        : _fileSystem(fileSystem)
+        , _folders(folders)
+        , _record(record)
+        , _places(places)
+    {
+    }
+
+    Explanation explain(const std::string& path) const;
+
+private:
+    struct Way;
+    Way wayThrough(const ScanRecord::Library& library, const std::string& path, bool isListed) const;
+    void endBelow(Way& way, const std::vector<const OBScanDecision*>& decisions, const std::string& path) const;
+    Way wayOutside(const std::string& path) const;
+    Way chosenWay(const Explanation& explanation) const;
+    const ScanRecord::Made* entryOf(const std::string& path) const;
+    std::string firstMissing(std::string_view folder, std::string_view path) const;
+
+    const platform::FileSystem& _fileSystem;
+    const std::vector<std::string>& _folders;
+    const ScanRecord& _record;
+    const TreePlaces& _places;
+};
+
+} // namespace ombrix

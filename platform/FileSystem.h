@@ -156,6 +156,8 @@ public:
 
     std::size_t size() const noexcept { return _entries.size(); }
     bool empty() const noexcept { return _entries.empty(); }
+    /// Whether an item is a link, or may hold a linked marker.
+    bool hasLinks() const noexcept { return _hasLinks; }
     FolderItem operator[](std::size_t index) const
     {
         const Entry& entry = _entries[index];
@@ -207,6 +209,10 @@ public:
 private:
     friend class SubfolderItems;
     FolderItem adopted(const FolderItem& item);
+    void noteLinks(const FolderItem& item)
+    {
+        _hasLinks = _hasLinks || item.kind == ItemKind::symbolicLink || item.marker == MarkerAnswer::link;
+    }
     struct SubfolderEntry {
         std::uint32_t nameOffset = 0;
         std::uint32_t nameLength = 0;
@@ -238,6 +244,7 @@ private:
     std::optional<ItemStatus> _folderStatus;
     FileProblem _problem = FileProblem::none;
     bool _pathIsReal = false;
+    bool _hasLinks = false;
     std::string _otherRealPath;
 };
 
@@ -368,12 +375,14 @@ inline void FolderListing::append(const FolderItem& item)
     entry.nameLength = static_cast<std::uint32_t>(item.name.size());
     _names.append(item.name);
     entry.take(own);
+    noteLinks(own);
 }
 
 inline void FolderListing::setItem(std::size_t index, const FolderItem& item)
 {
     const FolderItem own = adopted(item);
     _entries[index].take(own);
+    noteLinks(own);
 }
 
 } // namespace platform

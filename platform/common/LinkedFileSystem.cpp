@@ -33,6 +33,8 @@ namespace {
     struct AddedNames {
         std::vector<std::string> links;
         std::vector<std::string> holders;
+
+        bool isEmpty() const { return links.empty() && holders.empty(); }
     };
 
     AddedNames addedNames(const LinkTable& table, std::string_view folder, std::string_view marker)
@@ -200,6 +202,8 @@ void LinkedFileSystem::lookThroughLinks(
     const AddedNames asSpelled = addedNames(_table, folder.spelled, request.marker);
     const AddedNames onDisk
         = folder.real == folder.spelled ? AddedNames {} : addedNames(_table, folder.real, request.marker);
+    if (asSpelled.isEmpty() && onDisk.isEmpty() && !listing.hasLinks())
+        return;
     bool hiddenNamesAreLinked = contains(asSpelled.links, hiddenNamesFile) || contains(onDisk.links, hiddenNamesFile);
     for (std::size_t index = 0; index < listing.size(); ++index) {
         FolderItem item = listing[index];

@@ -73,21 +73,21 @@ int compareNewestFirst(const EventOrderKey& receiver, const EventOrderKey& other
 
 std::vector<OBMediaGroupRef> eventsInOrder(const std::vector<OBMediaGroupRef>& events, bool newestFirst)
 {
-    struct Event {
-        EventOrderKey key;
-        OBMediaGroupRef group;
-    };
-    std::vector<Event> keyed;
+    std::vector<EventOrderKey> keyed;
     keyed.reserve(events.size());
     for (const OBMediaGroupRef& event : events)
-        keyed.push_back({ EventOrderKey(*event), event });
-    keyed = mergeSorted(std::move(keyed), [newestFirst](const Event& receiver, const Event& other) {
-        return newestFirst ? compareNewestFirst(receiver.key, other.key) : compareOldestFirst(receiver.key, other.key);
+        keyed.emplace_back(*event);
+    std::vector<const EventOrderKey*> order;
+    order.reserve(keyed.size());
+    for (const EventOrderKey& key : keyed)
+        order.push_back(&key);
+    order = mergeSorted(std::move(order), [newestFirst](const EventOrderKey* receiver, const EventOrderKey* other) {
+        return newestFirst ? compareNewestFirst(*receiver, *other) : compareOldestFirst(*receiver, *other);
     });
     std::vector<OBMediaGroupRef> sorted;
-    sorted.reserve(keyed.size());
-    for (Event& event : keyed)
-        sorted.push_back(std::move(event.group));
+    sorted.reserve(order.size());
+    for (const EventOrderKey* key : order)
+        sorted.push_back(events[static_cast<std::size_t>(key - keyed.data())]);
     return sorted;
 }
 

@@ -100,7 +100,8 @@ std::string helpText(const CommandInfo& command)
 
 std::string versionText()
 {
-    return "ombrix " + std::string(version) + " (host interface " + std::to_string(OBHostInterfaceVersion) + ")\n";
+    return "ombrix " + std::string(version) + " (host interface " + std::to_string(OBHostInterfaceVersion) + "."
+        + std::to_string(OBHostInterfaceMinorVersion) + ")\n";
 }
 
 int runHelp(Program& program)

@@ -193,7 +193,7 @@ TEST_CASE("help and the version go to standard output")
     CHECK(help.errors.empty());
     CHECK(help.output == runProgram({ { "help" }, {}, {} }).output);
     CHECK(runProgram({ { "tree", "-h" }, {}, {} }).output == runProgram({ { "help", "tree" }, {}, {} }).output);
-    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1)\n"));
+    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1.0)\n"));
 }
 
 TEST_CASE("logs go to standard error from level 2 on, one line each")

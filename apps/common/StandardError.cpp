@@ -16,8 +16,6 @@
 namespace apps {
 namespace {
 
-    constexpr int longestProgress = 500;
-
     // What a signal handler needs lies in atomics: it may interrupt whoever holds the lock.
     std::atomic<int> shownColumns { 0 };
     std::atomic<bool> isWriting { false };

@@ -7,6 +7,9 @@ namespace apps {
 // Standard error of this process, of which there is one: lines for people, and at its end one line of progress that
 // vanishes without a trace, also when a signal ends the process. No escape sequences. Any thread.
 
+/// The most columns that a line of progress can have.
+inline constexpr int longestProgress = 500;
+
 /// Prints `line` and a line feed; progress that is shown is erased first.
 void printError(std::string_view line);
 

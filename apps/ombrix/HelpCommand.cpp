@@ -48,10 +48,10 @@ namespace {
         if (!command.operands.empty())
             usage.append(" ").append(command.operands);
         for (const OptionInfo& option : command.options) {
-            usage.append(" [").append(option.name);
+            usage.append(option.isRequired ? " " : " [").append(option.name);
             if (!option.value.empty())
                 usage.append(" ").append(option.value);
-            usage += "]";
+            usage += option.isRequired ? "" : "]";
         }
         return usage + "\n";
     }

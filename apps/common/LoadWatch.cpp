@@ -47,7 +47,6 @@ struct LoadWatch::Watching {
 
     void run()
     {
-        leaveSignalsToOtherThreads();
         auto delay = std::chrono::nanoseconds(untilFirstLine);
         while (platform.clock.sleep(delay, ended)) {
             tell(manager->loadProgress());

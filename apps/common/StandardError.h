@@ -1,5 +1,6 @@
 #pragma once
 
+#include <csignal>
 #include <string_view>
 
 namespace apps {
@@ -21,7 +22,17 @@ void eraseProgress();
 /// that is ignored stays so.
 void eraseProgressOnSignals();
 
-/// Signals are handled on other threads than the calling one.
-void leaveSignalsToOtherThreads();
+/// While it lives, those signals wait for the calling thread or go to another; threads that it starts meanwhile never
+/// get one.
+class EndingSignalsHeld {
+public:
+    EndingSignalsHeld();
+    ~EndingSignalsHeld();
+    EndingSignalsHeld(const EndingSignalsHeld&) = delete;
+    EndingSignalsHeld& operator=(const EndingSignalsHeld&) = delete;
+
+private:
+    sigset_t _before {};
+};
 
 } // namespace apps

@@ -3,8 +3,10 @@
 #include "apps/common/HostileNames.h"
 #include "apps/common/StandardError.h"
 #include "apps/common/Terminal.h"
+#include "platform/ThreadSafety.h"
 
 #include <charconv>
+#include <set>
 #include <utility>
 #include <vector>
 
@@ -24,13 +26,33 @@ namespace {
         return error == std::errc() && level >= lowestLogWish ? level : 0;
     }
 
-    void printLog(std::string_view message, int level, const OBMediaManager* sender)
+    std::string logLine(std::string_view message, int level, const OBMediaManager* sender)
     {
         const std::string identifier = sender ? sender->pluginIdentifier().string() : std::string();
         const std::size_t dot = identifier.rfind('.');
         const std::string name = identifier.empty() ? "OmbrixMediaBrowser" : identifier.substr(dot + 1);
-        printError(name + "[" + std::to_string(level) + "]: " + escapedText(message));
+        return name + "[" + std::to_string(level) + "]: " + escapedText(message);
     }
+
+    /// Prints each log once. A source logs the same at every question that has the same answer, and one command asks
+    /// several.
+    class LogPrinter {
+    public:
+        void print(std::string line)
+        {
+            constexpr std::size_t most = 10'000; // what is told once more costs less than memory without end
+            platform::Locked guard(_lock);
+            if (_printed.size() == most)
+                _printed.clear();
+            const auto [printed, isNew] = _printed.insert(std::move(line));
+            if (isNew)
+                printError(*printed);
+        }
+
+    private:
+        platform::Mutex _lock;
+        std::set<std::string> _printed GUARDED_BY(_lock);
+    };
 
     std::vector<std::string> foldersOfPluginPath()
     {
@@ -49,9 +71,10 @@ namespace {
     {
         OBHostOptions options { foldersOfPluginPath(), {} };
         if (const int wanted = wantedLogLevel()) {
-            options.logSink = [wanted](std::string_view message, int level, const OBMediaManager* sender) {
+            options.logSink = [wanted, printer = std::make_shared<LogPrinter>()](
+                                  std::string_view message, int level, const OBMediaManager* sender) {
                 if (level <= wanted)
-                    printLog(message, level, sender);
+                    printer->print(logLine(message, level, sender));
             };
         }
         return options;

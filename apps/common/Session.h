@@ -18,7 +18,7 @@ struct SessionWishes {
 /// A machine with the framework on it, and the manager of one source once it is asked for.
 ///
 /// Bundles are searched in the folders of OMBRIX_PLUGIN_PATH first. Logs go to standard error, one line each, where
-/// OMBRIX_LOG is 2 or higher: those of that level and below.
+/// OMBRIX_LOG is 2 or higher: those of that level and below. The same line is printed once.
 class Session {
 public:
     Session(std::unique_ptr<Machine> machine, std::string source);

@@ -75,14 +75,14 @@ namespace {
         return { digits, end.ptr };
     }
 
-    std::string editorText(Program& program, OBMediaManager& manager)
+    std::string editorText(Program& program, OBMediaManager& manager, bool canLoad)
     {
         if (!manager.appInstalled())
             return "not installed";
         const Text path = manager.getAppPath();
         const Text version = manager.applicationVersion();
         return program.style().name(path) + (version ? " (" + version.string() + ")" : std::string())
-            + (manager.canLoadData() ? "" : ", but nothing exists there");
+            + (canLoad ? "" : ", but nothing exists there");
     }
 
     std::string countsText(
@@ -138,11 +138,12 @@ namespace {
     {
         TextLine title(program.style(), program.columns());
         title.addBehind(program.style().name(manager.displayName()), TextLine::Look::bold);
-        const std::string state = manager.canLoadData() ? "ready, " : "cannot load, ";
+        const bool canLoad = manager.canLoadData();
+        const std::string state = canLoad ? "ready, " : "cannot load, ";
         title.addBehind(
             "   " + state + manager.pluginIdentifier().string() + " " + manager.pluginBundle().manifest().version);
         program.printLine(title.text());
-        printFact(program, "editor", editorText(program, manager));
+        printFact(program, "editor", editorText(program, manager, canLoad));
         if (OBSourceInspection* inspection = manager.inspection()) {
             printLibraries(program, manager, *inspection);
             if (const std::optional<bool> newest = inspection->mostRecentEventFirst())

@@ -1,6 +1,7 @@
 #include "apps/ombrix/SearchFolders.h"
 
 #include "apps/ombrix/ProblemText.h"
+#include "platform/PathText.h"
 
 namespace ombrix {
 
@@ -8,12 +9,15 @@ using platform::FileProblem;
 
 FileProblem searchProblem(const platform::FileSystem& fileSystem, std::string_view folder)
 {
-    const FileProblem problem = fileSystem.itemsInFolder(folder, {}).problem();
-    if (problem == FileProblem::notAFolder && !fileSystem.exists(folder))
+    const platform::FolderListing listing = fileSystem.itemsInFolder(folder, {});
+    if (listing.problem() == FileProblem::notAFolder && !fileSystem.exists(folder))
         return FileProblem::missing;
-    if (problem == FileProblem::none && !fileSystem.exists(std::string(folder) + "/."))
-        return FileProblem::notPermitted;
-    return problem;
+    if (listing.problem() == FileProblem::none && !listing.empty()) {
+        const std::string item = platform::pathJoined(folder, listing[0].name);
+        if (!fileSystem.linkStatus(item) && fileSystem.openPlainFile(item).problem == FileProblem::notPermitted)
+            return FileProblem::notPermitted;
+    }
+    return listing.problem();
 }
 
 std::string searchStateText(FileProblem problem)

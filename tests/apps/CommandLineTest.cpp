@@ -224,6 +224,25 @@ TEST_CASE("help and the version go to standard output")
     CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1.0)\n"));
 }
 
+TEST_CASE("a log of one cause is one line, however many questions a command asks")
+{
+    const TemporaryFolder folder;
+    const std::string file = folder.file("machine.json", "{\"home\": \"home\"}");
+    for (const char* domain : { "org.ombrix.Montaro", "org.ombrix.browser" })
+        folder.file("home/Library/Preferences/" + std::string(domain) + ".plist", "damaged");
+    for (const auto& words : { std::vector<std::string> { "info" }, std::vector<std::string> { "info", "--json" },
+             std::vector<std::string> { "paths" }, std::vector<std::string> { "tree" } }) {
+        RunWishes wishes { words, { { "OMBRIX_LOG", "2" } }, {} };
+        wishes.arguments.insert(wishes.arguments.end(), { "--machine", file });
+        const std::string errors = runProgram(wishes).errors;
+        CAPTURE(errors);
+        for (const char* cause : { "could not find Montaro", "org.ombrix.Montaro.plist", "org.ombrix.browser.plist" }) {
+            CHECK(contains(errors, cause));
+            CHECK(errors.find(cause) == errors.rfind(cause));
+        }
+    }
+}
+
 TEST_CASE("logs go to standard error from level 2 on, one line each")
 {
     const TemporaryFolder folder;

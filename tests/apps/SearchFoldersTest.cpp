@@ -34,7 +34,10 @@ TEST_CASE("a folder whose names may be listed but not looked at cannot be read")
 {
     Machine machine;
     const std::string library = machine.folder.folder("library");
+    machine.folder.file("library/item");
     machine.files.whenAskedForStatus = [&](std::string_view path) { return path == library; };
+    CHECK(searchProblem(machine.files, library) == FileProblem::none);
+    machine.files.whenOpening = [](std::string_view) { return FileProblem::notPermitted; };
     CHECK(searchProblem(machine.files, library) == FileProblem::notPermitted);
 }
 

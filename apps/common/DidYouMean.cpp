@@ -1,6 +1,6 @@
 #include "apps/common/DidYouMean.h"
 
-#include "platform/formats/Quoted.h"
+#include "apps/common/HostileNames.h"
 #include "platform/formats/Suggestion.h"
 
 #include <algorithm>
@@ -9,9 +9,10 @@
 namespace apps {
 namespace {
 
+    /// Whole, however long it is: it is there to be typed.
     std::string suggestionText(std::string_view suggestion)
     {
-        return " (did you mean " + platform::quoted(suggestion) + "?)";
+        return " (did you mean \"" + escapedText(suggestion) + "\"?)";
     }
 
     std::string_view withoutHyphens(std::string_view option)

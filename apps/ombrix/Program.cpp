@@ -152,17 +152,22 @@ Program::GroupAnswer Program::loadGroupOfOption()
     return { std::move(group), done };
 }
 
-void Program::warnOfUnreadFolders()
+std::string Program::unreadFoldersText()
 {
     const std::vector<OBLoadProblem> problems = manager()->loadProblems();
     if (problems.empty())
-        return;
+        return {};
     const std::string first
         = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
     if (problems.size() == 1)
-        warn(first);
-    else
-        warn(std::to_string(problems.size()) + " folders could not be read, the first: " + first);
+        return first;
+    return std::to_string(problems.size()) + " folders could not be read, the first: " + first;
+}
+
+void Program::warnOfUnreadFolders()
+{
+    if (const std::string text = unreadFoldersText(); !text.empty())
+        warn(text);
 }
 
 int Program::finish(int status)

@@ -62,6 +62,8 @@ public:
     };
     /// Loads, and answers the first group with the ID in option --group.
     GroupAnswer loadGroupOfOption();
+    /// One line about the folders that the load could not read; empty when there are none.
+    std::string unreadFoldersText();
     /// Warns in one line of the folders that the load could not read.
     void warnOfUnreadFolders();
 

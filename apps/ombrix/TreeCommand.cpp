@@ -19,6 +19,7 @@
 #include "platform/PathText.h"
 
 #include <algorithm>
+#include <map>
 
 namespace ombrix {
 namespace {
@@ -116,6 +117,16 @@ namespace {
         return 1 + std::max(0, apps::displayWidth(text) - 1) / columns;
     }
 
+    /// The footer, a warning before it, and the shell's next prompt.
+    int linesBelowTree(Program& program, const std::optional<std::string>& footer)
+    {
+        const int columns = program.columns().value_or(1);
+        const std::string unread = program.unreadFoldersText();
+        if (!footer)
+            return 1;
+        return 1 + linesOf(*footer, columns) + (unread.empty() ? 0 : linesOf("ombrix: warning: " + unread, columns));
+    }
+
     void printText(Program& program, OBMediaManager& manager, const OBMediaGroupRef& root, const OBMediaGroupRef& group,
         const std::optional<std::string>& footer)
     {
@@ -124,12 +135,18 @@ namespace {
         const std::optional<int> columns = program.columns();
         TreeTextWishes wishes { program.style(), columns, platform.clock.now() };
         wishes.emptyMessage = [&manager](const OBMediaGroupRef& empty) { return manager.defaultNoDataMessage(empty); };
-        wishes.unfoldingCommand
-            = [&](const OBMediaGroupRef& folded) { return unfoldingCommand(program.arguments(), root, folded); };
+        // Asked again at every attempt to fit the tree, and each answer searches it for the name.
+        std::map<const OBMediaGroup*, std::string> commands;
+        wishes.unfoldingCommand = [&](const OBMediaGroupRef& folded) {
+            std::string& command = commands[folded.get()];
+            if (command.empty())
+                command = unfoldingCommand(program.arguments(), root, folded);
+            return command;
+        };
         wishes.linkTarget = [&platform](std::string_view path) { return platform.fileSystem.resolvedPath(path); };
         const bool isFolded = columns && group == root && !program.arguments().has("--all");
-        const int linesBelow = 1 + (footer && columns ? linesOf(*footer, *columns) : 0);
-        const std::vector<TreeLine> lines = isFolded ? linesThatFit(nodes, wishes, linesBelow) : unfoldedLines(nodes);
+        const std::vector<TreeLine> lines
+            = isFolded ? linesThatFit(nodes, wishes, linesBelowTree(program, footer)) : unfoldedLines(nodes);
         (void)printTreeText(nodes, lines, wishes, [&program](std::string_view line) { program.printLine(line); });
     }
 

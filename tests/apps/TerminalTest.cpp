@@ -1,3 +1,4 @@
+#include "apps/common/DisplayWidth.h"
 #include "tests/apps/ProgramRun.h"
 #include "tests/support/DescribedMachine.h"
 #include "tests/support/LibraryBuilder.h"
@@ -123,6 +124,45 @@ TEST_CASE("IDs are whole on a terminal, and other columns line up")
         CHECK(contains(run.output, "A project"));
         CHECK(contains(run.output, "…"));
     }
+}
+
+TEST_CASE("of what was left out the path loses its middle and the reason is wrapped, not cut")
+{
+    const LargeMachine machine;
+    LibraryBuilder(machine.folder.path("home/Movies/Montaro Projects"))
+        .project("Clients/Long")
+        .movieWithBytes("a movie whose name is longer than it ought to be.MOV", "no movie");
+    for (const int columns : { 60, 80 }) {
+        const ProgramRun run
+            = runOnTerminal(machine.wishes({ "tree", "Clients", "--skipped", "--color=never" }), { 24, columns });
+        const std::size_t start = run.output.find("\n\n") + 2;
+        std::string_view rest = std::string_view(run.output).substr(start, run.output.find("\n1 item skipped") - start);
+        const std::string_view path = rest.substr(0, rest.find('\n'));
+        CHECK(path.starts_with(machine.folder.path().substr(0, 10)));
+        CHECK(path.find("…") != std::string_view::npos);
+        CHECK(path.ends_with(".MOV"));
+        std::string reason;
+        while (!rest.empty()) {
+            const std::string_view line = rest.substr(0, rest.find('\n'));
+            CHECK(apps::displayWidth(line) <= columns);
+            reason += line.substr(std::min<std::size_t>(3, line.size()));
+            rest.remove_prefix(std::min(rest.size(), line.size() + 1));
+        }
+        CHECK(contains(reason, "to list it, give it the extension mov, m4v, mp4 or 3gp"));
+    }
+}
+
+TEST_CASE("a plug-in is listed with its whole reason and the end of its path, however narrow the terminal is")
+{
+    const TemporaryFolder folder;
+    const std::string parent = folder.folder("a folder with a name that no terminal is wide enough for, not this one");
+    makeFolder(parent + "/Empty.obplugin");
+    const ProgramRun run
+        = runOnTerminal({ { "plugins", "--color=never" }, { { "OMBRIX_PLUGIN_PATH", parent } }, {} }, { 24, 60 });
+    CHECK(run.status == 0);
+    CHECK(contains(run.output, "…"));
+    CHECK(contains(run.output, "Empty.obplugin"));
+    CHECK(contains(run.output, "refused"));
 }
 
 TEST_CASE("the tree in a pipe says nothing of time even where standard error is a terminal")

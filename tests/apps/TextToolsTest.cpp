@@ -276,4 +276,9 @@ TEST_CASE("a word that resembles one of several is answered with it")
     constexpr std::string_view words[] { "tree", "groups" };
     CHECK(didYouMean("tre", words) == " (did you mean \"tree\"?)");
     CHECK(didYouMean("xyzzy", words).empty());
+    const std::string path = "/" + std::string(100, 'a') + "/Weddings";
+    const std::string_view paths[] { path };
+    CHECK(didYouMean("Weddinks", paths) == " (did you mean \"" + path + "\"?)");
+    constexpr std::string_view hostile[] { "Tr\u202eip" };
+    CHECK(didYouMean("Tr\u202eipp", hostile) == " (did you mean \"Tr\\u202eip\"?)");
 }

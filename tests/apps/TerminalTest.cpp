@@ -1,3 +1,4 @@
+#include "apps/common/DisplayWidth.h"
 #include "tests/apps/ProgramRun.h"
 #include "tests/support/DescribedMachine.h"
 #include "tests/support/LibraryBuilder.h"
@@ -7,6 +8,7 @@
 
 #include <algorithm>
 #include <csignal>
+#include <cstdio>
 
 using namespace tests;
 
@@ -78,10 +80,89 @@ TEST_CASE("on a terminal the tree is folded to its height and names the command 
     CHECK(run.status == 0);
     CHECK(linesIn(run.output) <= 19);
     CHECK(contains(run.output, "more"));
-    CHECK(contains(run.output, "ombrix tree Clients\n"));
+    CHECK(contains(run.output, "ombrix tree Clients --machine " + machine.folder.path("machine.json") + "\n"));
     CHECK(contains(run.output, "└─ Events"));
     CHECK(linesIn(runOnTerminal(machine.wishes({ "tree", "Clients" }), { 20, 80 }).output) > 60);
     CHECK(linesIn(runOnTerminal(machine.wishes({ "tree", "--all" }), { 20, 80 }).output) > 60);
+}
+
+TEST_CASE("the command that unfolds a part works when it is pasted, whatever the part is called")
+{
+    for (const char* name : { "it's a \"quoted\" $HOME", "-odd", "line\nfeed\x1b", "Events", " *" }) {
+        const TemporaryFolder folder;
+        LibraryBuilder library(folder.folder("home/Movies/Montaro Projects"));
+        for (int project = 0; project < 40; ++project)
+            library.project(std::string(name) + "/Project " + std::to_string(project));
+        DescribedMachine description;
+        const std::string file = folder.path("my machine.json");
+        description.home(folder.path("home")).editor(folder.file("editor")).write(file);
+        const ProgramRun run = runOnTerminal({ { "tree", "--color=never", "--machine", file }, {}, {} }, { 12, 60 });
+        const std::size_t start = run.output.find("ombrix tree ");
+        REQUIRE(start != std::string::npos);
+        const std::string pasted = run.output.substr(start, run.output.find('\n', start) - start);
+        const std::string script
+            = folder.file("paste", "ombrix() { " OMBRIX_PROGRAM " \"$@\"; }\n" + pasted + " | grep -c 'Project '\n");
+        CAPTURE(pasted);
+        std::FILE* answer = ::popen(("bash '" + script + "'").c_str(), "r");
+        int count = 0;
+        CHECK(std::fscanf(answer, "%d", &count) == 1);
+        ::pclose(answer);
+        CHECK(count == 40);
+    }
+}
+
+TEST_CASE("IDs are whole on a terminal, and other columns line up")
+{
+    const LargeMachine machine;
+    LibraryBuilder(machine.folder.path("home/Movies/Montaro Projects"))
+        .project("Clients/A project with a name that is longer than any column for names");
+    for (const int columns : { 60, 80, 120 }) {
+        const ProgramRun run = runOnTerminal(machine.wishes({ "groups", "--color=never" }), { 24, columns });
+        const std::string place = "   " + machine.library.path("Clients/Project 7") + "\n";
+        CHECK(contains(run.output, place));
+        CHECK(contains(run.output, "   " + machine.library.path(hostileName).substr(0, 20)));
+        CHECK(contains(run.output, "A project"));
+        CHECK(contains(run.output, "…"));
+    }
+}
+
+TEST_CASE("of what was left out the path loses its middle and the reason is wrapped, not cut")
+{
+    const LargeMachine machine;
+    LibraryBuilder(machine.folder.path("home/Movies/Montaro Projects"))
+        .project("Clients/Long")
+        .movieWithBytes("a movie whose name is longer than it ought to be.MOV", "no movie");
+    for (const int columns : { 60, 80 }) {
+        const ProgramRun run
+            = runOnTerminal(machine.wishes({ "tree", "Clients", "--skipped", "--color=never" }), { 24, columns });
+        const std::size_t start = run.output.find("\n\n") + 2;
+        std::string_view rest = std::string_view(run.output).substr(start, run.output.find("\n1 item skipped") - start);
+        const std::string_view path = rest.substr(0, rest.find('\n'));
+        CHECK(path.starts_with(machine.folder.path().substr(0, 10)));
+        CHECK(path.find("…") != std::string_view::npos);
+        CHECK(path.ends_with(".MOV"));
+        std::string reason;
+        while (!rest.empty()) {
+            const std::string_view line = rest.substr(0, rest.find('\n'));
+            CHECK(apps::displayWidth(line) <= columns);
+            reason += line.substr(std::min<std::size_t>(3, line.size()));
+            rest.remove_prefix(std::min(rest.size(), line.size() + 1));
+        }
+        CHECK(contains(reason, "to list it, give it the extension mov, m4v, mp4 or 3gp"));
+    }
+}
+
+TEST_CASE("a plug-in is listed with its whole reason and the end of its path, however narrow the terminal is")
+{
+    const TemporaryFolder folder;
+    const std::string parent = folder.folder("a folder with a name that no terminal is wide enough for, not this one");
+    makeFolder(parent + "/Empty.obplugin");
+    const ProgramRun run
+        = runOnTerminal({ { "plugins", "--color=never" }, { { "OMBRIX_PLUGIN_PATH", parent } }, {} }, { 24, 60 });
+    CHECK(run.status == 0);
+    CHECK(contains(run.output, "…"));
+    CHECK(contains(run.output, "Empty.obplugin"));
+    CHECK(contains(run.output, "refused"));
 }
 
 TEST_CASE("the tree in a pipe says nothing of time even where standard error is a terminal")

@@ -11,6 +11,9 @@ namespace {
 
     namespace files = std::filesystem;
 
+    // Where the repository is, in a check-out that shares that of another.
+    constexpr std::string_view repositoryFile = ".git";
+
     // What is built, and hidden folders that tools leave in a check-out.
     bool isLeftOut(std::string_view path)
     {
@@ -36,7 +39,7 @@ std::vector<SourceFile> sourceFiles()
             item.disable_recursion_pending();
             continue;
         }
-        if (isFolder || !item->is_regular_file())
+        if (isFolder || !item->is_regular_file() || path == repositoryFile)
             continue;
         std::string text = contentOf(item->path());
         if (text.find('\0') == std::string::npos)

@@ -26,6 +26,10 @@ namespace {
             return _threads.startDetached(name, std::move(body));
         }
         void setNiceOfCurrentThread(int nice) override { _threads.setNiceOfCurrentThread(nice); }
+        std::chrono::nanoseconds processorTimeOfCurrentThread() const override
+        {
+            return _threads.processorTimeOfCurrentThread();
+        }
 
     private:
         platform::Threads& _threads;
@@ -38,7 +42,7 @@ namespace {
         {
             const platform::Platform roles = real.platform();
             return { roles.fileSystem, roles.volumes, roles.workspace, roles.preferences, roles.metadataIndex,
-                roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock, threads,
+                roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock, roles.calendar, threads,
                 roles.mainRunLoop, roles.console, roles.bundles, roles.languages };
         }
 

@@ -99,7 +99,7 @@ void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& r
             objects = objects.appending(child->mediaObjects());
             continue;
         }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
+        const ChosenMovie chosen = chooseRepresentativeMovies(*this, { &child, 1 }).front();
         if (chosen.movie)
             objects = objects.appending(makeRepresentative(*this, *child, chosen, projectFormatVersion));
     }

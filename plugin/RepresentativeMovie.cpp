@@ -3,8 +3,11 @@
 #include "plugin/MontaroConstants.h"
 
 #include "host/OBConstants.h"
+#include "platform/Clock.h"
 #include "platform/Immortal.h"
+#include "platform/Platform.h"
 
+#include <chrono>
 #include <utility>
 
 using platform::Text;
@@ -38,6 +41,22 @@ ChosenMovie walkMovies(const OBMediaManager& manager, const OBMediaObjectList& m
     return chosen;
 }
 
+/// Reading the movies of a project takes less time than passing a turn there and back, so a turn serves several.
+std::vector<ChosenMovie> walkProjects(OBMediaManager& manager, std::span<const OBMediaGroupRef> projects)
+{
+    constexpr std::chrono::milliseconds turnAtMost { 1 }; // nobody sees or feels the main thread stop for so long
+    const platform::Clock& clock = manager.platform().clock;
+    const std::chrono::nanoseconds end = clock.monotonic() + turnAtMost;
+    std::vector<ChosenMovie> chosen;
+    for (const OBMediaGroupRef& project : projects) {
+        if (!chosen.empty() && (manager.isCancelLoadRequestPending() || clock.monotonic() >= end))
+            break;
+        manager.notePathAtWork(project->path());
+        chosen.push_back(walkMovies(manager, project->mediaObjects()));
+    }
+    return chosen;
+}
+
 bool areAllProduced(const OBMediaObjectList& movies)
 {
     bool all = true;
@@ -47,15 +66,17 @@ bool areAllProduced(const OBMediaObjectList& movies)
 
 } // namespace
 
-ChosenMovie chooseRepresentativeMovie(OBMediaManager& manager, const OBMediaGroup& project)
+std::vector<ChosenMovie> chooseRepresentativeMovies(OBMediaManager& manager, std::span<const OBMediaGroupRef> projects)
 {
-    const OBMediaObjectList movies = project.mediaObjects();
+    std::vector<ChosenMovie> chosen;
     // Thumbnails that are there already need no turn of the main thread.
-    if (areAllProduced(movies))
-        return walkMovies(manager, movies);
-    manager.notePathAtWork(project.path());
-    ChosenMovie chosen;
-    manager.performOnMainThreadAndWait([&] { chosen = walkMovies(manager, movies); });
+    if (const OBMediaObjectList movies = projects.front()->mediaObjects(); areAllProduced(movies)) {
+        chosen.push_back(walkMovies(manager, movies));
+        return chosen;
+    }
+    manager.performOnMainThreadAndWait([&] { chosen = walkProjects(manager, projects); });
+    if (chosen.empty())
+        chosen.emplace_back(); // the main loop has ended
     return chosen;
 }
 

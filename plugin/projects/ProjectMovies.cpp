@@ -10,6 +10,7 @@
 #include "host/OBConstants.h"
 #include "platform/PathText.h"
 
+#include <algorithm>
 #include <utility>
 
 using platform::Text;
@@ -18,6 +19,26 @@ using platform::Value;
 namespace {
 
 constexpr const char* projectsPasteboardType = "OBMontaroProjectsPboardType";
+
+/// Whether a child of a folder is one whose movies it shows: neither a library nor a folder.
+bool isProject(const OBMediaGroupRef& child)
+{
+    const OBTypeIdentifierRef type = child->typeIdentifier();
+    return type != OBMontaroProjectLibraryGroupTypeIdentifier && type != OBMontaroFolderGroupTypeIdentifier;
+}
+
+void addRepresentatives(OBMediaManager& manager, OBMediaGroup& folder, std::span<const OBMediaGroupRef> projects)
+{
+    while (!projects.empty() && !manager.isCancelLoadRequestPending()) {
+        const std::vector<ChosenMovie> chosen = chooseRepresentativeMovies(manager, projects);
+        for (std::size_t index = 0; index < chosen.size(); ++index) {
+            if (chosen[index].movie)
+                folder.setMediaObjects(folder.ownMediaObjects().appending(
+                    makeRepresentative(manager, *projects[index], chosen[index], {})));
+        }
+        projects = projects.subspan(chosen.size());
+    }
+}
 
 } // namespace
 
@@ -70,24 +91,22 @@ std::optional<std::string> OBMontaroPlugin::_previewFileForProjectPath(const Tex
 void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder)
 {
     const OBMediaGroupList children = folder->childGroups();
-    for (const OBMediaGroupRef& child : children) {
-        if (isCancelLoadRequestPending())
-            return;
-        const OBTypeIdentifierRef type = child->typeIdentifier();
-        if (type == OBMontaroProjectLibraryGroupTypeIdentifier)
-            continue;
-        if (type == OBMontaroFolderGroupTypeIdentifier) {
+    for (auto child = children.begin(); child != children.end() && !isCancelLoadRequestPending();) {
+        const OBTypeIdentifierRef type = (*child)->typeIdentifier();
+        if (type == OBMontaroProjectLibraryGroupTypeIdentifier) {
+            ++child;
+        } else if (type == OBMontaroFolderGroupTypeIdentifier) {
             // Cancel is asked before each object, and what had been taken by then stays.
-            const OBMediaObjectList below = child->ownMediaObjects();
+            const OBMediaObjectList below = (*child)->ownMediaObjects();
             std::size_t taken = 0;
             while (taken < below.size() && !isCancelLoadRequestPending())
                 ++taken;
             folder->setMediaObjects(folder->ownMediaObjects().appending(below.prefix(taken)));
-            continue;
-        }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
-        if (chosen.movie) {
-            folder->setMediaObjects(folder->ownMediaObjects().appending(makeRepresentative(*this, *child, chosen, {})));
+            ++child;
+        } else {
+            const auto end = std::find_if_not(child, children.end(), isProject);
+            addRepresentatives(*this, *folder, { child, end });
+            child = end;
         }
     }
 }

@@ -1,8 +1,11 @@
 #include "host/OBMediaObjectList.h"
 
 #include "host/OBSnapshotList.h"
+#include "host/TrailingBlock.h"
+#include "platform/PathText.h"
 
 #include <algorithm>
+#include <new>
 #include <utility>
 
 OBMediaObjectSequence::~OBMediaObjectSequence() = default;
@@ -106,39 +109,41 @@ std::vector<OBMediaObjectRef> OBMediaObjectList::objects() const
     return result;
 }
 
-OBMediaObjectBatch::OBMediaObjectBatch(
-    MakeKey, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files)
-    : _folder(std::move(folder))
-    , _objects(std::make_unique<OBMediaObject[]>(files.size()))
-{
-    std::uint32_t offset = 0;
-    for (std::size_t index = 0; index < files.size(); ++index) {
-        OBMediaObject& object = _objects[index];
-        const platform::Locked guard(object._lock);
-        object._folder = _folder.get();
-        object._nameOffset = offset;
-        object._nameLength = static_cast<std::uint32_t>(files[index].name.size());
-        object._pathIsReal = _folder->pathIsReal && files[index].isPlainFile;
-        offset += object._nameLength;
-    }
-}
-
 OBMediaObjectList OBMediaObjectBatch::objects(
     std::shared_ptr<const OBMediaObjectKind> kind, OBFolderOfFiles folder, std::span<const OBFileOfFolder> files)
 {
     if (files.empty())
         return {};
-    std::size_t length = 0;
+    TrailingBytes trailing { files.size() * sizeof(OBMediaObject) };
     for (const OBFileOfFolder& file : files)
-        length += file.name.size();
-    auto shared = std::make_shared<OBMediaFolder>();
-    shared->kind = std::move(kind);
-    shared->path = std::move(folder.path);
-    shared->pathIsReal = folder.pathIsReal;
-    shared->fileNames.reserve(length);
-    for (const OBFileOfFolder& file : files)
-        shared->fileNames.append(file.name);
-    return { std::make_shared<OBMediaObjectBatch>(MakeKey {}, std::move(shared), files), files.size() };
+        trailing.size += file.name.size();
+    return { std::allocate_shared<OBMediaObjectBatch>(TrailingAllocator<OBMediaObjectBatch>(trailing), MakeKey {},
+                 trailing, std::move(kind), std::move(folder), files),
+        files.size() };
+}
+
+OBMediaObjectBatch::OBMediaObjectBatch(MakeKey, const TrailingBytes& trailing,
+    std::shared_ptr<const OBMediaObjectKind> kind, OBFolderOfFiles folder, std::span<const OBFileOfFolder> files)
+    : _kind(std::move(kind))
+    , _folder(std::move(folder.path))
+    , _objects(reinterpret_cast<OBMediaObject*>(trailing.begin), files.size())
+{
+    std::byte* const names = trailing.begin + _objects.size_bytes();
+    std::size_t offset = 0;
+    for (std::size_t index = 0; index < files.size(); ++index) {
+        const std::string_view name = files[index].name;
+        const bool pathIsReal = folder.pathIsReal && files[index].isPlainFile;
+        new (&_objects[index]) OBMediaObject(
+            *this, static_cast<std::uint32_t>(offset), static_cast<std::uint16_t>(name.size()), pathIsReal);
+        std::copy(name.begin(), name.end(), reinterpret_cast<char*>(names + offset));
+        offset += name.size();
+    }
+}
+
+OBMediaObjectBatch::~OBMediaObjectBatch()
+{
+    for (OBMediaObject& object : _objects)
+        object.~OBMediaObject();
 }
 
 OBMediaObjectRef OBMediaObjectBatch::objectAtIndex(std::size_t index) const
@@ -148,9 +153,25 @@ OBMediaObjectRef OBMediaObjectBatch::objectAtIndex(std::size_t index) const
 
 bool OBMediaObjectBatch::visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const
 {
-    for (std::size_t index = 0; index < count; ++index) {
-        if (!visitor(_objects[index]))
+    for (OBMediaObject& object : _objects.first(count)) {
+        if (!visitor(object))
             return false;
     }
     return true;
+}
+
+std::string_view OBMediaObjectBatch::fileName(const OBMediaObject& object) const
+{
+    const auto* names = reinterpret_cast<const char*>(_objects.data() + _objects.size());
+    return { names + object._nameOffset, object._nameLength };
+}
+
+platform::Text OBMediaObjectBatch::nameOfObject(const OBMediaObject& object) const
+{
+    return platform::nameWithoutExtension(fileName(object));
+}
+
+platform::Text OBMediaObjectBatch::pathOfObject(const OBMediaObject& object) const
+{
+    return platform::Text::joined(_folder, _kind->beforeFileName, fileName(object));
 }

@@ -4,7 +4,6 @@
 
 #include "host/OBConstants.h"
 #include "platform/Clock.h"
-#include "platform/Immortal.h"
 #include "platform/Platform.h"
 
 #include <chrono>
@@ -15,14 +14,6 @@ using platform::Value;
 
 namespace {
 
-/// Made once, so that a library of many projects does not repeat them.
-struct RepresentativeKeys {
-    Text projectPath = OBMontaroProjectPathKey;
-    Text resolution = OBMediaObjectResolutionKey;
-    Text formatVersion = OBMontaroProjectFormatVersion;
-    Text isRepresentative = OBMontaroProjectRepresentative;
-};
-
 /// Walks on whatever thread it is called on; on the main thread the thumbnails are produced here and now.
 ChosenMovie walkMovies(const OBMediaManager& manager, const OBMediaObjectList& movies)
 {
@@ -32,11 +23,11 @@ ChosenMovie walkMovies(const OBMediaManager& manager, const OBMediaObjectList& m
             break;
         OBMediaObjectRef movie = movies[index];
         movie->thumbnailImage();
-        Value resolution = movie->attributeForKey(OBMediaObjectResolutionKey);
+        const Value resolution = movie->attributeForKey(OBMediaObjectResolutionKey);
         if (!resolution.size())
             continue;
-        if (!chosen.movie || resolution.size()->width > chosen.resolution.size()->width)
-            chosen = { std::move(movie), std::move(resolution) };
+        if (!chosen.movie || resolution.size()->width > chosen.width)
+            chosen = { std::move(movie), resolution.size()->width };
     }
     return chosen;
 }
@@ -80,19 +71,21 @@ std::vector<ChosenMovie> chooseRepresentativeMovies(OBMediaManager& manager, std
     return chosen;
 }
 
-OBMediaObjectRef makeRepresentative(
-    OBMediaManager& manager, const OBMediaGroup& group, const ChosenMovie& chosen, const Text& formatVersion)
+std::shared_ptr<const OBMediaObjectKind> representativeKind(const OBMediaManager& manager, const Text& formatVersion)
 {
-    static platform::Immortal<RepresentativeKeys> keys;
-    OBMediaObjectRef representative = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, group.name());
-    representative->setMediaSourceType(OBMediaSourceTypePlugin);
-    representative->setSourcePluginIdentifier(manager.pluginIdentifier());
-    representative->setPathOfObject(*chosen.movie);
-    representative->setAttribute_forKey(group.URL().path, keys->projectPath);
-    representative->setAttribute_forKey(chosen.resolution, keys->resolution);
+    auto kind = std::make_shared<OBMediaObjectKind>();
+    kind->mediaType = OBMediaTypeMovie;
+    kind->mediaSourceType = OBMediaSourceTypePlugin;
+    kind->sourcePluginIdentifier = manager.pluginIdentifier();
+    kind->groupPathKey = OBMontaroProjectPathKey;
     if (formatVersion)
-        representative->setAttribute_forKey(formatVersion, keys->formatVersion);
-    representative->setAttribute_forKey(true, keys->isRepresentative);
-    representative->setIcon(chosen.movie->thumbnailImage());
-    return representative;
+        kind->attributes.emplace_back(OBMontaroProjectFormatVersion, formatVersion);
+    kind->attributes.emplace_back(OBMontaroProjectRepresentative, true);
+    return kind;
+}
+
+OBMediaObjectRef makeRepresentative(
+    const std::shared_ptr<const OBMediaObjectKind>& kind, const OBMediaGroup& group, const ChosenMovie& chosen)
+{
+    return OBMediaObject::representative(kind, group.name(), group.URL().path, chosen.movie);
 }

@@ -16,6 +16,9 @@ public:
     {
     }
 
+    /// Whether anybody is told what was decided where; nobody else looks at a folder's path.
+    bool tells() const { return _observer != nullptr; }
+
     /// Whether `item` of `folder` passes `rule`.
     bool passes(const ScanRule& rule, const platform::FolderItem& item, std::string_view folder) const
     {

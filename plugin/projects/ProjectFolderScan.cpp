@@ -31,7 +31,8 @@ constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPath
 std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin)
 {
     return std::make_shared<const OBMediaObjectKind>(OBMediaObjectKind { OBMediaTypeMovie, OBMediaSourceTypePlugin,
-        plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey } });
+        plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey },
+        Text::joined("/", sharedItemsFolder, "/") });
 }
 
 OBMediaGroupRef groupForFolder(
@@ -154,7 +155,7 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
 
     const SharedMovies movies = item.subfolder ? sharedMoviesOfListedProject(scan.report, path, listing, item)
                                                : sharedMoviesOfProject(*this, scan.report, path);
-    project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.folder, movies.files));
+    project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.project, movies.files));
     project->setIcon(movies.files.empty() ? scan.emptyProjectIcon : scan.projectIcon);
     noteItemsFound(movies.files.size());
     return project;

@@ -29,12 +29,13 @@ bool isProject(const OBMediaGroupRef& child)
 
 void addRepresentatives(OBMediaManager& manager, OBMediaGroup& folder, std::span<const OBMediaGroupRef> projects)
 {
+    const std::shared_ptr<const OBMediaObjectKind> kind = representativeKind(manager, {});
     while (!projects.empty() && !manager.isCancelLoadRequestPending()) {
         const std::vector<ChosenMovie> chosen = chooseRepresentativeMovies(manager, projects);
         for (std::size_t index = 0; index < chosen.size(); ++index) {
             if (chosen[index].movie)
-                folder.setMediaObjects(folder.ownMediaObjects().appending(
-                    makeRepresentative(manager, *projects[index], chosen[index], {})));
+                folder.setMediaObjects(
+                    folder.ownMediaObjects().appending(makeRepresentative(kind, *projects[index], chosen[index])));
         }
         projects = projects.subspan(chosen.size());
     }
@@ -48,16 +49,11 @@ Value OBMontaroPlugin::supportedPasteboardTypes()
     return Value::List { types };
 }
 
-SharedMovies::SharedMovies(const Text& project)
-    : folder { Text::joined(project, "/", sharedItemsFolder) }
-{
-}
-
 SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& report, const Text& project)
 {
     SharedMovies movies(project);
-    movies.listing = manager.listFolder(movies.folder.path, {});
-    movies.folder.pathIsReal = movies.listing.pathIsReal();
+    movies.listing = manager.listFolder(movies.folder(), {});
+    movies.project.pathIsReal = movies.listing.pathIsReal();
     movies.take(report, movies.listing);
     return movies;
 }
@@ -66,7 +62,7 @@ SharedMovies sharedMoviesOfListedProject(const ScanReport& report, const Text& p
     const platform::FolderListing& library, const platform::FolderItem& item)
 {
     SharedMovies movies(project);
-    movies.folder.pathIsReal = library.pathIsReal() && item.kind == platform::ItemKind::folder;
+    movies.project.pathIsReal = library.pathIsReal() && item.kind == platform::ItemKind::folder;
     movies.take(report, *item.subfolder);
     return movies;
 }
@@ -76,7 +72,7 @@ std::vector<std::string> OBMontaroPlugin::_renderedMoviesPathsForProjectPath(con
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     std::vector<std::string> paths;
     for (const OBFileOfFolder& file : movies.files)
-        paths.push_back(platform::pathJoined(movies.folder.path, file.name));
+        paths.push_back(platform::pathJoined(movies.folder(), file.name));
     return paths;
 }
 
@@ -85,7 +81,7 @@ std::optional<std::string> OBMontaroPlugin::_previewFileForProjectPath(const Tex
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     if (movies.files.empty())
         return std::nullopt;
-    return platform::pathJoined(movies.folder.path, movies.files.front().name);
+    return platform::pathJoined(movies.folder(), movies.files.front().name);
 }
 
 void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder)

@@ -45,7 +45,7 @@ public:
     std::optional<double> duration() const { return _hasDuration ? std::optional(_duration) : std::nullopt; }
     platform::Text file() const { return _file ? _file : _object._origin.pathOfObject(_object); }
 
-    platform::Text name() const override { return "thumbnail"; }
+    platform::Text name() const override;
     OBPixelSource pixelSource() const override { return { OBPixelSource::Kind::movieFile, file() }; }
 
 private:

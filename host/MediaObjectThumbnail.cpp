@@ -6,6 +6,7 @@
 #include "host/FrameworkCore.h"
 #include "host/MediaObjectParts.h"
 #include "host/OBConstants.h"
+#include "platform/Immortal.h"
 #include "platform/MainRunLoop.h"
 #include "platform/Platform.h"
 
@@ -14,6 +15,20 @@
 using platform::Locked;
 using platform::Text;
 using platform::Value;
+
+namespace {
+
+struct ThumbnailName {
+    Text text = "thumbnail";
+};
+
+} // namespace
+
+Text OBMediaObject::MovieThumbnail::name() const
+{
+    static platform::Immortal<ThumbnailName> name;
+    return name->text;
+}
 
 OBImageRef OBMediaObject::thumbnailImage()
 {

@@ -12,10 +12,23 @@ OBMediaObjectSequence::~OBMediaObjectSequence() = default;
 
 /// One object, or the first objects of a sequence.
 struct OBMediaObjectList::Part {
-    OBMediaObjectRef object; // null where a sequence stands
-    std::shared_ptr<const OBMediaObjectSequence> sequence;
-    std::size_t count = 1;
-    std::size_t end = 0; // how many objects stand in the list up to and with this part
+    std::shared_ptr<const void> item;
+    std::uint64_t end : 63; // how many objects stand in the list up to and with this part
+    bool isObject : 1;
+
+    static Part ofObject(OBMediaObjectRef object, std::size_t before)
+    {
+        return { std::move(object), before + 1, true };
+    }
+    static Part ofSequence(std::shared_ptr<const OBMediaObjectSequence> sequence, std::size_t before, std::size_t count)
+    {
+        return { std::move(sequence), before + count, false };
+    }
+    OBMediaObject* object() const
+    {
+        return isObject ? const_cast<OBMediaObject*>(static_cast<const OBMediaObject*>(item.get())) : nullptr;
+    }
+    const OBMediaObjectSequence& sequence() const { return *static_cast<const OBMediaObjectSequence*>(item.get()); }
 };
 
 /// Parts one after the other. Extending the longest list made from it writes behind what that list shows.
@@ -33,21 +46,22 @@ public:
     {
         const Part* part = std::upper_bound(_parts.begin(), _parts.end(), index,
             [](std::size_t wanted, const Part& candidate) { return wanted < candidate.end; });
-        if (part->object)
-            return part->object;
-        return part->sequence->objectAtIndex(index - (part->end - part->count));
+        if (OBMediaObject* object = part->object())
+            return { part->item, object };
+        return part->sequence().objectAtIndex(index - (part == _parts.begin() ? 0 : part[-1].end));
     }
 
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override
     {
-        std::size_t left = count;
+        std::size_t visited = 0;
         for (const Part& part : _parts) {
-            if (left == 0)
+            if (visited >= count)
                 break;
-            const std::size_t here = std::min(left, part.count);
-            if (part.object ? !visitor(*part.object) : !part.sequence->visit(here, visitor))
+            OBMediaObject* object = part.object();
+            if (object ? !visitor(*object)
+                       : !part.sequence().visit(std::min<std::size_t>(count, part.end) - visited, visitor))
                 return false;
-            left -= here;
+            visited = part.end;
         }
         return true;
     }
@@ -70,20 +84,19 @@ void OBMediaObjectList::visit(const std::function<bool(OBMediaObject&)>& visitor
 
 OBMediaObjectList OBMediaObjectList::appendingPart(Part part) const
 {
-    part.end = _count + part.count;
     const std::size_t count = part.end;
     OBSnapshotList<Part> parts;
     const auto* concatenation = dynamic_cast<const Concatenation*>(_sequence.get());
     if (concatenation && concatenation->size() == _count)
         parts = concatenation->parts();
     else if (_count != 0)
-        parts = parts.appending(Part { nullptr, _sequence, _count, _count });
+        parts = parts.appending(Part::ofSequence(_sequence, 0, _count));
     return { std::make_shared<Concatenation>(parts.appending(std::move(part))), count };
 }
 
 OBMediaObjectList OBMediaObjectList::appending(OBMediaObjectRef object) const
 {
-    return appendingPart(Part { std::move(object), nullptr });
+    return appendingPart(Part::ofObject(std::move(object), _count));
 }
 
 OBMediaObjectList OBMediaObjectList::appending(const OBMediaObjectList& others) const
@@ -92,7 +105,7 @@ OBMediaObjectList OBMediaObjectList::appending(const OBMediaObjectList& others) 
         return *this;
     if (empty())
         return others;
-    return appendingPart(Part { nullptr, others._sequence, others._count });
+    return appendingPart(Part::ofSequence(others._sequence, _count, others._count));
 }
 
 OBMediaObjectList OBMediaObjectList::prefix(std::size_t count) const

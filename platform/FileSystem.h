@@ -66,7 +66,7 @@ struct ItemFlags {
 enum class MarkerAnswer : std::uint8_t {
     absent,
     present,
-    link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed
+    link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed to anything
 };
 
 /// What a listing is to find out beside names and flags, so that a scan needs no second call an item.
@@ -82,6 +82,9 @@ struct ListingRequest {
     /// that needs no link to be followed. Not asked when empty.
     std::string_view subfolder {};
     LinkPolicy links = LinkPolicy::follow;
+    /// With LinkPolicy::stop: a link of the marker's name inside a folder is followed all the same where the system comes
+    /// to something by it.
+    bool followsMarkers = false;
 };
 
 class FolderListing;

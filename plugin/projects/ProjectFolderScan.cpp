@@ -35,18 +35,6 @@ std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin
         Text::joined("/", sharedItemsFolder, "/") });
 }
 
-OBMediaGroupRef groupForFolder(
-    OBTypeIdentifierRef type, std::string_view name, const Text& path, const Text& parentID, const OBImageRef& icon)
-{
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
-    group->setName(name);
-    group->setParentID(parentID);
-    group->setID(path);
-    group->setIcon(icon);
-    group->setPath(path);
-    return group;
-}
-
 } // namespace
 
 OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
@@ -101,14 +89,14 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
     if (!path)
         return nullptr;
     const std::string_view name = platform::lastPathComponent(path);
-    const OBMediaGroupRef folder = groupForFolder(
-        OBMontaroFolderGroupTypeIdentifier, name, path, platform::pathByRemovingLastComponent(path), scan.projectIcon);
 
     // A folder may be known to people by a name with an extension that it does not have on disk.
     Text listed = path;
     FolderListing listing = listFolder(path, projectListing);
-    folder->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
-                                                       : OBMediaGroup::modDateForFile(path));
+    const OBMediaGroupRef folder = OBMediaGroup::withFields({ OBMontaroFolderGroupTypeIdentifier, name, path,
+        platform::pathByRemovingLastComponent(path), path, scan.projectIcon,
+        listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
+                               : OBMediaGroup::modDateForFile(path) });
     if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
@@ -132,11 +120,10 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 
     if (folder->childGroups().empty()) {
         const OBMediaGroupRef placeholder
-            = groupForFolder(listed == _MontaroDefaultPath() ? OBMontaroProjectLibraryGroupTypeIdentifier
-                                                             : OBMontaroFolderGroupTypeIdentifier,
-                platform::lastPathComponent(listed), listed, listed, scan.projectIcon);
-        placeholder->setModificationDate(
-            listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed));
+            = OBMediaGroup::withFields({ listed == _MontaroDefaultPath() ? OBMontaroProjectLibraryGroupTypeIdentifier
+                                                                         : OBMontaroFolderGroupTypeIdentifier,
+                platform::lastPathComponent(listed), listed, listed, listed, scan.projectIcon,
+                listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed) });
         scan.addToFlatGroups(placeholder);
     }
     _createMontaroProjectsFolderMediaObjects(folder);
@@ -148,9 +135,9 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
     const Text& listedFolder, const FolderListing& listing, const FolderItem& item, ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
-    const OBMediaGroupRef project = groupForFolder(OBMontaroProjectGroupTypeIdentifier,
-        platform::nameWithoutExtension(item.name), path, listedFolder, scan.projectIcon);
-    project->setModificationDate(item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
+    const OBMediaGroupRef project = OBMediaGroup::withFields(
+        { OBMontaroProjectGroupTypeIdentifier, platform::nameWithoutExtension(item.name), path, listedFolder, path,
+            scan.projectIcon, item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path) });
     scan.addToFlatGroups(project);
 
     const SharedMovies movies = item.subfolder ? sharedMoviesOfListedProject(scan.report, path, listing, item)

@@ -1,4 +1,5 @@
 #include "apps/common/Machine.h"
+#include "apps/common/Memory.h"
 #include "host/OBMediaHost.h"
 #include "platform/MainRunLoop.h"
 #include "platform/Movies.h"
@@ -147,6 +148,7 @@ int main(int argc, char** argv)
         std::fprintf(stderr, "usage: scan_probe --machine FILE [--without-headers]\n");
         return 2;
     }
+    apps::takeMemoryInLargeSteps();
     const apps::MachineResult opened = apps::chooseMachine(std::string(argv[2]));
     if (!opened.machine)
         return fail(opened.problem);

@@ -1,6 +1,8 @@
 #include "apps/common/Memory.h"
 
-#if defined(__GLIBC__) || __has_include(<malloc.h>)
+#include <cstdlib> // tells whose C library this is
+
+#if defined(__GLIBC__)
 #include <malloc.h>
 #endif
 

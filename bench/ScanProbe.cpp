@@ -1,4 +1,5 @@
 #include "apps/common/Machine.h"
+#include "apps/common/Memory.h"
 #include "host/OBMediaHost.h"
 #include "platform/MainRunLoop.h"
 #include "platform/Movies.h"
@@ -241,6 +242,7 @@ int main(int argc, char** argv)
         std::fprintf(stderr, "usage: scan_probe --machine FILE [--without-headers] [--cancel-after MILLISECONDS]\n");
         return 2;
     }
+    apps::takeMemoryInLargeSteps();
     const apps::MachineResult opened = apps::chooseMachine(options->machine);
     if (!opened.machine)
         return fail(opened.problem);

@@ -2,6 +2,7 @@
 
 #include <utility>
 
+using platform::Locked;
 using platform::Size;
 using platform::Text;
 
@@ -26,7 +27,7 @@ private:
 } // namespace
 
 OBImage::OBImage(Size size)
-    : _look(Look { size, false })
+    : _size(size)
 {
 }
 
@@ -40,22 +41,26 @@ OBImageRef OBImage::pictureNamed(Text name, Size size, Text file)
 
 Size OBImage::size() const
 {
-    return _look.load().size;
+    Locked guard(_lock);
+    return _size;
 }
 
 void OBImage::setSize(Size size)
 {
-    _look.update([size](Look look) { return Look { size, look.scales }; });
+    Locked guard(_lock);
+    _size = size;
 }
 
 bool OBImage::scalesWhenResized() const
 {
-    return _look.load().scales;
+    Locked guard(_lock);
+    return _scales;
 }
 
 void OBImage::setScalesWhenResized(bool scales)
 {
-    _look.update([scales](Look look) { return Look { look.size, scales }; });
+    Locked guard(_lock);
+    _scales = scales;
 }
 
 OBImageRef OBImage::copyNamed(Text name) const

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "host/OBExport.h"
-#include "platform/Snapshot.h"
+#include "platform/ThreadSafety.h"
 #include "platform/Value.h"
 
 #include <memory>
@@ -48,9 +48,7 @@ protected:
     explicit OBImage(platform::Size size);
 
 private:
-    struct Look {
-        platform::Size size;
-        bool scales = false;
-    };
-    platform::Snapshot<Look> _look;
+    platform::Size _size GUARDED_BY(_lock);
+    mutable platform::SmallLock _lock;
+    bool _scales GUARDED_BY(_lock) = false;
 };

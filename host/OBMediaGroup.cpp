@@ -17,6 +17,18 @@ OBMediaGroup::OBMediaGroup(OBTypeIdentifierRef identifier)
     _fields.typeIdentifier = identifier;
 }
 
+OBMediaGroup::OBMediaGroup(OBMediaGroupFields fields)
+{
+    _fields.typeIdentifier = fields.typeIdentifier;
+    _fields.name = std::move(fields.name);
+    _fields.identifier = std::move(fields.ID);
+    _fields.parentIdentifier = std::move(fields.parentID);
+    _fields.path = std::move(fields.path);
+    _fields.icon = std::move(fields.icon);
+    _fields.hasModificationDate = fields.modificationDate.has_value();
+    _fields.modificationDate = fields.modificationDate.value_or(Date {});
+}
+
 /// Releases what hangs below level by level: a tree as deep as a path can be must not be released by recursion.
 OBMediaGroup::~OBMediaGroup()
 {
@@ -39,6 +51,11 @@ OBMediaGroup::~OBMediaGroup()
 OBMediaGroupRef OBMediaGroup::initWithTypeIdentifier(OBTypeIdentifierRef identifier)
 {
     return std::make_shared<OBMediaGroup>(identifier);
+}
+
+OBMediaGroupRef OBMediaGroup::withFields(OBMediaGroupFields fields)
+{
+    return std::make_shared<OBMediaGroup>(std::move(fields));
 }
 
 OBMediaGroupRef OBMediaGroup::copy() const

@@ -21,6 +21,17 @@ struct OBFileLocation {
     platform::Text path;
 };
 
+/// What a scan knows of a group from the start.
+struct OBMediaGroupFields {
+    OBTypeIdentifierRef typeIdentifier = nullptr;
+    platform::Text name {};
+    platform::Text ID {};
+    platform::Text parentID {};
+    platform::Text path {};
+    OBImageRef icon {};
+    std::optional<platform::Date> modificationDate {};
+};
+
 /// One node of the media tree.
 ///
 /// A group belongs to whoever made it until it is added to another, whose list then shares it. Adding changes no field
@@ -29,12 +40,15 @@ struct OBFileLocation {
 class OB_EXPORT OBMediaGroup {
 public:
     explicit OBMediaGroup(OBTypeIdentifierRef identifier);
+    explicit OBMediaGroup(OBMediaGroupFields fields);
     ~OBMediaGroup();
     OBMediaGroup(const OBMediaGroup&) = delete;
     OBMediaGroup& operator=(const OBMediaGroup&) = delete;
 
     /// A new group in which nothing else is set.
     static OBMediaGroupRef initWithTypeIdentifier(OBTypeIdentifierRef identifier);
+    /// A new group with `fields`, set in one step.
+    static OBMediaGroupRef withFields(OBMediaGroupFields fields);
     /// A new group with the fields and lists that this one has now.
     OBMediaGroupRef copy() const;
 

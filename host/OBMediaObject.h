@@ -19,6 +19,7 @@ struct Platform;
 class OBMarvexProperties;
 class OBMediaObject;
 class OBMediaObjectBatch;
+class OBMediaObjectOrigin;
 using OBMediaObjectRef = std::shared_ptr<OBMediaObject>;
 using OBMarvexPropertiesRef = std::shared_ptr<const OBMarvexProperties>;
 
@@ -30,14 +31,13 @@ struct OBMediaObjectKind {
     OBImageRef icon {};
     /// Attributes whose value is the object's own path.
     std::vector<platform::Text> ownPathKeys {};
-};
-
-/// The files of one folder that became media objects of one kind. Immutable; objects and their pictures share it.
-struct OBMediaFolder : std::enable_shared_from_this<OBMediaFolder> {
-    std::shared_ptr<const OBMediaObjectKind> kind;
-    platform::Text path; ///< without a slash at its end
-    std::string fileNames; ///< one after the other
-    bool pathIsReal = false; ///< the folder's path holds no symbolic link
+    /// What stands between the path of the folder that the objects of files are made for, and a file's name: "/", or
+    /// where the files lie below that folder, "/Below/".
+    platform::Text beforeFileName { "/" };
+    /// Of an object that stands for a group: the attribute whose value is the group's path, and those that are the
+    /// same for all objects of the kind.
+    platform::Text groupPathKey {};
+    platform::Value::Dictionary attributes {};
 };
 
 /// The metadata-search properties of one file, by the attributes of the query language (kMDItemFSName and so on).
@@ -64,13 +64,16 @@ private:
 /// Any thread may read and write; a reader sees each field before or after a change.
 class OB_EXPORT OBMediaObject {
 public:
-    OBMediaObject();
     ~OBMediaObject();
     OBMediaObject(const OBMediaObject&) = delete;
     OBMediaObject& operator=(const OBMediaObject&) = delete;
 
     /// A new object that stands for no file yet.
     static OBMediaObjectRef initWithMediaType_name(int mediaType, platform::Text name);
+    /// A new object that shows a group, called `name` and at `groupPath`, by one of its movies: has the path, the
+    /// resolution and, for an icon, the thumbnail that `movie` has now, and otherwise what `kind` says.
+    static OBMediaObjectRef representative(std::shared_ptr<const OBMediaObjectKind> kind, platform::Text name,
+        platform::Text groupPath, const OBMediaObjectRef& movie);
 
     int mediaType() const;
     /// The display name.
@@ -120,20 +123,30 @@ private:
     friend class OBMediaObjectBatch;
     struct OwnFields;
     class MovieThumbnail;
+    class Lone;
+    class Representative;
+
+    /// `nameLength` counts bytes of a file's name; those that the system has fit by far.
+    OBMediaObject(
+        const OBMediaObjectOrigin& origin, std::uint32_t nameOffset, std::uint16_t nameLength, bool pathIsReal);
 
     OwnFields& own() REQUIRES(_lock);
-    std::string_view fileName() const;
     platform::Text pathLocked() const REQUIRES(_lock);
+    platform::Value attributeBesideOwn(std::string_view key) const REQUIRES(_lock);
+    platform::Value attributeOfMovie(std::string_view key) const REQUIRES(_lock);
+    OBImageRef withoutCycle(OBImageRef image) const;
+    OBImageRef handedOut(const OBImageRef& kept) const;
+    OBImageRef imageOfMovie() const REQUIRES(_lock);
     void produceThumbnail(const platform::Platform& platform);
 
-    // Constant once the object is handed out: which file of the folder this is; no folder for an object made by itself.
-    const OBMediaFolder* _folder = nullptr;
-    std::uint32_t _nameOffset = 0;
-    std::uint32_t _nameLength = 0;
+    // Constant: where the object lies, and where in the names there that of its file stands.
+    const OBMediaObjectOrigin& _origin;
+    const std::uint32_t _nameOffset;
+    const std::uint16_t _nameLength;
 
     mutable platform::SmallLock _lock;
-    bool _pathIsReal GUARDED_BY(_lock) = false; // the path was seen to hold no symbolic link: it is its own real path
-    bool _thumbnailProduced GUARDED_BY(_lock) = false;
-    std::unique_ptr<OwnFields> _own GUARDED_BY(_lock); // what differs from the kind and the folder
-    std::shared_ptr<MovieThumbnail> _movie GUARDED_BY(_lock); // what the header told; null for a file that is no movie
+    bool _pathIsReal : 1 GUARDED_BY(_lock); // the path was seen to hold no symbolic link: it is its own real path
+    bool _thumbnailProduced : 1 GUARDED_BY(_lock);
+    std::unique_ptr<OwnFields> _own GUARDED_BY(_lock); // in place of what the origin tells
+    std::unique_ptr<MovieThumbnail> _movie GUARDED_BY(_lock); // what the header told; null for a file that is no movie
 };

@@ -1,18 +1,34 @@
 #include "host/OBMediaObjectList.h"
 
 #include "host/OBSnapshotList.h"
+#include "host/TrailingBlock.h"
+#include "platform/PathText.h"
 
 #include <algorithm>
+#include <new>
 #include <utility>
 
 OBMediaObjectSequence::~OBMediaObjectSequence() = default;
 
 /// One object, or the first objects of a sequence.
 struct OBMediaObjectList::Part {
-    OBMediaObjectRef object; // null where a sequence stands
-    std::shared_ptr<const OBMediaObjectSequence> sequence;
-    std::size_t count = 1;
-    std::size_t end = 0; // how many objects stand in the list up to and with this part
+    std::shared_ptr<const void> item;
+    std::uint64_t end : 63; // how many objects stand in the list up to and with this part
+    bool isObject : 1;
+
+    static Part ofObject(OBMediaObjectRef object, std::size_t before)
+    {
+        return { std::move(object), before + 1, true };
+    }
+    static Part ofSequence(std::shared_ptr<const OBMediaObjectSequence> sequence, std::size_t before, std::size_t count)
+    {
+        return { std::move(sequence), before + count, false };
+    }
+    OBMediaObject* object() const
+    {
+        return isObject ? const_cast<OBMediaObject*>(static_cast<const OBMediaObject*>(item.get())) : nullptr;
+    }
+    const OBMediaObjectSequence& sequence() const { return *static_cast<const OBMediaObjectSequence*>(item.get()); }
 };
 
 /// Parts one after the other. Extending the longest list made from it writes behind what that list shows.
@@ -30,21 +46,22 @@ public:
     {
         const Part* part = std::upper_bound(_parts.begin(), _parts.end(), index,
             [](std::size_t wanted, const Part& candidate) { return wanted < candidate.end; });
-        if (part->object)
-            return part->object;
-        return part->sequence->objectAtIndex(index - (part->end - part->count));
+        if (OBMediaObject* object = part->object())
+            return { part->item, object };
+        return part->sequence().objectAtIndex(index - (part == _parts.begin() ? 0 : part[-1].end));
     }
 
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override
     {
-        std::size_t left = count;
+        std::size_t visited = 0;
         for (const Part& part : _parts) {
-            if (left == 0)
+            if (visited >= count)
                 break;
-            const std::size_t here = std::min(left, part.count);
-            if (part.object ? !visitor(*part.object) : !part.sequence->visit(here, visitor))
+            OBMediaObject* object = part.object();
+            if (object ? !visitor(*object)
+                       : !part.sequence().visit(std::min<std::size_t>(count, part.end) - visited, visitor))
                 return false;
-            left -= here;
+            visited = part.end;
         }
         return true;
     }
@@ -67,20 +84,19 @@ void OBMediaObjectList::visit(const std::function<bool(OBMediaObject&)>& visitor
 
 OBMediaObjectList OBMediaObjectList::appendingPart(Part part) const
 {
-    part.end = _count + part.count;
     const std::size_t count = part.end;
     OBSnapshotList<Part> parts;
     const auto* concatenation = dynamic_cast<const Concatenation*>(_sequence.get());
     if (concatenation && concatenation->size() == _count)
         parts = concatenation->parts();
     else if (_count != 0)
-        parts = parts.appending(Part { nullptr, _sequence, _count, _count });
+        parts = parts.appending(Part::ofSequence(_sequence, 0, _count));
     return { std::make_shared<Concatenation>(parts.appending(std::move(part))), count };
 }
 
 OBMediaObjectList OBMediaObjectList::appending(OBMediaObjectRef object) const
 {
-    return appendingPart(Part { std::move(object), nullptr });
+    return appendingPart(Part::ofObject(std::move(object), _count));
 }
 
 OBMediaObjectList OBMediaObjectList::appending(const OBMediaObjectList& others) const
@@ -89,7 +105,7 @@ OBMediaObjectList OBMediaObjectList::appending(const OBMediaObjectList& others) 
         return *this;
     if (empty())
         return others;
-    return appendingPart(Part { nullptr, others._sequence, others._count });
+    return appendingPart(Part::ofSequence(others._sequence, _count, others._count));
 }
 
 OBMediaObjectList OBMediaObjectList::prefix(std::size_t count) const
@@ -106,39 +122,41 @@ std::vector<OBMediaObjectRef> OBMediaObjectList::objects() const
     return result;
 }
 
-OBMediaObjectBatch::OBMediaObjectBatch(
-    MakeKey, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files)
-    : _folder(std::move(folder))
-    , _objects(std::make_unique<OBMediaObject[]>(files.size()))
-{
-    std::uint32_t offset = 0;
-    for (std::size_t index = 0; index < files.size(); ++index) {
-        OBMediaObject& object = _objects[index];
-        const platform::Locked guard(object._lock);
-        object._folder = _folder.get();
-        object._nameOffset = offset;
-        object._nameLength = static_cast<std::uint32_t>(files[index].name.size());
-        object._pathIsReal = _folder->pathIsReal && files[index].isPlainFile;
-        offset += object._nameLength;
-    }
-}
-
 OBMediaObjectList OBMediaObjectBatch::objects(
     std::shared_ptr<const OBMediaObjectKind> kind, OBFolderOfFiles folder, std::span<const OBFileOfFolder> files)
 {
     if (files.empty())
         return {};
-    std::size_t length = 0;
+    TrailingBytes trailing { files.size() * sizeof(OBMediaObject) };
     for (const OBFileOfFolder& file : files)
-        length += file.name.size();
-    auto shared = std::make_shared<OBMediaFolder>();
-    shared->kind = std::move(kind);
-    shared->path = std::move(folder.path);
-    shared->pathIsReal = folder.pathIsReal;
-    shared->fileNames.reserve(length);
-    for (const OBFileOfFolder& file : files)
-        shared->fileNames.append(file.name);
-    return { std::make_shared<OBMediaObjectBatch>(MakeKey {}, std::move(shared), files), files.size() };
+        trailing.size += file.name.size();
+    return { std::allocate_shared<OBMediaObjectBatch>(TrailingAllocator<OBMediaObjectBatch>(trailing), MakeKey {},
+                 trailing, std::move(kind), std::move(folder), files),
+        files.size() };
+}
+
+OBMediaObjectBatch::OBMediaObjectBatch(MakeKey, const TrailingBytes& trailing,
+    std::shared_ptr<const OBMediaObjectKind> kind, OBFolderOfFiles folder, std::span<const OBFileOfFolder> files)
+    : _kind(std::move(kind))
+    , _folder(std::move(folder.path))
+    , _objects(reinterpret_cast<OBMediaObject*>(trailing.begin), files.size())
+{
+    std::byte* const names = trailing.begin + _objects.size_bytes();
+    std::size_t offset = 0;
+    for (std::size_t index = 0; index < files.size(); ++index) {
+        const std::string_view name = files[index].name;
+        const bool pathIsReal = folder.pathIsReal && files[index].isPlainFile;
+        new (&_objects[index]) OBMediaObject(
+            *this, static_cast<std::uint32_t>(offset), static_cast<std::uint16_t>(name.size()), pathIsReal);
+        std::copy(name.begin(), name.end(), reinterpret_cast<char*>(names + offset));
+        offset += name.size();
+    }
+}
+
+OBMediaObjectBatch::~OBMediaObjectBatch()
+{
+    for (OBMediaObject& object : _objects)
+        object.~OBMediaObject();
 }
 
 OBMediaObjectRef OBMediaObjectBatch::objectAtIndex(std::size_t index) const
@@ -148,9 +166,25 @@ OBMediaObjectRef OBMediaObjectBatch::objectAtIndex(std::size_t index) const
 
 bool OBMediaObjectBatch::visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const
 {
-    for (std::size_t index = 0; index < count; ++index) {
-        if (!visitor(_objects[index]))
+    for (OBMediaObject& object : _objects.first(count)) {
+        if (!visitor(object))
             return false;
     }
     return true;
+}
+
+std::string_view OBMediaObjectBatch::fileName(const OBMediaObject& object) const
+{
+    const auto* names = reinterpret_cast<const char*>(_objects.data() + _objects.size());
+    return { names + object._nameOffset, object._nameLength };
+}
+
+platform::Text OBMediaObjectBatch::nameOfObject(const OBMediaObject& object) const
+{
+    return platform::nameWithoutExtension(fileName(object));
+}
+
+platform::Text OBMediaObjectBatch::pathOfObject(const OBMediaObject& object) const
+{
+    return platform::Text::joined(_folder, _kind->beforeFileName, fileName(object));
 }

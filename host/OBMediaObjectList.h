@@ -1,7 +1,7 @@
 #pragma once
 
 #include "host/OBExport.h"
-#include "host/OBMediaObject.h"
+#include "host/OBMediaObjectOrigin.h"
 
 #include <cstddef>
 #include <functional>
@@ -59,10 +59,10 @@ private:
     std::size_t _count = 0;
 };
 
-/// A folder whose files become media objects.
+/// A folder whose files become media objects, or below which they lie where their kind says so.
 struct OBFolderOfFiles {
     platform::Text path {}; ///< without a slash at its end
-    bool pathIsReal = false; ///< its path is known to hold no symbolic link
+    bool pathIsReal = false; ///< the path of where the files lie is known to hold no symbolic link
 };
 
 /// A file of that folder.
@@ -71,13 +71,17 @@ struct OBFileOfFolder {
     bool isPlainFile = false; ///< it was seen to be a plain file, no link to one
 };
 
+struct TrailingBytes;
+
 /// Makes the media objects of the files of one folder, in one block.
 class OB_EXPORT OBMediaObjectBatch final : public OBMediaObjectSequence,
+                                           private OBMediaObjectOrigin,
                                            public std::enable_shared_from_this<OBMediaObjectBatch> {
 public:
     /// One object a file, in order; each is named after its file, without the extension.
     static OBMediaObjectList objects(
         std::shared_ptr<const OBMediaObjectKind> kind, OBFolderOfFiles folder, std::span<const OBFileOfFolder> files);
+    ~OBMediaObjectBatch() override;
 
     OBMediaObjectRef objectAtIndex(std::size_t index) const override;
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override;
@@ -85,10 +89,18 @@ public:
 private:
     struct MakeKey { };
 
+    std::shared_ptr<const void> block() const override { return shared_from_this(); }
+    const OBMediaObjectKind& kind() const override { return *_kind; }
+    platform::Text nameOfObject(const OBMediaObject& object) const override;
+    platform::Text pathOfObject(const OBMediaObject& object) const override;
+    std::string_view fileName(const OBMediaObject& object) const;
+
 public:
-    OBMediaObjectBatch(MakeKey key, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files);
+    OBMediaObjectBatch(MakeKey key, const TrailingBytes& trailing, std::shared_ptr<const OBMediaObjectKind> kind,
+        OBFolderOfFiles folder, std::span<const OBFileOfFolder> files);
 
 private:
-    std::shared_ptr<const OBMediaFolder> _folder;
-    std::unique_ptr<OBMediaObject[]> _objects;
+    const std::shared_ptr<const OBMediaObjectKind> _kind;
+    const platform::Text _folder;
+    const std::span<OBMediaObject> _objects; ///< behind this; the names of their files follow, one after the other
 };

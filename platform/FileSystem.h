@@ -74,7 +74,7 @@ struct ItemFlags {
 enum class MarkerAnswer : std::uint8_t {
     absent,
     present,
-    link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed
+    link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed to anything
 };
 
 /// What a listing is to find out beside names and flags, so that a scan needs no second call an item.
@@ -92,6 +92,9 @@ struct ListingRequest {
     /// The size and the creation date of every item that is neither a folder, nor a link, nor hidden by its name.
     bool fileFacts = false;
     LinkPolicy links = LinkPolicy::follow;
+    /// With LinkPolicy::stop: a link of the marker's name inside a folder is followed all the same where the system comes
+    /// to something by it.
+    bool followsMarkers = false;
 };
 
 class FolderListing;

@@ -83,6 +83,7 @@ void OBMontaroPlugin::registerQueries()
 
 void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root)
 {
+    const std::shared_ptr<const OBMediaObjectKind> kind = representativeKind(*this, projectFormatVersion);
     OBMediaObjectList objects;
     for (const OBMediaGroupRef& child : root->childGroups()) {
         const OBTypeIdentifierRef type = child->typeIdentifier();
@@ -92,9 +93,9 @@ void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& r
             objects = objects.appending(child->mediaObjects());
             continue;
         }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
+        const ChosenMovie chosen = chooseRepresentativeMovies(*this, { &child, 1 }).front();
         if (chosen.movie)
-            objects = objects.appending(makeRepresentative(*this, *child, chosen, projectFormatVersion));
+            objects = objects.appending(makeRepresentative(kind, *child, chosen));
     }
     root->setMediaObjects(std::move(objects));
 }

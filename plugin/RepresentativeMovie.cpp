@@ -3,22 +3,16 @@
 #include "plugin/MontaroConstants.h"
 
 #include "host/OBConstants.h"
-#include "platform/Immortal.h"
+#include "platform/Clock.h"
+#include "platform/Platform.h"
 
+#include <chrono>
 #include <utility>
 
 using platform::Text;
 using platform::Value;
 
 namespace {
-
-/// Made once, so that a library of many projects does not repeat them.
-struct RepresentativeKeys {
-    Text projectPath = OBMontaroProjectPathKey;
-    Text resolution = OBMediaObjectResolutionKey;
-    Text formatVersion = OBMontaroProjectFormatVersion;
-    Text isRepresentative = OBMontaroProjectRepresentative;
-};
 
 /// Walks on whatever thread it is called on; on the main thread the thumbnails are produced here and now.
 ChosenMovie walkMovies(const OBMediaManager& manager, const OBMediaObjectList& movies)
@@ -29,11 +23,27 @@ ChosenMovie walkMovies(const OBMediaManager& manager, const OBMediaObjectList& m
             break;
         OBMediaObjectRef movie = movies[index];
         movie->thumbnailImage();
-        Value resolution = movie->attributeForKey(OBMediaObjectResolutionKey);
+        const Value resolution = movie->attributeForKey(OBMediaObjectResolutionKey);
         if (!resolution.size())
             continue;
-        if (!chosen.movie || resolution.size()->width > chosen.resolution.size()->width)
-            chosen = { std::move(movie), std::move(resolution) };
+        if (!chosen.movie || resolution.size()->width > chosen.width)
+            chosen = { std::move(movie), resolution.size()->width };
+    }
+    return chosen;
+}
+
+/// Reading the movies of a project takes less time than passing a turn there and back, so a turn serves several.
+std::vector<ChosenMovie> walkProjects(OBMediaManager& manager, std::span<const OBMediaGroupRef> projects)
+{
+    constexpr std::chrono::milliseconds turnAtMost { 1 }; // nobody sees or feels the main thread stop for so long
+    const platform::Clock& clock = manager.platform().clock;
+    const std::chrono::nanoseconds end = clock.monotonic() + turnAtMost;
+    std::vector<ChosenMovie> chosen;
+    for (const OBMediaGroupRef& project : projects) {
+        if (!chosen.empty() && (manager.isCancelLoadRequestPending() || clock.monotonic() >= end))
+            break;
+        manager.notePathAtWork(project->path());
+        chosen.push_back(walkMovies(manager, project->mediaObjects()));
     }
     return chosen;
 }
@@ -47,31 +57,35 @@ bool areAllProduced(const OBMediaObjectList& movies)
 
 } // namespace
 
-ChosenMovie chooseRepresentativeMovie(OBMediaManager& manager, const OBMediaGroup& project)
+std::vector<ChosenMovie> chooseRepresentativeMovies(OBMediaManager& manager, std::span<const OBMediaGroupRef> projects)
 {
-    const OBMediaObjectList movies = project.mediaObjects();
+    std::vector<ChosenMovie> chosen;
     // Thumbnails that are there already need no turn of the main thread.
-    if (areAllProduced(movies))
-        return walkMovies(manager, movies);
-    manager.notePathAtWork(project.path());
-    ChosenMovie chosen;
-    manager.performOnMainThreadAndWait([&] { chosen = walkMovies(manager, movies); });
+    if (const OBMediaObjectList movies = projects.front()->mediaObjects(); areAllProduced(movies)) {
+        chosen.push_back(walkMovies(manager, movies));
+        return chosen;
+    }
+    manager.performOnMainThreadAndWait([&] { chosen = walkProjects(manager, projects); });
+    if (chosen.empty())
+        chosen.emplace_back(); // the main loop has ended
     return chosen;
 }
 
-OBMediaObjectRef makeRepresentative(
-    OBMediaManager& manager, const OBMediaGroup& group, const ChosenMovie& chosen, const Text& formatVersion)
+std::shared_ptr<const OBMediaObjectKind> representativeKind(const OBMediaManager& manager, const Text& formatVersion)
 {
-    static platform::Immortal<RepresentativeKeys> keys;
-    OBMediaObjectRef representative = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, group.name());
-    representative->setMediaSourceType(OBMediaSourceTypePlugin);
-    representative->setSourcePluginIdentifier(manager.pluginIdentifier());
-    representative->setPathOfObject(*chosen.movie);
-    representative->setAttribute_forKey(group.URL().path, keys->projectPath);
-    representative->setAttribute_forKey(chosen.resolution, keys->resolution);
+    auto kind = std::make_shared<OBMediaObjectKind>();
+    kind->mediaType = OBMediaTypeMovie;
+    kind->mediaSourceType = OBMediaSourceTypePlugin;
+    kind->sourcePluginIdentifier = manager.pluginIdentifier();
+    kind->groupPathKey = OBMontaroProjectPathKey;
     if (formatVersion)
-        representative->setAttribute_forKey(formatVersion, keys->formatVersion);
-    representative->setAttribute_forKey(true, keys->isRepresentative);
-    representative->setIcon(chosen.movie->thumbnailImage());
-    return representative;
+        kind->attributes.emplace_back(OBMontaroProjectFormatVersion, formatVersion);
+    kind->attributes.emplace_back(OBMontaroProjectRepresentative, true);
+    return kind;
+}
+
+OBMediaObjectRef makeRepresentative(
+    const std::shared_ptr<const OBMediaObjectKind>& kind, const OBMediaGroup& group, const ChosenMovie& chosen)
+{
+    return OBMediaObject::representative(kind, group.name(), group.URL().path, chosen.movie);
 }

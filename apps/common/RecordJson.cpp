@@ -25,7 +25,7 @@ namespace {
 
     void writeText(JsonWriter& writer, std::string_view key, const Text& text)
     {
-        writer.key(key);
+        writer.plainKey(key);
         writer.text(text);
     }
 
@@ -36,7 +36,7 @@ namespace {
 
     void writeAttributes(JsonWriter& writer, const Value::Dictionary& attributes)
     {
-        writer.key("attributes");
+        writer.plainKey("attributes");
         writer.beginObject();
         for (const Value::Entry& attribute : attributes) {
             writer.key(attribute.first);
@@ -48,10 +48,10 @@ namespace {
     void writeObject(JsonWriter& writer, const OBMediaObject& object)
     {
         writer.beginObject();
-        writer.key("mediaType");
+        writer.plainKey("mediaType");
         writer.integer(object.mediaType());
         writeText(writer, "name", object.name());
-        writer.key("mediaSourceType");
+        writer.plainKey("mediaSourceType");
         writer.integer(object.mediaSourceType());
         writeText(writer, "sourcePluginIdentifier", object.sourcePluginIdentifier());
         writeText(writer, "path", object.path());
@@ -76,7 +76,7 @@ namespace {
     {
         writer.beginObject();
         const OBTypeIdentifierRef type = group.typeIdentifier();
-        writer.key("typeIdentifier");
+        writer.plainKey("typeIdentifier");
         if (type)
             writer.string(type->text());
         else
@@ -86,13 +86,13 @@ namespace {
         writeText(writer, "parentID", group.parentID());
         writeIcon(writer, group.icon());
         writeText(writer, "path", group.path());
-        writer.key("modificationDate");
+        writer.plainKey("modificationDate");
         if (const std::optional<platform::Date> date = group.modificationDate())
             writer.date(*date);
         else
             writer.null();
         writeAttributes(writer, group.attributes());
-        writer.key("mediaObjects");
+        writer.plainKey("mediaObjects");
         writeObjects(writer, group.ownMediaObjects());
     }
 
@@ -105,7 +105,7 @@ namespace {
     OpenGroup beginGroupWithChildren(JsonWriter& writer, const OBMediaGroup& group)
     {
         beginGroup(writer, group);
-        writer.key("childGroups");
+        writer.plainKey("childGroups");
         writer.beginList();
         return { group.childGroups(), 0 };
     }

@@ -1,3 +1,4 @@
+#include "apps/common/Memory.h"
 #include "apps/common/StandardError.h"
 #include "apps/common/Terminal.h"
 #include "apps/ombrix/Arguments.h"
@@ -26,6 +27,7 @@ int run(ombrix::Program& program)
 
 int main(int count, char** words)
 {
+    apps::takeMemoryInLargeSteps();
     apps::guardStandardDescriptors();
     apps::eraseProgressOnSignals();
     const std::vector<std::string_view> typed(words + (count > 0 ? 1 : 0), words + count);

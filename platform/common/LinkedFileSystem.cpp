@@ -139,6 +139,7 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
         return listingThatStops(folder, request);
     ListingRequest stopping = request;
     stopping.links = LinkPolicy::stop;
+    stopping.followsMarkers = !_table.hasNamedLinks();
     LinkedPlace place = substitutedPlaceOf(folder, LastLink::followed);
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);

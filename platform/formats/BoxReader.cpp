@@ -6,14 +6,6 @@ namespace {
     constexpr std::uint64_t shortHeader = 8;
     constexpr std::uint64_t longHeader = 16;
 
-    std::uint64_t number(const std::byte* bytes, std::size_t count)
-    {
-        std::uint64_t result = 0;
-        for (std::size_t index = 0; index < count; ++index)
-            result = (result << 8) | std::to_integer<std::uint64_t>(bytes[index]);
-        return result;
-    }
-
 } // namespace
 
 BoxStep BoxReader::next(FileRange& rest, ZeroSize zeroSize, Box& box)
@@ -44,34 +36,13 @@ BoxStep BoxReader::next(FileRange& rest, ZeroSize zeroSize, Box& box)
     return BoxStep::box;
 }
 
-const std::byte* BoxReader::bytesAt(std::uint64_t offset, std::size_t count)
+const std::byte* BoxReader::bytesOutsideWindow(std::uint64_t offset, std::size_t count)
 {
-    const bool isInWindow = offset >= _windowStart && offset - _windowStart <= _windowLength
-        && _windowLength - (offset - _windowStart) >= count;
-    if (!isInWindow) {
-        if (offset > _size || _size - offset < count || ++_reads > mostReads)
-            return nullptr;
-        _windowStart = offset;
-        _windowLength = _file.read(offset, _window);
-        if (_windowLength < count)
-            return nullptr;
-    }
-    return _window.data() + (offset - _windowStart);
-}
-
-std::uint16_t BoxReader::number16(const std::byte* bytes) noexcept
-{
-    return static_cast<std::uint16_t>(number(bytes, 2));
-}
-
-std::uint32_t BoxReader::number32(const std::byte* bytes) noexcept
-{
-    return static_cast<std::uint32_t>(number(bytes, 4));
-}
-
-std::uint64_t BoxReader::number64(const std::byte* bytes) noexcept
-{
-    return number(bytes, 8);
+    if (offset > _size || _size - offset < count || ++_reads > mostReads)
+        return nullptr;
+    _windowStart = offset;
+    _windowLength = _file.read(offset, _window);
+    return _windowLength < count ? nullptr : _window.data();
 }
 
 } // namespace platform

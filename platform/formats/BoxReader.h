@@ -61,16 +61,38 @@ public:
 
     /// The bytes from `offset` on, at most 128 of them, null when the file ends before, cannot be read, or too much was
     /// read already. Valid until the next call.
-    const std::byte* bytesAt(std::uint64_t offset, std::size_t count);
+    const std::byte* bytesAt(std::uint64_t offset, std::size_t count)
+    {
+        const std::uint64_t inWindow = offset - _windowStart; // far beyond the window where it lies before it
+        if (inWindow <= _windowLength && _windowLength - inWindow >= count)
+            return _window.data() + inWindow;
+        return bytesOutsideWindow(offset, count);
+    }
 
     /// Big-endian numbers out of what `bytesAt` answers.
-    static std::uint16_t number16(const std::byte* bytes) noexcept;
-    static std::uint32_t number32(const std::byte* bytes) noexcept;
-    static std::uint64_t number64(const std::byte* bytes) noexcept;
+    static std::uint16_t number16(const std::byte* bytes) noexcept
+    {
+        return static_cast<std::uint16_t>(at(bytes, 0) << 8 | at(bytes, 1));
+    }
+    static std::uint32_t number32(const std::byte* bytes) noexcept
+    {
+        return at(bytes, 0) << 24 | at(bytes, 1) << 16 | at(bytes, 2) << 8 | at(bytes, 3);
+    }
+    static std::uint64_t number64(const std::byte* bytes) noexcept
+    {
+        return std::uint64_t { number32(bytes) } << 32 | number32(bytes + 4);
+    }
 
 private:
     static constexpr std::size_t mostBoxes = 10'000;
     static constexpr std::size_t mostReads = 10'000;
+
+    static std::uint32_t at(const std::byte* bytes, std::size_t index) noexcept
+    {
+        return std::to_integer<std::uint32_t>(bytes[index]);
+    }
+
+    const std::byte* bytesOutsideWindow(std::uint64_t offset, std::size_t count);
 
     const OpenFile& _file;
     const std::uint64_t _size;

@@ -4,14 +4,13 @@
 #include "platform/formats/Dates.h"
 #include "platform/formats/Unicode.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <cstring>
 
 namespace platform {
 namespace {
-
-    constexpr std::size_t blockSize = 64 * 1024;
 
     constexpr std::uint64_t everyByte(std::uint64_t byte)
     {
@@ -24,13 +23,13 @@ namespace {
         return (eight - everyByte(1)) & ~eight & everyByte(0x80);
     }
 
-    /// Whether all eight are ASCII and may stand in a string as they are.
-    bool arePlain(std::uint64_t eight)
+    /// 0 when all eight are ASCII and may stand in a string as they are.
+    std::uint64_t unplainBytes(std::uint64_t eight)
     {
         const std::uint64_t controls = (eight - everyByte(0x20)) & ~eight & everyByte(0x80);
         const std::uint64_t quotes = zeroBytes(eight ^ everyByte('"'));
         const std::uint64_t backslashes = zeroBytes(eight ^ everyByte('\\'));
-        return ((eight & everyByte(0x80)) | controls | quotes | backslashes) == 0;
+        return (eight & everyByte(0x80)) | controls | quotes | backslashes;
     }
 
     bool isPlain(char letter)
@@ -39,11 +38,29 @@ namespace {
             && letter != '\\';
     }
 
-    bool arePlain(const char* letters)
+    std::uint64_t eightFrom(const char* letters)
     {
         std::uint64_t eight = 0;
         std::memcpy(&eight, letters, sizeof eight);
-        return arePlain(eight);
+        return eight;
+    }
+
+    bool arePlain(const char* letters)
+    {
+        return unplainBytes(eightFrom(letters)) == 0;
+    }
+
+    /// Whether all of `text` is ASCII and may stand in a string as it is.
+    bool isPlain(std::string_view text)
+    {
+        constexpr std::size_t step = sizeof(std::uint64_t);
+        if (text.size() < step)
+            return std::all_of(text.begin(), text.end(), [](char letter) { return isPlain(letter); });
+        // One decision for all, for it is the usual one. The last eight are looked at once more where they overlap.
+        std::uint64_t unplain = unplainBytes(eightFrom(text.data() + text.size() - step));
+        for (std::size_t end = step; end < text.size(); end += step)
+            unplain |= unplainBytes(eightFrom(text.data() + end - step));
+        return unplain == 0;
     }
 
     /// How many bytes from `start` on may stand in a string as they are.
@@ -132,7 +149,7 @@ void JsonWriter::real(double real)
     std::to_chars_result end
         = isWhole ? std::to_chars(digits, last, static_cast<std::int64_t>(real)) : std::to_chars(digits, last, real);
     const std::string_view shortest(digits, static_cast<std::size_t>(end.ptr - digits));
-    if (shortest.find_first_of(".e") == std::string_view::npos) {
+    if (isWhole || shortest.find_first_of(".e") == std::string_view::npos) {
         *end.ptr++ = '.';
         *end.ptr++ = '0';
     }
@@ -161,9 +178,9 @@ void JsonWriter::date(Date date)
 void JsonWriter::size(Size size)
 {
     beginObject();
-    key("width");
+    plainKey("width");
     real(size.width);
-    key("height");
+    plainKey("height");
     real(size.height);
     endObject();
 }
@@ -236,8 +253,7 @@ void JsonWriter::literal(std::string_view text)
 
 void JsonWriter::quoted(std::string_view text)
 {
-    std::size_t run = plainRun(text, 0);
-    if (run == text.size() && text.size() + 2 <= blockSize - _length) {
+    if (text.size() + 2 <= blockSize - _length && isPlain(text)) {
         char* end = _block.get() + _length;
         *end++ = '"';
         if (!text.empty())
@@ -248,7 +264,8 @@ void JsonWriter::quoted(std::string_view text)
     }
     append('"');
     std::size_t position = 0;
-    for (;; run = plainRun(text, position)) {
+    for (;;) {
+        const std::size_t run = plainRun(text, position);
         append(text.substr(position, run));
         position += run;
         if (position == text.size())

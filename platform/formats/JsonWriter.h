@@ -2,7 +2,9 @@
 
 #include "platform/Value.h"
 
+#include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <functional>
 #include <memory>
 #include <string_view>
@@ -31,6 +33,21 @@ public:
     void endList() { end(']'); }
     /// The key of the value that is written next.
     void key(std::string_view name);
+    /// The same for a name known to be short and of ASCII in which nothing has to be escaped: nobody looks for it.
+    void plainKey(std::string_view name)
+    {
+        makeRoomFor(name.size() + 4);
+        char* end = _block.get() + _length;
+        if (_needsComma)
+            *end++ = ',';
+        *end++ = '"';
+        std::memcpy(end, name.data(), name.size());
+        end += name.size();
+        *end++ = '"';
+        *end++ = ':';
+        _length = static_cast<std::size_t>(end - _block.get());
+        _needsComma = false;
+    }
 
     void null() { literal("null"); }
     void boolean(bool boolean) { literal(boolean ? "true" : "false"); }
@@ -55,6 +72,14 @@ public:
     void flush();
 
 private:
+    static constexpr std::size_t blockSize = 64 * 1024;
+
+    /// At most a block.
+    void makeRoomFor(std::size_t length)
+    {
+        if (length > blockSize - _length)
+            flush();
+    }
     void begin(char bracket);
     void end(char bracket);
     void literal(std::string_view text);

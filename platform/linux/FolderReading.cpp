@@ -140,9 +140,11 @@ namespace {
         if (kind != ItemKind::folder && !(follows && kind == ItemKind::symbolicLink))
             return MarkerAnswer::absent;
         _markerPath.assign(name).append(1, '/').append(_request.marker);
-        if (follows) {
+        // Less work for the system than to tell what stands there, which is then asked only where there is nothing.
+        if (follows || _request.followsMarkers) {
             const int answer = uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); });
-            return answer == 0 ? MarkerAnswer::present : MarkerAnswer::absent;
+            if (answer == 0 || follows)
+                return answer == 0 ? MarkerAnswer::present : MarkerAnswer::absent;
         }
         struct stat facts;
         const auto ask = [&] { return fstatat(_folder, _markerPath.c_str(), &facts, AT_SYMLINK_NOFOLLOW); };

@@ -32,7 +32,8 @@ constexpr platform::ListingRequest projectListing { MontaroProjectIdentifierPath
 std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin)
 {
     return std::make_shared<const OBMediaObjectKind>(OBMediaObjectKind { OBMediaTypeMovie, OBMediaSourceTypePlugin,
-        plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey } });
+        plugin.pluginIdentifier(), sharedValues().projectIcon.load(), { OBMontaroProjectPathKey },
+        Text::joined("/", sharedItemsFolder, "/") });
 }
 
 /// What is no project is not left out for that.
@@ -42,18 +43,6 @@ bool isProject(const ScanReport& report, const FolderItem& item, const Text& fol
         return report.passes(ScanRules::hasProjectMarker, item, folder);
     report.found([&] { return ScanFindings::noProject(platform::pathJoined(folder, item.name)); });
     return false;
-}
-
-OBMediaGroupRef groupForFolder(
-    OBTypeIdentifierRef type, std::string_view name, const Text& path, const Text& parentID, const OBImageRef& icon)
-{
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
-    group->setName(name);
-    group->setParentID(parentID);
-    group->setID(path);
-    group->setIcon(icon);
-    group->setPath(path);
-    return group;
 }
 
 } // namespace
@@ -114,14 +103,14 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
     if (!path)
         return nullptr;
     const std::string_view name = platform::lastPathComponent(path);
-    const OBMediaGroupRef folder = groupForFolder(
-        OBMontaroFolderGroupTypeIdentifier, name, path, platform::pathByRemovingLastComponent(path), scan.projectIcon);
 
     // A folder may be known to people by a name with an extension that it does not have on disk.
     Text listed = path;
     FolderListing listing = listFolder(path, projectListing);
-    folder->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
-                                                       : OBMediaGroup::modDateForFile(path));
+    const OBMediaGroupRef folder = OBMediaGroup::withFields({ OBMontaroFolderGroupTypeIdentifier, name, path,
+        platform::pathByRemovingLastComponent(path), path, scan.projectIcon,
+        listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
+                               : OBMediaGroup::modDateForFile(path) });
     if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
@@ -146,11 +135,10 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 
     if (folder->childGroups().empty()) {
         const OBMediaGroupRef placeholder
-            = groupForFolder(listed == _MontaroDefaultPath() ? OBMontaroProjectLibraryGroupTypeIdentifier
-                                                             : OBMontaroFolderGroupTypeIdentifier,
-                platform::lastPathComponent(listed), listed, listed, scan.projectIcon);
-        placeholder->setModificationDate(
-            listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed));
+            = OBMediaGroup::withFields({ listed == _MontaroDefaultPath() ? OBMontaroProjectLibraryGroupTypeIdentifier
+                                                                         : OBMontaroFolderGroupTypeIdentifier,
+                platform::lastPathComponent(listed), listed, listed, listed, scan.projectIcon,
+                listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed) });
         scan.addToFlatGroups(placeholder);
     }
     _createMontaroProjectsFolderMediaObjects(folder);
@@ -162,14 +150,14 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
     const Text& listedFolder, const FolderListing& listing, const FolderItem& item, ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
-    const OBMediaGroupRef project = groupForFolder(OBMontaroProjectGroupTypeIdentifier,
-        platform::nameWithoutExtension(item.name), path, listedFolder, scan.projectIcon);
-    project->setModificationDate(item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path));
+    const OBMediaGroupRef project = OBMediaGroup::withFields(
+        { OBMontaroProjectGroupTypeIdentifier, platform::nameWithoutExtension(item.name), path, listedFolder, path,
+            scan.projectIcon, item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path) });
     scan.addToFlatGroups(project);
 
     const SharedMovies movies = item.subfolder ? sharedMoviesOfListedProject(scan.report, path, listing, item)
                                                : sharedMoviesOfProject(*this, scan.report, path);
-    project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.folder, movies.files));
+    project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.project, movies.files));
     project->setIcon(movies.files.empty() ? scan.emptyProjectIcon : scan.projectIcon);
     noteItemsFound(movies.files.size());
     return project;

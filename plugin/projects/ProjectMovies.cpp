@@ -10,6 +10,7 @@
 #include "host/OBConstants.h"
 #include "platform/PathText.h"
 
+#include <algorithm>
 #include <utility>
 
 using platform::Text;
@@ -19,6 +20,27 @@ namespace {
 
 constexpr const char* projectsPasteboardType = "OBMontaroProjectsPboardType";
 
+/// Whether a child of a folder is one whose movies it shows: neither a library nor a folder.
+bool isProject(const OBMediaGroupRef& child)
+{
+    const OBTypeIdentifierRef type = child->typeIdentifier();
+    return type != OBMontaroProjectLibraryGroupTypeIdentifier && type != OBMontaroFolderGroupTypeIdentifier;
+}
+
+void addRepresentatives(OBMediaManager& manager, OBMediaGroup& folder, std::span<const OBMediaGroupRef> projects)
+{
+    const std::shared_ptr<const OBMediaObjectKind> kind = representativeKind(manager, {});
+    while (!projects.empty() && !manager.isCancelLoadRequestPending()) {
+        const std::vector<ChosenMovie> chosen = chooseRepresentativeMovies(manager, projects);
+        for (std::size_t index = 0; index < chosen.size(); ++index) {
+            if (chosen[index].movie)
+                folder.setMediaObjects(
+                    folder.ownMediaObjects().appending(makeRepresentative(kind, *projects[index], chosen[index])));
+        }
+        projects = projects.subspan(chosen.size());
+    }
+}
+
 } // namespace
 
 Value OBMontaroPlugin::supportedPasteboardTypes()
@@ -27,18 +49,13 @@ Value OBMontaroPlugin::supportedPasteboardTypes()
     return Value::List { types };
 }
 
-SharedMovies::SharedMovies(const Text& project)
-    : folder { Text::joined(project, "/", sharedItemsFolder) }
-{
-}
-
 SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& report, const Text& project)
 {
     SharedMovies movies(project);
-    movies.listing = manager.listFolder(movies.folder.path, {});
-    movies.folder.pathIsReal = movies.listing.pathIsReal();
+    movies.listing = manager.listFolder(movies.folder(), {});
+    movies.project.pathIsReal = movies.listing.pathIsReal();
     if (movies.listing.empty())
-        report.found([&] { return ScanFindings::listedFolder(movies.folder.path, movies.listing); });
+        report.found([&] { return ScanFindings::listedFolder(movies.folder(), movies.listing); });
     movies.take(report, movies.listing);
     return movies;
 }
@@ -47,7 +64,7 @@ SharedMovies sharedMoviesOfListedProject(const ScanReport& report, const Text& p
     const platform::FolderListing& library, const platform::FolderItem& item)
 {
     SharedMovies movies(project);
-    movies.folder.pathIsReal = library.pathIsReal() && item.kind == platform::ItemKind::folder;
+    movies.project.pathIsReal = library.pathIsReal() && item.kind == platform::ItemKind::folder;
     movies.take(report, *item.subfolder);
     return movies;
 }
@@ -57,7 +74,7 @@ std::vector<std::string> OBMontaroPlugin::_renderedMoviesPathsForProjectPath(con
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     std::vector<std::string> paths;
     for (const OBFileOfFolder& file : movies.files)
-        paths.push_back(platform::pathJoined(movies.folder.path, file.name));
+        paths.push_back(platform::pathJoined(movies.folder(), file.name));
     return paths;
 }
 
@@ -66,30 +83,28 @@ std::optional<std::string> OBMontaroPlugin::_previewFileForProjectPath(const Tex
     const SharedMovies movies = sharedMoviesOfProject(*this, ScanReport(*this), path);
     if (movies.files.empty())
         return std::nullopt;
-    return platform::pathJoined(movies.folder.path, movies.files.front().name);
+    return platform::pathJoined(movies.folder(), movies.files.front().name);
 }
 
 void OBMontaroPlugin::_createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder)
 {
     const OBMediaGroupList children = folder->childGroups();
-    for (const OBMediaGroupRef& child : children) {
-        if (isCancelLoadRequestPending())
-            return;
-        const OBTypeIdentifierRef type = child->typeIdentifier();
-        if (type == OBMontaroProjectLibraryGroupTypeIdentifier)
-            continue;
-        if (type == OBMontaroFolderGroupTypeIdentifier) {
+    for (auto child = children.begin(); child != children.end() && !isCancelLoadRequestPending();) {
+        const OBTypeIdentifierRef type = (*child)->typeIdentifier();
+        if (type == OBMontaroProjectLibraryGroupTypeIdentifier) {
+            ++child;
+        } else if (type == OBMontaroFolderGroupTypeIdentifier) {
             // Cancel is asked before each object, and what had been taken by then stays.
-            const OBMediaObjectList below = child->ownMediaObjects();
+            const OBMediaObjectList below = (*child)->ownMediaObjects();
             std::size_t taken = 0;
             while (taken < below.size() && !isCancelLoadRequestPending())
                 ++taken;
             folder->setMediaObjects(folder->ownMediaObjects().appending(below.prefix(taken)));
-            continue;
-        }
-        const ChosenMovie chosen = chooseRepresentativeMovie(*this, *child);
-        if (chosen.movie) {
-            folder->setMediaObjects(folder->ownMediaObjects().appending(makeRepresentative(*this, *child, chosen, {})));
+            ++child;
+        } else {
+            const auto end = std::find_if_not(child, children.end(), isProject);
+            addRepresentatives(*this, *folder, { child, end });
+            child = end;
         }
     }
 }

@@ -7,8 +7,10 @@
 #include "host/OBMediaObject.h"
 #include "host/OBMediaObjectList.h"
 #include "platform/FileSystem.h"
+#include "platform/PathText.h"
 
 #include <memory>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -31,24 +33,30 @@ inline constexpr std::string_view sharedItemsFolder = "Shared Items";
 
 /// What is in a project's folder of shared movies that is a movie, in listing order.
 struct SharedMovies {
-    explicit SharedMovies(const platform::Text& project);
+    explicit SharedMovies(const platform::Text& path)
+        : project { path }
+    {
+    }
     SharedMovies(const SharedMovies&) = delete;
     SharedMovies& operator=(const SharedMovies&) = delete;
     SharedMovies(SharedMovies&&) = default;
     SharedMovies& operator=(SharedMovies&&) = default;
 
-    OBFolderOfFiles folder;
+    OBFolderOfFiles project;
     platform::FolderListing listing {}; ///< where the folder was listed by itself
     std::vector<OBFileOfFolder> files {}; ///< names belong to the listing that they were taken from
 
+    std::string folder() const { return platform::pathJoined(project.path, sharedItemsFolder); }
+
     template <class Items> void take(const ScanReport& report, const Items& items)
     {
+        const std::string place = report.isObserved() ? folder() : std::string();
         if (items.size() != 0)
-            report.found([&] { return ScanFindings::moviesFolder(folder.path, "project", items.size()); });
+            report.found([&] { return ScanFindings::moviesFolder(place, "project", items.size()); });
         files.reserve(items.size());
         for (std::size_t index = 0; index < items.size(); ++index) {
             const platform::FolderItem item = items[index];
-            if (report.passes(ScanRules::hasMovieExtension, item, folder.path))
+            if (report.passes(ScanRules::hasMovieExtension, item, place))
                 files.push_back({ item.name, item.kind == platform::ItemKind::file });
         }
     }

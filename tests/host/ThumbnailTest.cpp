@@ -218,3 +218,31 @@ TEST_CASE("a thumbnail outlives the object and the list it came from")
     image->setSize({ 64, 36 });
     CHECK(image->size() == Size { 64, 36 });
 }
+
+TEST_CASE("an object that is given its own thumbnail for an icon shows it and still goes with its last owner")
+{
+    TestHost test;
+    test.host();
+    const std::string file = writeMovie(test, "movie.mov");
+    for (OBMediaObjectRef object : { objectAt(file), objectOfFolder(test.machine.folder.path(), "movie.mov") }) {
+        const OBImage* produced = object->thumbnailImage().get();
+        REQUIRE(produced != nullptr);
+        object->setThumbnailImage(OBImage::pictureNamed("other", Size { 1, 1 }, "/other.svg"));
+        object->setThumbnailImage(OBImageRef(object, const_cast<OBImage*>(produced)));
+        object->setIcon(object->thumbnailImage());
+        CHECK(object->thumbnailImage().get() == produced);
+        CHECK(object->icon().get() == produced);
+        const OBImageRef icon = object->icon();
+        const std::weak_ptr<OBMediaObject> gone = object;
+        object = nullptr;
+        CHECK_FALSE(gone.expired());
+        CHECK(icon->pixelSource().file == Text(file));
+    }
+    std::weak_ptr<OBMediaObject> gone;
+    {
+        const auto object = objectOfFolder(test.machine.folder.path(), "movie.mov");
+        object->setIcon(object->thumbnailImage());
+        gone = object;
+    }
+    CHECK(gone.expired());
+}

@@ -58,6 +58,21 @@ TEST_CASE("commas stand between values, and nowhere else")
     CHECK(text == "{\"a\":[1,[],{},null],\"b\":true,\"c\":null}\nfalse\n");
 }
 
+TEST_CASE("a key that needs no escape is written as any other, wherever a block ends")
+{
+    const auto keys = [](void (JsonWriter::*key)(std::string_view)) {
+        return written([key](JsonWriter& json) {
+            json.beginObject();
+            for (int number = 0; number < 20'000; ++number) {
+                (json.*key)("name");
+                json.integer(number);
+            }
+            json.endObject();
+        });
+    };
+    CHECK(keys(&JsonWriter::plainKey) == keys(&JsonWriter::key));
+}
+
 TEST_CASE("a real is as short as it can be and shows that it is one")
 {
     CHECK(writtenReal(1920) == "1920.0");

@@ -204,8 +204,10 @@ TEST_CASE("a marker is found inside folders, and through links only where links 
     temporary.link("byGoodLink/marker", temporary.path("file"));
     temporary.link("link", "holder");
     const LinuxFileSystem files;
-    const auto markers = [&](LinkPolicy links) {
-        const FolderListing listing = files.itemsInFolder(temporary.path(), asking("marker", links));
+    const auto markers = [&](LinkPolicy links, bool followsMarkers = false) {
+        ListingRequest request = asking("marker", links);
+        request.followsMarkers = followsMarkers;
+        const FolderListing listing = files.itemsInFolder(temporary.path(), request);
         std::map<std::string, MarkerAnswer> answers;
         for (const FolderItem item : listing) {
             answers.emplace(item.name, item.marker);
@@ -221,6 +223,8 @@ TEST_CASE("a marker is found inside folders, and through links only where links 
     expected["byLink"] = expected["byGoodLink"] = MarkerAnswer::link;
     expected["link"] = MarkerAnswer::absent;
     CHECK(markers(LinkPolicy::stop) == expected);
+    expected["byGoodLink"] = MarkerAnswer::present;
+    CHECK(markers(LinkPolicy::stop, true) == expected);
 }
 
 TEST_CASE("a folder that may not be listed, and one that may only be listed, answer what they allow")

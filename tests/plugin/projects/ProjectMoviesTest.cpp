@@ -5,6 +5,8 @@
 
 #include <doctest/doctest.h>
 
+#include <chrono>
+
 using namespace tests;
 using Lines = std::vector<std::string>;
 
@@ -190,4 +192,40 @@ TEST_CASE("a folder's objects are appended to those it has, and project librarie
     source->_createMontaroProjectsFolderMediaObjects(folder);
     CHECK(objectNames(folder->ownMediaObjects()) == "1 2 project 1 2 untagged");
     CHECK(objectNames(before) == "1 2");
+}
+
+namespace {
+
+/// The movies in the order in which they were read, and "-" wherever the main thread got to other work meanwhile, with
+/// reading one taking so long.
+Lines readsAndOtherWork(std::chrono::nanoseconds readingTakes)
+{
+    SourceMachine machine;
+    machine.projects().project("F/P").movie("a.mov").movie("b.mov");
+    machine.projects().project("F/Q").movie("c.mov");
+    machine.projects().project("F/R").movie("d.mov");
+    Trace order;
+    machine.movies.whenRead = [&](std::string_view path) {
+        order.add(std::string(path.substr(path.rfind('/') + 1)));
+        machine.mainRunLoop.post([&order] { order.add("-"); });
+        machine.clock.advance(readingTakes);
+    };
+    const auto source = machine.makeSource();
+    machine.load(*source);
+    machine.onMainThread([] {});
+    return order.take();
+}
+
+} // namespace
+
+TEST_CASE("movies that are read fast are read in one turn of the main thread, those of several projects too")
+{
+    CHECK(readsAndOtherWork(std::chrono::microseconds(10))
+        == Lines { "a.mov", "b.mov", "c.mov", "d.mov", "-", "-", "-", "-" });
+}
+
+TEST_CASE("where movies are read slowly the main thread gets to its other work between two projects")
+{
+    CHECK(readsAndOtherWork(std::chrono::milliseconds(20))
+        == Lines { "a.mov", "b.mov", "-", "-", "c.mov", "-", "d.mov", "-" });
 }

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <utility>
 
+OBMediaObjectRunVisitor::~OBMediaObjectRunVisitor() = default;
 OBMediaObjectSequence::~OBMediaObjectSequence() = default;
 
 /// One object, or the first objects of a sequence.
@@ -49,6 +50,21 @@ public:
         return true;
     }
 
+    void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const override
+    {
+        std::size_t left = count;
+        for (const Part& part : _parts) {
+            if (left == 0)
+                break;
+            const std::size_t here = std::min(left, part.count);
+            if (part.object)
+                visitor.visitObject(part.object);
+            else
+                part.sequence->visitRuns(here, visitor);
+            left -= here;
+        }
+    }
+
 private:
     const OBSnapshotList<Part> _parts;
 };
@@ -63,6 +79,12 @@ void OBMediaObjectList::visit(const std::function<bool(OBMediaObject&)>& visitor
 {
     if (_sequence)
         _sequence->visit(_count, visitor);
+}
+
+void OBMediaObjectList::visitRuns(OBMediaObjectRunVisitor& visitor) const
+{
+    if (_sequence)
+        _sequence->visitRuns(_count, visitor);
 }
 
 OBMediaObjectList OBMediaObjectList::appendingPart(Part part) const
@@ -109,6 +131,7 @@ std::vector<OBMediaObjectRef> OBMediaObjectList::objects() const
 OBMediaObjectBatch::OBMediaObjectBatch(
     MakeKey, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files)
     : _folder(std::move(folder))
+    , _count(files.size())
     , _objects(std::make_unique<OBMediaObject[]>(files.size()))
 {
     std::uint32_t offset = 0;
@@ -153,4 +176,54 @@ bool OBMediaObjectBatch::visit(std::size_t count, const std::function<bool(OBMed
             return false;
     }
     return true;
+}
+
+void OBMediaObjectBatch::visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const
+{
+    visitor.visitBatch(*this, count);
+}
+
+std::string_view OBMediaObjectBatch::fileNames(std::size_t count) const
+{
+    const std::string_view all = _folder->fileNames;
+    return count == _count ? all : all.substr(0, offsetOfFileName(count));
+}
+
+std::string_view OBMediaObjectBatch::fileNameAtIndex(std::size_t index) const
+{
+    return _objects[index].fileName();
+}
+
+std::size_t OBMediaObjectBatch::offsetOfFileName(std::size_t index) const
+{
+    return static_cast<std::size_t>(fileNameAtIndex(index).data() - _folder->fileNames.data());
+}
+
+/// Names of one folder are about equally long, so a few steps from a guess are usually enough, and fetch fewer objects
+/// than halving does.
+std::size_t OBMediaObjectBatch::indexOfFileNameAt(std::size_t offset) const
+{
+    constexpr int mostSteps = 8;
+    const auto endsBefore
+        = [&](std::size_t index) { return offsetOfFileName(index) + fileNameAtIndex(index).size() <= offset; };
+    std::size_t index = offset * _count / _folder->fileNames.size();
+    for (int step = 0; step < mostSteps; ++step) {
+        if (offsetOfFileName(index) > offset)
+            --index;
+        else if (endsBefore(index))
+            ++index;
+        else
+            return index;
+    }
+    std::size_t first = 0;
+    for (std::size_t left = _count; left > 0;) {
+        const std::size_t half = left / 2;
+        if (endsBefore(first + half)) {
+            first += half + 1;
+            left -= half + 1;
+        } else {
+            left = half;
+        }
+    }
+    return first;
 }

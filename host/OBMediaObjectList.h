@@ -10,6 +10,18 @@
 #include <string_view>
 #include <vector>
 
+class OBMediaObjectBatch;
+
+/// Is shown what a list is made of.
+class OB_EXPORT OBMediaObjectRunVisitor {
+public:
+    virtual ~OBMediaObjectRunVisitor();
+    /// The first `count` objects of a batch.
+    virtual void visitBatch(const OBMediaObjectBatch& batch, std::size_t count) = 0;
+    /// An object that was made by itself.
+    virtual void visitObject(const OBMediaObjectRef& object) = 0;
+};
+
 /// A part of a list of media objects; immutable as far as any list shows it.
 class OB_EXPORT OBMediaObjectSequence {
 public:
@@ -18,6 +30,8 @@ public:
     virtual OBMediaObjectRef objectAtIndex(std::size_t index) const = 0;
     /// Calls `visit` for the first `count` objects in order until it answers false; answers false then.
     virtual bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const = 0;
+    /// Shows `visitor` what the first `count` objects are made of, in order.
+    virtual void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const = 0;
 };
 
 /// An immutable ordered list of media objects; 24 bytes, cheap to copy.
@@ -35,6 +49,8 @@ public:
 
     /// Calls `visitor` for each object in order until it answers false.
     void visit(const std::function<bool(OBMediaObject&)>& visitor) const;
+    /// Shows `visitor` what the list is made of, in order; batches stay valid while the list lives.
+    void visitRuns(OBMediaObjectRunVisitor& visitor) const;
 
     /// This list followed by one more object, or by the objects of another list.
     OBMediaObjectList appending(OBMediaObjectRef object) const;
@@ -81,6 +97,15 @@ public:
 
     OBMediaObjectRef objectAtIndex(std::size_t index) const override;
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override;
+    void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const override;
+
+    /// The file names of the first `count` objects one after the other, with nothing between them: a search reads one
+    /// block instead of a million objects. An object's name is its file name without the extension, always.
+    std::string_view fileNames(std::size_t count) const;
+    /// Where in them the file name of the object at `index` stands.
+    std::string_view fileNameAtIndex(std::size_t index) const;
+    /// The object whose file name holds the byte at `offset` of them.
+    std::size_t indexOfFileNameAt(std::size_t offset) const;
 
 private:
     struct MakeKey { };
@@ -89,6 +114,9 @@ public:
     OBMediaObjectBatch(MakeKey key, std::shared_ptr<const OBMediaFolder> folder, std::span<const OBFileOfFolder> files);
 
 private:
+    std::size_t offsetOfFileName(std::size_t index) const;
+
     std::shared_ptr<const OBMediaFolder> _folder;
+    std::size_t _count;
     std::unique_ptr<OBMediaObject[]> _objects;
 };

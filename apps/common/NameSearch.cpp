@@ -1,16 +1,12 @@
-// A library holds a million names, and a search that looked at each object would spend its time on fetching objects. So
-// the names of whole batches are folded into a block, the block is searched as one, and only what holds the longest word
-// is looked at by itself. A batch that several groups show is looked through once, for the innermost of them.
+// Groups of groups repeat the objects below them. A batch that several groups show is looked through once, for the
+// innermost of them; what else is repeated is sorted out among the hits, of which there are few.
 
 #include "apps/common/NameSearch.h"
 
-#include "platform/PathText.h"
-#include "platform/formats/FoldedText.h"
-#include "platform/formats/Unicode.h"
+#include "apps/common/NameBlock.h"
 
 #include <algorithm>
 #include <cstdint>
-#include <cstring>
 #include <iterator>
 #include <unordered_map>
 #include <unordered_set>
@@ -18,14 +14,6 @@
 
 namespace apps {
 namespace {
-
-    constexpr std::string_view representative = "Project Representative";
-    constexpr std::size_t blockSize = 16 * 1024;
-
-    bool isRepresentative(const OBMediaObject& object)
-    {
-        return !object.attributeForKey(representative).isNull();
-    }
 
     std::vector<FlatGroup> laidFlat(const OBMediaGroupRef& root)
     {
@@ -48,150 +36,6 @@ namespace {
         }
         return groups;
     }
-
-    /// Names one after the other, folded, in tree order, until there are enough of them to be looked through.
-    class NameBlock {
-    public:
-        /// Whose name it is.
-        struct Owner {
-            std::size_t group = 0;
-            std::uint32_t position = 0; // as a hit has it; of a run, that of its first object
-            const OBMediaObjectRef* object = nullptr; // made by itself
-            const OBMediaObjectBatch* batch = nullptr;
-            std::size_t index = 0; // in the batch
-            bool isOnlyHere = true; // no other list that is looked through is known to hold it
-        };
-
-        explicit NameBlock(const NameQuery& query)
-            : _query(query)
-            , _needle(query.longestWord())
-        {
-            _folded.reserve(2 * blockSize);
-        }
-
-        void addName(const Owner& owner, std::string_view name)
-        {
-            const std::size_t start = _folded.size();
-            platform::appendFolded(_folded, name);
-            endPiece({ start, _folded.size(), owner, {}, 0 });
-        }
-
-        /// Adds the names of the first `count` objects of a batch. Those that are not ASCII go to `strays`, for they
-        /// change their length.
-        void addRun(const Owner& owner, std::size_t count, NameBlock& strays)
-        {
-            const std::string_view names = owner.batch->fileNames(count);
-            const std::size_t start = _folded.size();
-            if (!platform::appendFoldedAscii(_folded, names))
-                moveStrays(owner, names, start, strays);
-            endPiece({ start, _folded.size(), owner, names, count });
-        }
-
-        /// The hits among the names added so far, in the order in which they were added.
-        std::vector<NameHit> takeHits()
-        {
-            search();
-            return std::move(_hits);
-        }
-
-        /// Whether a hit may stand in more than one list.
-        bool mayRepeat() const { return _mayRepeat; }
-
-    private:
-        /// One name, or the file names of a run; a zero byte, which no name holds, stands behind it.
-        struct Piece {
-            std::size_t start;
-            std::size_t end;
-            Owner owner;
-            std::string_view fileNames; // of a run, unfolded
-            std::size_t count; // of a run; 0 for one name
-        };
-
-        void moveStrays(const Owner& owner, std::string_view names, std::size_t start, NameBlock& strays)
-        {
-            std::size_t foreign = platform::lengthOfAsciiPrefix(names);
-            while (foreign < names.size()) {
-                Owner stray = owner;
-                stray.index = owner.batch->indexOfFileNameAt(foreign);
-                stray.position += static_cast<std::uint32_t>(stray.index);
-                const std::string_view fileName = owner.batch->fileNameAtIndex(stray.index);
-                const auto offset = static_cast<std::size_t>(fileName.data() - names.data());
-                std::fill_n(_folded.begin() + static_cast<std::ptrdiff_t>(start + offset), fileName.size(), '\0');
-                strays.addName(stray, platform::nameWithoutExtension(fileName));
-                const std::size_t next = offset + fileName.size();
-                foreign = next + platform::lengthOfAsciiPrefix(names.substr(next));
-            }
-        }
-
-        void endPiece(const Piece& piece)
-        {
-            _pieces.push_back(piece);
-            _folded += '\0';
-            if (_folded.size() >= blockSize)
-                search();
-        }
-
-        void search()
-        {
-            std::size_t start = 0;
-            auto piece = _pieces.begin();
-            while (const std::optional<std::size_t> at = nextNeedle(start)) {
-                while (piece->end <= *at)
-                    ++piece;
-                if (piece->count > 0) {
-                    start = takeOfRun(*piece, *at);
-                } else {
-                    take(piece->owner, std::string_view(_folded).substr(piece->start, piece->end - piece->start));
-                    start = piece->end;
-                }
-            }
-            _folded.clear();
-            _pieces.clear();
-        }
-
-        std::optional<std::size_t> nextNeedle(std::size_t start) const
-        {
-            const void* at = ::memmem(_folded.data() + start, _folded.size() - start, _needle.data(), _needle.size());
-            if (!at)
-                return std::nullopt;
-            return static_cast<std::size_t>(static_cast<const char*>(at) - _folded.data());
-        }
-
-        /// Looks at the name of the run that holds the byte at `at`; answers where it ends.
-        std::size_t takeOfRun(const Piece& run, std::size_t at)
-        {
-            Owner owner = run.owner;
-            owner.index = owner.batch->indexOfFileNameAt(at - run.start);
-            owner.position += static_cast<std::uint32_t>(owner.index);
-            const std::string_view fileName = owner.batch->fileNameAtIndex(owner.index);
-            const std::size_t start = run.start + static_cast<std::size_t>(fileName.data() - run.fileNames.data());
-            take(owner, platform::nameWithoutExtension(std::string_view(_folded).substr(start, fileName.size())));
-            return start + fileName.size();
-        }
-
-        void take(const Owner& owner, std::string_view folded)
-        {
-            const std::optional<NameMatch> match = _query.matchOf(folded);
-            if (!match)
-                return;
-            OBMediaObjectRef object;
-            if (owner.batch)
-                object = owner.batch->objectAtIndex(owner.index);
-            else if (owner.object)
-                object = *owner.object;
-            if (object && isRepresentative(*object))
-                return;
-            _mayRepeat |= !owner.isOnlyHere;
-            _hits.push_back({ std::move(object), owner.group, owner.position, *match });
-        }
-
-        const NameQuery& _query;
-        const std::string_view _needle;
-        std::string _folded;
-        std::vector<Piece> _pieces;
-        std::vector<NameHit> _hits;
-        bool _mayRepeat = false;
-    };
 
     /// For each batch the innermost group that shows it; of equally deep ones the first.
     class BatchPlaces final : public OBMediaObjectRunVisitor {

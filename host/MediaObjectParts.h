@@ -19,6 +19,7 @@ struct OBMediaObject::OwnFields {
     OBImageRef thumbnail {}; // set by somebody, in place of the produced one
     OBMarvexPropertiesRef marvexProperties {};
     platform::Value::Dictionary attributes {};
+    std::optional<platform::FileFacts> facts {};
 };
 
 /// What a movie's header told, and the picture that stands for the movie. Belongs to its object, so whoever shares the

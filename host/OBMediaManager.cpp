@@ -239,8 +239,8 @@ bool OBMediaManager::performOnMainThreadAndWait(const std::function<void()>& cal
     return platform().mainRunLoop.performAndWait(call);
 }
 
-void OBMediaManager::performInOrder(std::size_t count, const std::function<void(std::size_t)>& job,
-    const std::function<void(std::size_t)>& take)
+void OBMediaManager::performInOrder(
+    std::size_t count, const std::function<void(std::size_t)>& job, const std::function<void(std::size_t)>& take)
 {
     const auto start = [this](std::function<void()> body) { return startThread("ob-scan", std::move(body)); };
     std::make_shared<OrderedWork>(platform(), start, count, job)->perform(take);

@@ -66,6 +66,7 @@ OBMediaObject::OwnFields& OBMediaObject::own()
         const OBMediaObjectKind& kind = _origin.kind();
         _own = std::make_unique<OwnFields>(OwnFields { kind.mediaType, kind.mediaSourceType,
             _origin.nameOfObject(*this), _origin.pathOfObject(*this), kind.sourcePluginIdentifier, _origin.icon() });
+        _own->facts = _origin.factsOfFile(*this);
     }
     return *_own;
 }
@@ -121,21 +122,42 @@ void OBMediaObject::setPath(Text path)
 {
     Locked guard(_lock);
     std::swap(own().path, path);
+    own().facts.reset();
     _pathIsReal = false;
 }
 
 void OBMediaObject::setPathOfObject(const OBMediaObject& other)
 {
     Text path;
+    std::optional<platform::FileFacts> facts;
     bool isReal = false;
     {
         Locked guard(other._lock);
         path = other.pathLocked();
+        facts = other.factsLocked();
         isReal = other._pathIsReal;
     }
     Locked guard(_lock);
     std::swap(own().path, path);
+    own().facts = facts;
     _pathIsReal = isReal;
+}
+
+std::optional<platform::FileFacts> OBMediaObject::fileFacts() const
+{
+    Locked guard(_lock);
+    return factsLocked();
+}
+
+void OBMediaObject::setFileFacts(std::optional<platform::FileFacts> facts)
+{
+    Locked guard(_lock);
+    own().facts = facts;
+}
+
+std::optional<platform::FileFacts> OBMediaObject::factsLocked() const
+{
+    return _own ? _own->facts : _origin.factsOfFile(*this);
 }
 
 Text OBMediaObject::aliasResolvedPath() const

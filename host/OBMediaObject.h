@@ -13,6 +13,7 @@
 #include <vector>
 
 namespace platform {
+struct FileFacts;
 struct Platform;
 }
 
@@ -91,6 +92,11 @@ public:
     /// The real path: every symbolic link on the way resolved. Absent when nothing exists there. Asks the file system.
     platform::Text aliasResolvedPath() const;
 
+    /// Size and creation date of the file as they were when it was found: asks nothing of the disk. Absent for an object
+    /// of whose file nothing was seen.
+    std::optional<platform::FileFacts> fileFacts() const;
+    void setFileFacts(std::optional<platform::FileFacts> facts);
+
     /// The properties of the file at `path`, read when first asked for.
     static OBMarvexPropertiesRef marvexProperties(platform::Text path);
     /// Those that were set; else those of the object's own file.
@@ -132,6 +138,7 @@ private:
 
     OwnFields& own() REQUIRES(_lock);
     platform::Text pathLocked() const REQUIRES(_lock);
+    std::optional<platform::FileFacts> factsLocked() const REQUIRES(_lock);
     platform::Value attributeBesideOwn(std::string_view key) const REQUIRES(_lock);
     platform::Value attributeOfMovie(std::string_view key) const REQUIRES(_lock);
     OBImageRef withoutCycle(OBImageRef image) const;

@@ -8,6 +8,7 @@
 #include <new>
 #include <utility>
 
+OBMediaObjectRunVisitor::~OBMediaObjectRunVisitor() = default;
 OBMediaObjectSequence::~OBMediaObjectSequence() = default;
 
 /// One object, or the first objects of a sequence.
@@ -66,6 +67,20 @@ public:
         return true;
     }
 
+    void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const override
+    {
+        std::size_t visited = 0;
+        for (const Part& part : _parts) {
+            if (visited >= count)
+                break;
+            if (OBMediaObject* object = part.object())
+                visitor.visitObject({ part.item, object });
+            else
+                part.sequence().visitRuns(std::min<std::size_t>(count, part.end) - visited, visitor);
+            visited = part.end;
+        }
+    }
+
 private:
     const OBSnapshotList<Part> _parts;
 };
@@ -80,6 +95,12 @@ void OBMediaObjectList::visit(const std::function<bool(OBMediaObject&)>& visitor
 {
     if (_sequence)
         _sequence->visit(_count, visitor);
+}
+
+void OBMediaObjectList::visitRuns(OBMediaObjectRunVisitor& visitor) const
+{
+    if (_sequence)
+        _sequence->visitRuns(_count, visitor);
 }
 
 OBMediaObjectList OBMediaObjectList::appendingPart(Part part) const
@@ -127,7 +148,7 @@ OBMediaObjectList OBMediaObjectBatch::objects(
 {
     if (files.empty())
         return {};
-    TrailingBytes trailing { files.size() * sizeof(OBMediaObject) };
+    TrailingBytes trailing { files.size() * sizeof(OBMediaObject) + keptFacts(files) * sizeof(KeptFacts) };
     for (const OBFileOfFolder& file : files)
         trailing.size += file.name.size();
     return { std::allocate_shared<OBMediaObjectBatch>(TrailingAllocator<OBMediaObjectBatch>(trailing), MakeKey {},
@@ -140,8 +161,10 @@ OBMediaObjectBatch::OBMediaObjectBatch(MakeKey, const TrailingBytes& trailing,
     : _kind(std::move(kind))
     , _folder(std::move(folder.path))
     , _objects(reinterpret_cast<OBMediaObject*>(trailing.begin), files.size())
+    , _facts(reinterpret_cast<KeptFacts*>(trailing.begin + _objects.size_bytes()), keptFacts(files))
+    , _names(reinterpret_cast<const char*>(_facts.data() + _facts.size()))
 {
-    std::byte* const names = trailing.begin + _objects.size_bytes();
+    std::byte* const names = trailing.begin + _objects.size_bytes() + _facts.size_bytes();
     std::size_t offset = 0;
     for (std::size_t index = 0; index < files.size(); ++index) {
         const std::string_view name = files[index].name;
@@ -151,6 +174,16 @@ OBMediaObjectBatch::OBMediaObjectBatch(MakeKey, const TrailingBytes& trailing,
         std::copy(name.begin(), name.end(), reinterpret_cast<char*>(names + offset));
         offset += name.size();
     }
+    for (std::size_t index = 0; index < _facts.size(); ++index) {
+        const platform::FileFacts facts = files[index].facts.value_or(platform::FileFacts {});
+        new (&_facts[index]) KeptFacts { facts.creationDate.seconds, facts.size, facts.creationDate.nanoseconds,
+            files[index].facts.has_value() };
+    }
+}
+
+std::size_t OBMediaObjectBatch::keptFacts(std::span<const OBFileOfFolder> files)
+{
+    return files.front().facts ? files.size() : 0;
 }
 
 OBMediaObjectBatch::~OBMediaObjectBatch()
@@ -175,8 +208,7 @@ bool OBMediaObjectBatch::visit(std::size_t count, const std::function<bool(OBMed
 
 std::string_view OBMediaObjectBatch::fileName(const OBMediaObject& object) const
 {
-    const auto* names = reinterpret_cast<const char*>(_objects.data() + _objects.size());
-    return { names + object._nameOffset, object._nameLength };
+    return { _names + object._nameOffset, object._nameLength };
 }
 
 platform::Text OBMediaObjectBatch::nameOfObject(const OBMediaObject& object) const
@@ -187,4 +219,66 @@ platform::Text OBMediaObjectBatch::nameOfObject(const OBMediaObject& object) con
 platform::Text OBMediaObjectBatch::pathOfObject(const OBMediaObject& object) const
 {
     return platform::Text::joined(_folder, _kind->beforeFileName, fileName(object));
+}
+
+std::optional<platform::FileFacts> OBMediaObjectBatch::factsOfFile(const OBMediaObject& object) const
+{
+    if (_facts.empty())
+        return std::nullopt;
+    const KeptFacts& kept = _facts[static_cast<std::size_t>(&object - _objects.data())];
+    if (!kept.areKnown)
+        return std::nullopt;
+    return platform::FileFacts { { kept.seconds, kept.nanoseconds }, kept.size };
+}
+
+void OBMediaObjectBatch::visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const
+{
+    visitor.visitBatch(*this, count);
+}
+
+std::string_view OBMediaObjectBatch::fileNames(std::size_t count) const
+{
+    if (count == 0)
+        return {};
+    const OBMediaObject& last = _objects[count - 1];
+    return { _names, last._nameOffset + std::size_t { last._nameLength } };
+}
+
+std::string_view OBMediaObjectBatch::fileNameAtIndex(std::size_t index) const
+{
+    return fileName(_objects[index]);
+}
+
+std::size_t OBMediaObjectBatch::offsetOfFileName(std::size_t index) const
+{
+    return _objects[index]._nameOffset;
+}
+
+/// Names of one folder are about equally long, so a few steps from a guess are usually enough, and fetch fewer objects
+/// than halving does.
+std::size_t OBMediaObjectBatch::indexOfFileNameAt(std::size_t offset) const
+{
+    constexpr int mostSteps = 8;
+    const auto endsBefore
+        = [&](std::size_t index) { return offsetOfFileName(index) + fileNameAtIndex(index).size() <= offset; };
+    std::size_t index = offset * _objects.size() / fileNames(_objects.size()).size();
+    for (int step = 0; step < mostSteps; ++step) {
+        if (offsetOfFileName(index) > offset)
+            --index;
+        else if (endsBefore(index))
+            ++index;
+        else
+            return index;
+    }
+    std::size_t first = 0;
+    for (std::size_t left = _objects.size(); left > 0;) {
+        const std::size_t half = left / 2;
+        if (endsBefore(first + half)) {
+            first += half + 1;
+            left -= half + 1;
+        } else {
+            left = half;
+        }
+    }
+    return first;
 }

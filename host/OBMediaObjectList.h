@@ -4,11 +4,25 @@
 #include "host/OBMediaObjectOrigin.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string_view>
 #include <vector>
+
+class OBMediaObjectBatch;
+
+/// Is shown what a list is made of.
+class OB_EXPORT OBMediaObjectRunVisitor {
+public:
+    virtual ~OBMediaObjectRunVisitor();
+    /// The first `count` objects of a batch.
+    virtual void visitBatch(const OBMediaObjectBatch& batch, std::size_t count) = 0;
+    /// An object that was made by itself.
+    virtual void visitObject(const OBMediaObjectRef& object) = 0;
+};
 
 /// A part of a list of media objects; immutable as far as any list shows it.
 class OB_EXPORT OBMediaObjectSequence {
@@ -18,6 +32,8 @@ public:
     virtual OBMediaObjectRef objectAtIndex(std::size_t index) const = 0;
     /// Calls `visit` for the first `count` objects in order until it answers false; answers false then.
     virtual bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const = 0;
+    /// Shows `visitor` what the first `count` objects are made of, in order.
+    virtual void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const = 0;
 };
 
 /// An immutable ordered list of media objects; 24 bytes, cheap to copy.
@@ -35,6 +51,8 @@ public:
 
     /// Calls `visitor` for each object in order until it answers false.
     void visit(const std::function<bool(OBMediaObject&)>& visitor) const;
+    /// Shows `visitor` what the list is made of, in order; batches stay valid while the list lives.
+    void visitRuns(OBMediaObjectRunVisitor& visitor) const;
 
     /// This list followed by one more object, or by the objects of another list.
     OBMediaObjectList appending(OBMediaObjectRef object) const;
@@ -69,6 +87,7 @@ struct OBFolderOfFiles {
 struct OBFileOfFolder {
     std::string_view name {};
     bool isPlainFile = false; ///< it was seen to be a plain file, no link to one
+    std::optional<platform::FileFacts> facts {}; ///< kept for all files of a folder where the first has them
 };
 
 struct TrailingBytes;
@@ -85,14 +104,32 @@ public:
 
     OBMediaObjectRef objectAtIndex(std::size_t index) const override;
     bool visit(std::size_t count, const std::function<bool(OBMediaObject&)>& visitor) const override;
+    void visitRuns(std::size_t count, OBMediaObjectRunVisitor& visitor) const override;
+
+    /// The file names of the first `count` objects one after the other, with nothing between them: a search reads one
+    /// block instead of a million objects. An object's name is its file name without the extension, always.
+    std::string_view fileNames(std::size_t count) const;
+    /// Where in them the file name of the object at `index` stands.
+    std::string_view fileNameAtIndex(std::size_t index) const;
+    /// The object whose file name holds the byte at `offset` of them.
+    std::size_t indexOfFileNameAt(std::size_t offset) const;
 
 private:
     struct MakeKey { };
+    /// The facts of one file, and whether there are any, in as little room as they need.
+    struct KeptFacts {
+        std::int64_t seconds = 0;
+        std::uint64_t size = 0;
+        std::uint32_t nanoseconds = 0;
+        bool areKnown = false;
+    };
+    static std::size_t keptFacts(std::span<const OBFileOfFolder> files);
 
     std::shared_ptr<const void> block() const override { return shared_from_this(); }
     const OBMediaObjectKind& kind() const override { return *_kind; }
     platform::Text nameOfObject(const OBMediaObject& object) const override;
     platform::Text pathOfObject(const OBMediaObject& object) const override;
+    std::optional<platform::FileFacts> factsOfFile(const OBMediaObject& object) const override;
     std::string_view fileName(const OBMediaObject& object) const;
 
 public:
@@ -100,7 +137,11 @@ public:
         OBFolderOfFiles folder, std::span<const OBFileOfFolder> files);
 
 private:
+    std::size_t offsetOfFileName(std::size_t index) const;
+
     const std::shared_ptr<const OBMediaObjectKind> _kind;
     const platform::Text _folder;
-    const std::span<OBMediaObject> _objects; ///< behind this; the names of their files follow, one after the other
+    const std::span<OBMediaObject> _objects; ///< behind this
+    const std::span<KeptFacts> _facts; ///< behind those, one an object; none where no facts are kept
+    const char* const _names; ///< behind those: the names of the files, one after the other
 };

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "host/OBMediaObject.h"
+#include "platform/FileSystem.h"
 
 #include <memory>
 #include <optional>
@@ -13,6 +14,9 @@ public:
     virtual const OBMediaObjectKind& kind() const = 0;
     virtual platform::Text nameOfObject(const OBMediaObject& object) const = 0;
     virtual platform::Text pathOfObject(const OBMediaObject& object) const = 0;
+
+    /// What was seen of the object's file when it was found; absent where nothing was.
+    virtual std::optional<platform::FileFacts> factsOfFile(const OBMediaObject&) const { return std::nullopt; }
 
     /// Of an object that stands for a group: the group's path, and the resolution and thumbnail of the movie by which
     /// it does.

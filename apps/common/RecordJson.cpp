@@ -96,6 +96,21 @@ namespace {
         writeObjects(writer, group.ownMediaObjects());
     }
 
+    void writeHit(JsonWriter& writer, const FoundNames& found, const NameHit& hit)
+    {
+        const FlatGroup& place = found.groups[hit.group];
+        const OBMediaGroup& group = *place.group;
+        writer.beginObject();
+        writer.key("kind");
+        writer.string(hit.object ? "object" : "group");
+        writeText(writer, "name", hit.object ? hit.object->name() : group.name());
+        writeText(writer, "path", hit.object ? hit.object->path() : group.path());
+        const bool isRoot = !hit.object && hit.group == 0;
+        const OBMediaGroup& holder = hit.object ? group : *found.groups[place.parent].group;
+        writeText(writer, "group", isRoot ? Text() : holder.ID());
+        writer.endObject();
+    }
+
     /// A group that was begun, and how many of its children were written.
     struct OpenGroup {
         OBMediaGroupList children;
@@ -149,6 +164,15 @@ void printObjects(Output& output, const OBMediaObjectList& objects)
 {
     Document document(output);
     writeObjects(document.writer, objects);
+}
+
+void printHits(Output& output, const FoundNames& found, std::size_t count)
+{
+    Document document(output);
+    document.writer.beginList();
+    for (std::size_t index = 0; index < count; ++index)
+        writeHit(document.writer, found, found.hits[index]);
+    document.writer.endList();
 }
 
 void printValue(Output& output, const Value& value)

@@ -1,9 +1,12 @@
 #pragma once
 
+#include "apps/common/NameSearch.h"
 #include "apps/common/Output.h"
 #include "host/OBMediaGroup.h"
 #include "host/OBMediaObjectList.h"
 #include "platform/Value.h"
+
+#include <cstddef>
 
 namespace apps {
 
@@ -14,6 +17,8 @@ void printGroup(Output& output, const OBMediaGroupRef& group);
 /// A list of groups without what is below them.
 void printGroups(Output& output, const OBMediaGroupList& groups);
 void printObjects(Output& output, const OBMediaObjectList& objects);
+/// The first `count` hits of a search.
+void printHits(Output& output, const FoundNames& found, std::size_t count);
 void printValue(Output& output, const platform::Value& value);
 
 } // namespace apps

@@ -31,6 +31,18 @@ namespace {
         { "ombrix tree --json | jq '.childGroups[].name'", "the names at the top" },
     };
 
+    constexpr OptionInfo findOptions[] {
+        { "--kind", "", "KIND", "only these: group or object" },
+        { "--newest", "", "", "of equally good hits the newest first" },
+        { "--limit", "", "N", "at most the N best hits" },
+        zero,
+        json,
+    };
+    constexpr Example findExamples[] {
+        { "ombrix find \"sun beach\"", "\"Beach sunset\", and where it lies" },
+        { "ombrix find sunset --kind object -0 | xargs -0 ls -l", "safe for every name" },
+    };
+
     constexpr OptionInfo groupsOptions[] { json };
     constexpr Example groupsExamples[] {
         { "ombrix groups", "a table" },
@@ -87,6 +99,11 @@ namespace {
             "name. On a terminal the whole tree is folded to its height; each folded place\n"
             "names the command that unfolds it.",
             treeOptions, true, treeExamples, runTree },
+        { "find", Intent::look, "TEXT", 1, "find groups and movies by words of their names",
+            "Loads once and prints what has every word of TEXT in its name, in any order,\n"
+            "whatever the case and the accents. Whole names come first, then names in which\n"
+            "words begin so. Shows the 20 best; with --json or -0 all.",
+            findOptions, true, findExamples, runFind },
         { "groups", Intent::look, "", 0, "list all groups that hold media",
             "Loads once and prints the groups as a flat list, events first.", groupsOptions, true, groupsExamples,
             runGroups },

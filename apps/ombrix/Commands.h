@@ -7,6 +7,7 @@ class Program;
 // The commands, each in a file of its own; all answer the exit status.
 
 int runTree(Program& program);
+int runFind(Program& program);
 int runGroups(Program& program);
 int runObjects(Program& program);
 int runPaths(Program& program);

@@ -59,9 +59,8 @@ namespace {
         const bool isEvent = node.kind == NodeKind::event;
         (isEvent ? node.totals.clips : node.totals.movies) += objects.size();
         objects.visit([&](OBMediaObject& object) {
-            const platform::Text path = object.path();
-            if (const auto status = path ? fileSystem.status(path) : std::nullopt)
-                node.totals.addMovie(*status, isEvent ? status->creationDate : status->modificationDate);
+            if (const auto facts = shownFacts(object, node.kind, fileSystem))
+                node.totals.addMovie(*facts);
             return true;
         });
     }
@@ -172,12 +171,25 @@ void Totals::add(const Totals& other)
         newest = other.newest;
 }
 
-void Totals::addMovie(const platform::ItemStatus& status, platform::Date date)
+std::optional<ShownFacts> shownFacts(
+    const OBMediaObject& object, NodeKind kindOfGroup, const platform::FileSystem& fileSystem)
+{
+    const bool isClip = kindOfGroup == NodeKind::event;
+    if (const auto facts = isClip ? object.fileFacts() : std::nullopt)
+        return ShownFacts { facts->creationDate, facts->size };
+    const platform::Text path = object.path();
+    const std::optional<platform::ItemStatus> status = path ? fileSystem.status(path) : std::nullopt;
+    if (!status)
+        return std::nullopt;
+    return ShownFacts { isClip ? status->creationDate : status->modificationDate, status->size };
+}
+
+void Totals::addMovie(const ShownFacts& facts)
 {
     Totals movie;
-    movie.bytes = status.size;
-    movie.oldest = date;
-    movie.newest = date;
+    movie.bytes = facts.size;
+    movie.oldest = facts.date;
+    movie.newest = facts.date;
     add(movie);
 }
 

@@ -22,6 +22,17 @@ std::string_view kindText(NodeKind kind);
 /// What a group of that kind holds: "movie" or "clip".
 std::string_view mediaUnit(NodeKind kind);
 
+/// What a person is told of a media object.
+struct ShownFacts {
+    platform::Date date; ///< when a clip was shot, or when a movie of a project last changed
+    std::uint64_t size = 0; ///< bytes
+};
+
+/// Of an object of a group of that kind; absent when its file is gone. Asks the file system where the scan did not keep
+/// what it saw.
+std::optional<ShownFacts> shownFacts(
+    const OBMediaObject& object, NodeKind kindOfGroup, const platform::FileSystem& fileSystem);
+
 /// What lies in a group and below it.
 struct Totals {
     std::uint64_t projects = 0;
@@ -34,7 +45,7 @@ struct Totals {
     std::optional<platform::Date> newest {};
 
     void add(const Totals& other);
-    void addMovie(const platform::ItemStatus& status, platform::Date date);
+    void addMovie(const ShownFacts& facts);
 };
 
 /// One group of a tree that was laid flat, depth first.

@@ -6,6 +6,9 @@
 namespace platform {
 namespace {
 
+    /// What is set in eight bytes of which none is ASCII.
+    constexpr std::uint64_t highBits = 0x8080808080808080;
+
     std::uint8_t byteAt(std::string_view bytes, std::size_t index)
     {
         return static_cast<std::uint8_t>(bytes[index]);
@@ -77,9 +80,21 @@ DecodedCharacter decodeCharacter(std::string_view bytes) noexcept
     return { codePoint, length, true };
 }
 
+std::size_t lengthOfAsciiPrefix(std::string_view bytes) noexcept
+{
+    std::size_t end = 0;
+    for (std::uint64_t eight = 0; bytes.size() - end >= sizeof eight; end += sizeof eight) {
+        std::memcpy(&eight, bytes.data() + end, sizeof eight);
+        if ((eight & highBits) != 0)
+            break;
+    }
+    while (end < bytes.size() && byteAt(bytes, end) < 0x80)
+        ++end;
+    return end;
+}
+
 std::size_t lengthOfValidPrefix(std::string_view bytes) noexcept
 {
-    constexpr std::uint64_t highBits = 0x8080808080808080;
     std::size_t end = 0;
     while (end < bytes.size()) {
         std::uint64_t eight = highBits;

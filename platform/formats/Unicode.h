@@ -23,6 +23,9 @@ DecodedCharacter decodeCharacter(std::string_view bytes) noexcept;
 /// How many bytes the UTF-8 sequence at the start of `bytes` has; 0 when none begins there, or `bytes` is empty.
 std::size_t lengthOfValidSequence(std::string_view bytes) noexcept;
 
+/// Where the first byte stands that is not ASCII; `bytes.size()` when all is.
+std::size_t lengthOfAsciiPrefix(std::string_view bytes) noexcept;
+
 /// Where the first byte stands that is no UTF-8; `bytes.size()` when all is.
 std::size_t lengthOfValidPrefix(std::string_view bytes) noexcept;
 

@@ -168,7 +168,7 @@ void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
     else if (file.isLinked)
         addClip(platform::nameWithoutExtension(platform::lastPathComponent(file.path)), file);
     else
-        _plainClips.push_back({ file.entry, file.isPlainFile });
+        _plainClips.push_back({ file.entry, file.isPlainFile, file.facts });
     const int year = yearOf(file, recorded);
     _scan.report.found([&] { return ScanFindings::yearOfClip(entryPath(file.entry), year); });
 }
@@ -207,6 +207,7 @@ void OBMontaroPlugin::ClipReader::addClip(std::string_view name, const FoundFile
     clip->setPath(path);
     clip->setAttribute_forKey(path, OBMontaroProjectPathKey);
     clip->setIcon(_scan.clipKind->icon);
+    clip->setFileFacts(file.facts);
     _result.clips = _result.clips.appending(clip);
     _scan.report.objectMade(entryPath(file.entry), clip);
 }

@@ -196,3 +196,55 @@ TEST_CASE("a list of objects may be read while another thread makes longer ones 
     writer.join();
     CHECK(changed == 0);
 }
+
+TEST_CASE("a list shows the batches and the objects that it is made of, in order")
+{
+    class Runs final : public OBMediaObjectRunVisitor {
+    public:
+        void visitBatch(const OBMediaObjectBatch& batch, std::size_t count) override
+        {
+            texts.emplace_back(batch.fileNames(count));
+        }
+        void visitObject(const OBMediaObjectRef& object) override { texts.push_back(object->name().string()); }
+        std::vector<std::string> texts;
+    };
+    const std::vector<OBFileOfFolder> files { { "a.mov", true }, { "bc.mov", true }, { "d.mov", true } };
+    const OBMediaObjectList batch
+        = OBMediaObjectBatch::objects(std::make_shared<OBMediaObjectKind>(), { "/f", true }, files);
+    const auto alone = objectNamed("alone");
+    const OBMediaObjectList list = batch.prefix(2).appending(alone).appending(batch.appending(alone));
+    Runs runs;
+    list.visitRuns(runs);
+    CHECK(runs.texts == std::vector<std::string> { "a.movbc.mov", "alone", "a.movbc.movd.mov", "alone" });
+    Runs none;
+    OBMediaObjectList().visitRuns(none);
+    list.prefix(1).visitRuns(none);
+    CHECK(none.texts == std::vector<std::string> { "a.mov" });
+}
+
+TEST_CASE("the object to which a byte of the file names belongs is found, however unequal they are")
+{
+    class Batch final : public OBMediaObjectRunVisitor {
+    public:
+        void visitBatch(const OBMediaObjectBatch& shown, std::size_t) override { batch = &shown; }
+        void visitObject(const OBMediaObjectRef&) override { }
+        const OBMediaObjectBatch* batch = nullptr;
+    };
+    std::vector<std::string> names;
+    for (std::size_t index = 0; index < 200; ++index)
+        names.emplace_back(index < 150 ? 1 : 60, 'n');
+    std::vector<OBFileOfFolder> files;
+    for (const std::string& name : names)
+        files.push_back({ name, true });
+    const OBMediaObjectList list
+        = OBMediaObjectBatch::objects(std::make_shared<OBMediaObjectKind>(), { "/f", true }, files);
+    Batch shown;
+    list.visitRuns(shown);
+    REQUIRE(shown.batch);
+    std::size_t offset = 0;
+    for (std::size_t index = 0; index < names.size(); ++index) {
+        CHECK(shown.batch->indexOfFileNameAt(offset) == index);
+        offset += names[index].size();
+        CHECK(shown.batch->indexOfFileNameAt(offset - 1) == index);
+    }
+}

@@ -24,7 +24,7 @@ namespace {
     const std::vector<Layer>& layers()
     {
         static const std::vector<Layer> table {
-            { "platform/formats", { "platform" }, { "expat.h", "rapidjson/" }, false,
+            { "platform/formats", { "platform" }, { "expat.h", "rapidjson/", "utf8proc.h" }, false,
                 "platform/formats knows roles, the standard library and its one library a format" },
             { "platform/common", { "platform", "platform/formats" }, {}, false,
                 "platform/common knows roles, formats and the standard library" },

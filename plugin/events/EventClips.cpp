@@ -82,6 +82,7 @@ public:
     EventClips read();
 
 private:
+    Text realFolder() const;
     void take(const FolderItem& item);
     void takeLink(const FolderItem& link);
     void takeRecorded(std::string_view path, const Date& recorded);
@@ -96,7 +97,7 @@ private:
     YearsOfDates _years;
     const platform::FolderListing _listing;
     Text _realFolder {};
-    std::string _path {}; // of the file at hand; its folder and the slash stay
+    std::string _path {}; // of the file at hand; its folder stays
     std::vector<OBFileOfFolder> _plainClips {}; // not yet among the clips
     EventClips _result {};
 };
@@ -105,10 +106,8 @@ EventClips OBMontaroPlugin::ClipReader::read()
 {
     if (!_result.hasEntries)
         return std::move(_result);
-    _realFolder = _listing.pathIsReal()    ? _result.folder
-        : _listing.otherRealPath().empty() ? Text(_plugin.platform().fileSystem.resolvedPath(_result.folder))
-                                           : Text(_listing.otherRealPath());
-    _path = platform::pathJoined(_realFolder, "");
+    _realFolder = realFolder();
+    _path = _realFolder.view();
     _plainClips.reserve(_listing.size());
     for (const FolderItem item : _listing) {
         if (!_scan.report.passes(ScanRules::nameIsNotHidden, item, _result.folder))
@@ -120,6 +119,17 @@ EventClips OBMontaroPlugin::ClipReader::read()
     }
     addPlainClips();
     return std::move(_result);
+}
+
+/// Where the clips really lie, without a slash at its end: empty for the top of the file system.
+Text OBMontaroPlugin::ClipReader::realFolder() const
+{
+    if (_listing.pathIsReal())
+        return _result.folder;
+    const std::string path = _listing.otherRealPath().empty()
+        ? _plugin.platform().fileSystem.resolvedPath(_result.folder)
+        : _listing.otherRealPath();
+    return Text(std::string_view(path).substr(path == "/" ? 1 : 0));
 }
 
 bool OBMontaroPlugin::ClipReader::isClip(const FolderItem& item) const

@@ -176,6 +176,7 @@ TEST_CASE("an event whose folder of clips cannot be read is nowhere, and the res
     CHECK(EventMachine::outline(root->childGroups()[0]) == "2011: A(a) C(a)");
     CHECK(EventMachine::flatNames(*source) == "A C");
     CHECK(source->loadProblems().size() == 1);
+    CHECK(machine.takeLog().empty());
 }
 
 TEST_CASE("a library that is missing, empty or unreadable yields nothing, and the others are read")
@@ -261,4 +262,22 @@ TEST_CASE("an events reload puts a library with clips into the root, and takes i
     CHECK(EventMachine::outline(source->_reloadMontaroEvents()) == "");
     CHECK(childNames(*root) == "");
     CHECK(root->ownMediaObjects().empty());
+}
+
+TEST_CASE("a library on a volume that was mounted later is read and watched from the next scan on")
+{
+    EventMachine machine;
+    makeEvent(machine.volumeEvents("Late"), "Trip");
+    const auto source = machine.makeSource();
+    machine.load(*source);
+    const auto watched
+        = [&] { return machine.abbreviated(machine.host->pathWatcher().pathsWatchedBy(source.get())).back(); };
+    machine.volumes.local.store({ { "/Volumes/Late", "Late" } });
+    machine.workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
+        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), "/Volumes/Late" } } });
+    machine.waitForThreads();
+    CHECK(watched() == "/Montaro Events");
+    const OBMediaGroupRef library = source->_reloadMontaroEvents_updateRootMediaGroup("Montaro", false);
+    CHECK(EventMachine::outline(library) == "2011: Trip(a)");
+    CHECK(watched() == "/Volumes/Late/Montaro Events");
 }

@@ -3,6 +3,7 @@
 #include <doctest/doctest.h>
 
 #include <algorithm>
+#include <atomic>
 #include <mutex>
 #include <numeric>
 #include <thread>
@@ -35,6 +36,12 @@ public:
             host.machine.threads.processorTime = host.machine.threads.processorTime.load() + 1ms;
         host.machine.bare.clock.advance(1ms);
         --_inside;
+    }
+    /// Waits inside a job; once in vain is enough for all jobs.
+    void waitFor(const Event& event)
+    {
+        if (!_gaveUp && !event.wait())
+            _gaveUp = true;
     }
     void take(std::size_t index)
     {
@@ -81,6 +88,7 @@ public:
 
 private:
     const std::thread::id _caller = std::this_thread::get_id();
+    std::atomic<bool> _gaveUp { false };
     mutable std::mutex _lock;
     std::vector<std::size_t> _begun {}; // under _lock, like what follows
     std::size_t _taken = 0;
@@ -129,7 +137,7 @@ TEST_CASE("two threads work while the processor is what jobs need")
         if (jobs.begin(index) == 2)
             secondIsThere.happen();
         if (index >= 4)
-            secondIsThere.wait();
+            jobs.waitFor(secondIsThere);
         jobs.end(Need::processor);
     });
     CHECK(secondIsThere.hasHappened());
@@ -147,7 +155,7 @@ TEST_CASE("eight threads work while jobs wait for a disk, never more")
         if (inside == 8)
             eightAreThere.happen();
         if (index >= 100)
-            eightAreThere.wait();
+            jobs.waitFor(eightAreThere);
         jobs.end(Need::disk);
     });
     CHECK(eightAreThere.hasHappened());
@@ -166,8 +174,10 @@ TEST_CASE("threads leave once jobs need the processor again")
         if (inside == 8)
             eightAreThere.happen();
         if (index >= 100 && index < 200)
-            eightAreThere.wait();
-        // By now whoever began a job in the days of eight threads has ended it.
+            jobs.waitFor(eightAreThere);
+        // By now whoever began a job in the days of eight threads has ended it. Who is still there gets a turn.
+        for (int turn = 0; index >= 400 && turn < 200; ++turn)
+            std::this_thread::yield();
         if (index >= 400)
             for (int most = mostInsideAtTheEnd;
                  most < inside && !mostInsideAtTheEnd.compare_exchange_weak(most, inside);) { }

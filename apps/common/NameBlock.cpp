@@ -125,7 +125,7 @@ void NameBlock::take(const Owner& owner, std::string_view folded)
     if (owner.batch)
         object = owner.batch->objectAtIndex(owner.index);
     else if (owner.object)
-        object = *owner.object;
+        object = owner.object;
     if (object && isRepresentative(*object))
         return;
     _mayRepeat |= !owner.isOnlyHere;

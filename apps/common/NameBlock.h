@@ -23,7 +23,7 @@ public:
     struct Owner {
         std::size_t group = 0;
         std::uint32_t position = 0; ///< as a hit has it; of a run, that of its first object
-        const OBMediaObjectRef* object = nullptr; ///< made by itself
+        OBMediaObjectRef object {}; ///< made by itself
         const OBMediaObjectBatch* batch = nullptr;
         std::size_t index = 0; ///< in the batch
         bool isOnlyHere = true; ///< no other list that is looked through is known to hold it

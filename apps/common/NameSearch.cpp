@@ -99,7 +99,7 @@ namespace {
         }
         void visitObject(const OBMediaObjectRef& object) override
         {
-            _owner.object = &object;
+            _owner.object = object;
             _owner.isOnlyHere = false;
             _names.addName(_owner, object->name());
             _owner.object = nullptr;

@@ -128,13 +128,15 @@ EventClips OBMontaroPlugin::ClipReader::read()
     return std::move(_result);
 }
 
+/// Where the clips really lie, without a slash at its end: empty for the top of the file system.
 Text OBMontaroPlugin::ClipReader::realFolder() const
 {
     if (_listing.pathIsReal())
         return _result.folder;
-    if (!_listing.otherRealPath().empty())
-        return _listing.otherRealPath();
-    return _plugin.platform().fileSystem.resolvedPath(_result.folder);
+    const std::string path = _listing.otherRealPath().empty()
+        ? _plugin.platform().fileSystem.resolvedPath(_result.folder)
+        : _listing.otherRealPath();
+    return Text(std::string_view(path).substr(path == "/" ? 1 : 0));
 }
 
 bool OBMontaroPlugin::ClipReader::isClip(const FolderItem& item) const

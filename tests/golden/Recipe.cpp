@@ -46,6 +46,8 @@ namespace {
             makeFolder(path);
         else if (kind == "project")
             writeFile(path + "/CurrentVersion.mtrproject", {});
+        else if (kind == "event")
+            writeFile(path + "/CurrentVersion.mtrevent", {});
         else if (kind == "movie")
             writeFile(path, movieOfSize(rest));
         else if (kind == "file")

@@ -13,6 +13,7 @@ namespace tests {
 ///
 ///     folder PATH
 ///     project PATH                a folder with the marker of a project
+///     event PATH                  a folder with the marker of an event
 ///     movie PATH | WIDTHxHEIGHT   a real movie, two seconds long
 ///     file PATH | BYTES           the bytes may be left out; \x0a ends a line
 ///     link PATH | TARGET

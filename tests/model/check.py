@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
 """Compares what `ombrix` prints on generated machines with what the model works out.
 
-check.py --ombrix PROGRAM --seeds 1..60 [--events empty]
+check.py --ombrix PROGRAM --seeds 1..60
 
 A difference is printed with its seed; `--keep` leaves that machine's folder in place.
 """
@@ -131,7 +131,7 @@ class Checker:
 
     def check_machine(self, machine):
         self.check_preferences(machine)
-        model = Model(Description(machine.file), machine.movies, self.options.events)
+        model = Model(Description(machine.file), machine.movies)
         self.expect_document(model.paths(), machine.file, "paths")
         self.expect_document(model.info(), machine.file, "info")
         self.check_log(model, machine)
@@ -291,7 +291,6 @@ def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--ombrix", required=True)
     parser.add_argument("--seeds", default="1..60")
-    parser.add_argument("--events", choices=["full", "empty"], default="full")
     parser.add_argument("--keep", action="store_true")
     options = parser.parse_args()
     options.ombrix = os.path.abspath(options.ombrix)

@@ -342,7 +342,7 @@ class EventLibrary(Filler):
             elif kind == "link to folder":
                 self.link_to(self.store.folder(), path)
             elif kind == "dangling":
-                os.symlink(self.random.choice([b"gone.mov", b"/nowhere/gone.mov", b"../gone/x.mov"]), path)
+                os.symlink(self.random.choice([b"gone.mov", b"/nowhere/.gone.mov", b"../gone/x.mov"]), path)
             elif kind == "circle":
                 os.symlink(os.path.basename(path), path)
             elif kind == "pipe":

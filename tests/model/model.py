@@ -80,11 +80,10 @@ def merge_sort(items, comparison):
 class Model:
     """`movies` tells resolution and duration of each real path that holds a movie; either may be None."""
 
-    def __init__(self, description, movies, events="full"):
+    def __init__(self, description, movies):
         self.description = description
         self.files = Files(description)
         self.movies = movies
-        self.events = events
         self.flat_projects = []
         self.flat_events = []
         self.newest_first = preferences.most_recent_event_first(self.files, description.home)
@@ -219,8 +218,6 @@ class Model:
 
     def event_library(self):
         library = Group(EVENT_LIBRARY, EVENTS_NAME, EVENTS_NAME, b"Montaro", "eventIcon")
-        if self.events == "empty":
-            return library
         found = []
         for path in self.search_paths(EVENTS_FOLDER):
             found += self.events_in(path)
@@ -264,7 +261,7 @@ class Model:
             if name.startswith(b"."):
                 continue
             place = files.resolve(join(folder, name))
-            if files.is_invisible(place.path) or (place.state == "there" and files.is_container(place.path)):
+            if place.state != "gone" and (files.is_invisible(place.path) or files.is_container(place.path)):
                 continue
             clip = MediaObject(split_extension(last_component(place.path))[0], place.path, EDITOR_IDENTIFIER,
                                "smallAppIcon", {PROJECT_PATH: place.path})

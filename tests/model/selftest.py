@@ -243,6 +243,12 @@ class Events(OnMachine):
         _, library = self.load_events(False)
         self.assertEqual([(each.name, each.attributes) for each in library.children], [(b"-1", {YEAR: -1})])
 
+    def test_a_link_to_a_hidden_name_that_is_gone_is_a_clip(self):
+        os.symlink("/nowhere/.gone.mov", os.path.join(self.make(self.events, "Trip", "Original Media"), "x.mov"))
+        self.event("Trip", [])
+        model, _ = self.load_events(True)
+        self.assertEqual([clip.name for clip in model.flat_events[0].own_objects], [b".gone"])
+
     def test_a_date_to_come_gives_way_to_the_day_the_file_was_made(self):
         self.event("Trip", [("a.mov", seconds(2100))])
         model, library = self.load_events(True)

@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <functional>
 #include <future>
 #include <string>
@@ -71,4 +72,20 @@ TEST_CASE("the nice value is that of one thread alone, and where it is refused n
 TEST_CASE("a thread without a body is not started")
 {
     CHECK(!LinuxThreads().startDetached("nothing", {}));
+}
+
+TEST_CASE("a thread's time on the processor grows while it works, and not while another does")
+{
+    const LinuxThreads threads;
+    const auto before = threads.processorTimeOfCurrentThread();
+    const std::function<std::chrono::nanoseconds()> work = [&threads] {
+        const auto begin = threads.processorTimeOfCurrentThread();
+        auto spent = begin - begin;
+        while (spent < std::chrono::milliseconds(200))
+            spent = threads.processorTimeOfCurrentThread() - begin;
+        return spent;
+    };
+    CHECK(onThread("busy", work) >= std::chrono::milliseconds(200));
+    CHECK(threads.processorTimeOfCurrentThread() - before < std::chrono::milliseconds(150));
+    CHECK(work() >= std::chrono::milliseconds(200));
 }

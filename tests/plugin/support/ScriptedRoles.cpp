@@ -28,6 +28,13 @@ platform::FolderListing ScriptedFileSystem::itemsInFolder(
     std::vector<platform::FolderItem> items;
     for (const platform::FolderItem item : listing)
         items.push_back(item);
+    const auto further = furtherFiles.equal_range(folder);
+    for (auto file = further.first; file != further.second; ++file) {
+        platform::FolderItem item;
+        item.name = file->second;
+        item.kind = platform::ItemKind::file;
+        items.push_back(item);
+    }
     std::sort(items.begin(), items.end(),
         [this](const auto& left, const auto& right) { return order(left.name, right.name); });
     platform::FolderListing ordered(listing.problem());
@@ -36,6 +43,7 @@ platform::FolderListing ScriptedFileSystem::itemsInFolder(
     if (listing.folderStatus())
         ordered.setFolderStatus(*listing.folderStatus());
     ordered.setPathIsReal(listing.pathIsReal());
+    ordered.setOtherRealPath(listing.otherRealPath());
     return ordered;
 }
 

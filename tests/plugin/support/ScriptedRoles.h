@@ -57,6 +57,8 @@ public:
 
     platform::Snapshot<std::optional<std::string>> home {};
     std::function<bool(std::string_view, std::string_view)> order = std::less<>();
+    /// Files that the listing of a folder shows though they are not there, by the folder.
+    std::multimap<std::string, std::string, std::less<>> furtherFiles {};
 
     std::optional<std::string> homeFolder() const override { return home.load(); }
     platform::FolderListing itemsInFolder(

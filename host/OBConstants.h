@@ -54,3 +54,5 @@ inline constexpr int OBQueryRunModeLive = 4; ///< a query that keeps reporting a
 
 /// The version of the interface between this host and its plug-ins; a bundle names the range it was made for.
 inline constexpr int OBHostInterfaceVersion = 1;
+/// Grows when the interface gains something and keeps everything: it refuses no bundle.
+inline constexpr int OBHostInterfaceMinorVersion = 0;

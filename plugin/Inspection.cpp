@@ -6,18 +6,6 @@
 
 using platform::Text;
 
-namespace {
-
-std::vector<std::string> strings(const std::vector<Text>& texts)
-{
-    std::vector<std::string> result;
-    for (const Text& text : texts)
-        result.push_back(text.string());
-    return result;
-}
-
-} // namespace
-
 OBSourceInspection* OBMontaroPlugin::inspection()
 {
     return this;
@@ -26,13 +14,13 @@ OBSourceInspection* OBMontaroPlugin::inspection()
 std::vector<std::string> OBMontaroPlugin::projectSearchPaths()
 {
     const MontaroSearchPaths paths = _MontaroSearchPaths.load();
-    return strings(paths ? *paths : foldersToSearch(platform(), _MontaroDefaultPath(), MontaroProjectsFolderName));
+    return stringsOf(paths ? *paths : foldersToSearch(platform(), _MontaroDefaultPath(), MontaroProjectsFolderName));
 }
 
 std::vector<std::string> OBMontaroPlugin::eventSearchPaths()
 {
     const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
-    return strings(
+    return stringsOf(
         paths ? *paths : foldersToSearch(platform(), _MontaroDefaultEventsFolderPath(), MontaroEventsFolderName));
 }
 

@@ -5,6 +5,7 @@
 #include "plugin/MontaroConstants.h"
 #include "plugin/OBMontaroPlugin.h"
 #include "plugin/RepresentativeMovie.h"
+#include "plugin/SearchFolders.h"
 #include "plugin/SharedValues.h"
 
 #include "host/OBConstants.h"
@@ -21,14 +22,6 @@ namespace {
 constexpr const char* projectQuery = "(kMDItemFSName = '*.mtrproject'c)";
 constexpr const char* movieQuery = "(kMDItemContentType = 'org.ombrix.movie')";
 constexpr const char* projectFormatVersion = "6";
-
-std::vector<std::string> strings(const std::vector<Text>& texts)
-{
-    std::vector<std::string> result;
-    for (const Text& text : texts)
-        result.push_back(text.string());
-    return result;
-}
 
 } // namespace
 
@@ -85,7 +78,7 @@ void OBMontaroPlugin::registerQueries()
         projectQuery, this, std::move(projectScope), OBQueryRunModeLive);
     Locked guard(*_MontaroEventsSearchPathsLock);
     watcher->watchQuery_observer_queryScope_queryRunMode(
-        movieQuery, this, strings(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
+        movieQuery, this, stringsOf(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
 }
 
 void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root)

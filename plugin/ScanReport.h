@@ -3,10 +3,12 @@
 #include "plugin/ScanRules.h"
 
 #include "host/OBMediaManager.h"
+#include "platform/FileSystem.h"
 
 #include <memory>
 #include <string>
 #include <string_view>
+#include <utility>
 
 /// Applies rules for one scan: counts what they keep out, and tells the observer, if there is one, what they decided.
 class ScanReport {
@@ -59,14 +61,30 @@ public:
 private:
     void tell(const ScanRule& rule, bool passed, const platform::FolderItem& item, std::string_view folder) const
     {
+        std::string path = platform::pathJoined(folder, item.name);
+        const ScanFailure told = passed ? ScanFailure { rule.passed, {} } : failureOf(rule, item, path);
         _observer->scanDecided({ .rule = rule.name,
-            .path = platform::pathJoined(folder, item.name),
+            .path = std::move(path),
             .passed = passed,
-            .text = std::string(passed ? rule.passed : rule.failed),
-            .remedy = std::string(passed ? std::string_view() : rule.remedy),
+            .text = std::string(told.text),
+            .remedy = std::string(told.remedy),
             .itself = {},
             .inside = std::string(rule.inside),
             .insideRemedy = {} });
+    }
+
+    ScanFailure failureOf(const ScanRule& rule, const platform::FolderItem& item, const std::string& path) const
+    {
+        if (!rule.failureOf)
+            return { rule.failed, rule.remedy };
+        return isInClosedFolder(path) ? ScanRules::folderIsClosed : rule.failureOf(item);
+    }
+
+    bool isInClosedFolder(const std::string& path) const
+    {
+        const platform::FileSystem& fileSystem = _manager.platform().fileSystem;
+        return !fileSystem.linkStatus(path)
+            && fileSystem.openPlainFile(path).problem == platform::FileProblem::notPermitted;
     }
 
     OBMediaManager& _manager;

@@ -7,6 +7,12 @@
 #include <array>
 #include <string_view>
 
+/// Why an item is kept out, for people.
+struct ScanFailure {
+    std::string_view text; ///< what is so
+    std::string_view remedy; ///< what would put the item in; empty where nothing would
+};
+
 /// One reason for which a scan takes an item or keeps it out. The scans apply these and nothing else, so that whoever
 /// asks why something is not listed is told by the rule that decided.
 struct ScanRule {
@@ -16,6 +22,8 @@ struct ScanRule {
     std::string_view failed; ///< what is so when it does not
     std::string_view remedy; ///< what would make it pass
     std::string_view inside {}; ///< why nothing in what passes is listed, unless further rules say so
+    /// What is so of this very item instead, where that depends on what kind of item it is; null for most rules.
+    ScanFailure (*failureOf)(const platform::FolderItem& item) = nullptr;
 };
 
 namespace ScanRules {
@@ -37,10 +45,6 @@ inline constexpr ScanRule hasProjectMarker { "project",
     "it holds CurrentVersion.mtrproject", "it holds no CurrentVersion.mtrproject",
     "open the project in Montaro, which marks it",
     "of a project only the movies directly in its folder \"Shared Items\" are listed" };
-
-inline constexpr ScanRule isContainer { "folder", [](const platform::FolderItem& item) { return item.flags.container; },
-    "it is a folder", "it is neither a project nor a folder",
-    "move it out of the library, or share the project that it belongs to" };
 
 inline constexpr ScanRule isNotPackage { "package",
     [](const platform::FolderItem& item) { return !item.flags.package; }, "it is a plain folder",
@@ -68,5 +72,21 @@ inline constexpr ScanRule hasMovieExtension { "extension",
     "its extension is a project movie's",
     "its extension is not one of mov, m4v, mp4, 3gp (case matters for project movies)",
     "give it the extension mov, m4v, mp4 or 3gp", "a movie is not looked into" };
+
+/// What stands in a library and is neither a project nor a folder.
+inline constexpr ScanRule isContainer { "folder", [](const platform::FolderItem& item) { return item.flags.container; },
+    "it is a folder", "it is neither a project nor a folder", "", {},
+    [](const platform::FolderItem& item) -> ScanFailure {
+        if (item.kind == platform::ItemKind::symbolicLink)
+            return { "it is a symbolic link that leads to no project, and no other link is followed in a library",
+                "put what it leads to in its place" };
+        if (hasMovieExtension.passes(item))
+            return { "it is a movie that lies in no project", "move it into the folder \"Shared Items\" of a project" };
+        return { "it is neither a project nor a folder", "" };
+    } };
+
+/// Of an item that could be named but not looked at, so that no rule about its kind says anything.
+inline constexpr ScanFailure folderIsClosed { "its folder may be listed but not searched, so nothing is known of it",
+    "permit searching its folder (chmod +x)" };
 
 } // namespace ScanRules

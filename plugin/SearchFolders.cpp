@@ -44,3 +44,11 @@ Text folderInMovies(const platform::Platform& platform, std::string_view folderN
     const auto home = platform.fileSystem.homeFolder();
     return home ? Text::joined(*home, "/Movies/", folderName) : Text();
 }
+
+std::vector<std::string> stringsOf(const std::vector<Text>& texts)
+{
+    std::vector<std::string> result;
+    for (const Text& text : texts)
+        result.push_back(text.string());
+    return result;
+}

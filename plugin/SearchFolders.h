@@ -3,6 +3,7 @@
 #include "platform/Platform.h"
 #include "platform/Text.h"
 
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -17,3 +18,6 @@ platform::Text folderOnVolume(std::string_view displayName, std::string_view fol
 
 /// The folder called `folderName` in the user's folder of movies; absent while no home folder is known.
 platform::Text folderInMovies(const platform::Platform& platform, std::string_view folderName);
+
+/// The same texts for whoever takes strings.
+std::vector<std::string> stringsOf(const std::vector<platform::Text>& texts);

@@ -1,6 +1,7 @@
 #include "apps/common/DisplayWidth.h"
 
 #include "apps/common/CharacterRanges.h"
+#include "apps/common/HostileNames.h"
 #include "platform/PathText.h"
 #include "platform/formats/Unicode.h"
 
@@ -12,6 +13,7 @@ namespace {
     constexpr std::string_view ellipsis = "…";
     constexpr char32_t joiner = 0x200D;
     constexpr char32_t emojiPresentation = 0xFE0F;
+    constexpr std::size_t longestEscape = 20; // bytes, marks included: four of a character, four letters each
 
     bool isSkinTone(char32_t character)
     {
@@ -30,6 +32,15 @@ namespace {
         if (code < 0x20 || (code >= 0x7F && code < 0xA0) || isZeroWidth(code))
             return 0;
         return isWide(code) ? 2 : 1;
+    }
+
+    /// How long the escape at the start of a laid-out text is, its marks included; 0 where none begins.
+    std::size_t lengthOfEscape(std::string_view text)
+    {
+        if (text.front() != escapeBegins)
+            return 0;
+        const std::size_t end = text.substr(0, longestEscape).find(escapeEnds);
+        return end == std::string_view::npos ? 0 : end + 1;
     }
 
     int spacesTo(std::string_view text, int columns)
@@ -67,6 +78,8 @@ namespace {
 
 Letter letterAtStart(std::string_view text)
 {
+    if (const std::size_t length = lengthOfEscape(text); length > 0)
+        return { length, displayWidth(text.substr(1, length - 2)) };
     const platform::DecodedCharacter first = platform::decodeCharacter(text);
     Letter letter { first.length, columnsOf(first) };
     if (!first.isValid || first.codePoint < 0x20)
@@ -129,6 +142,22 @@ std::string cutInMiddle(std::string_view text, int columns)
     cut += ellipsis;
     cut += end;
     return cut;
+}
+
+std::vector<std::string> wrappedWords(std::string_view text, int columns)
+{
+    std::vector<std::string> lines(1);
+    while (!text.empty()) {
+        const std::size_t blanks = std::min(text.find_first_not_of(' '), text.size());
+        const std::size_t end = std::min(text.find(' ', blanks), text.size());
+        const std::string_view word = text.substr(0, end);
+        if (lines.back().empty() || displayWidth(lines.back()) + displayWidth(word) <= columns)
+            lines.back() += word;
+        else
+            lines.emplace_back(word.substr(blanks));
+        text.remove_prefix(end);
+    }
+    return lines;
 }
 
 std::string paddedAfter(std::string_view text, int columns)

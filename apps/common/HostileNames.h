@@ -9,8 +9,9 @@ namespace apps {
 inline constexpr char escapeBegins = '\x01';
 inline constexpr char escapeEnds = '\x02';
 
-/// `name` fit for a terminal: control characters, characters that turn the writing direction or begin a line, and bytes
-/// that are no UTF-8 stand as \x1b or \u202e, between the two marks above.
+/// `name` fit for a terminal: control characters, characters that draw nothing but turn the writing direction, hide or
+/// begin a line, and bytes that are no UTF-8 stand as \x1b or \u202e, between the two marks above. What joins pictures
+/// to one emoji stays.
 std::string escapedName(std::string_view name);
 
 /// `text` fit to stand in a one-line message: escaped likewise, without marks.

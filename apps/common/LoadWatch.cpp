@@ -11,6 +11,7 @@
 #include "platform/Threads.h"
 #include "platform/Volumes.h"
 
+#include <algorithm>
 #include <set>
 #include <string>
 #include <utility>
@@ -27,6 +28,12 @@ namespace {
     constexpr auto patience = 3s;
     constexpr std::string_view volumesFolder = "/Volumes";
 
+    /// Laid out: escapes are marked.
+    std::string waitingLine(const OBLoadProgress& progress, std::string_view place)
+    {
+        return "ombrix: waiting for " + escapedName(place) + " (" + escapedName(progress.pathAtWork) + ")";
+    }
+
 } // namespace
 
 struct LoadWatch::Watching {
@@ -40,7 +47,6 @@ struct LoadWatch::Watching {
 
     void run()
     {
-        leaveSignalsToOtherThreads();
         auto delay = std::chrono::nanoseconds(untilFirstLine);
         while (platform.clock.sleep(delay, ended)) {
             tell(manager->loadProgress());
@@ -59,18 +65,12 @@ struct LoadWatch::Watching {
         if (ended.isRaised())
             return;
         if (isStuck && !isTerminal && placesNamed.insert(place).second)
-            printError(waitingLine(progress, place));
+            printError(withoutMarks(waitingLine(progress, place)));
         if (!isTerminal)
             return;
-        const int columns = sizeOfTerminal(STDERR_FILENO).columns - 1;
-        showProgress(isStuck
-                ? cutAtEnd(waitingLine(progress, place) + "  " + durationText(now - progress.pathAtWorkSince), columns)
-                : progressLine(progress, place, now - started, columns));
-    }
-
-    static std::string waitingLine(const OBLoadProgress& progress, const std::string& place)
-    {
-        return "ombrix: waiting for " + escapedText(place) + " (" + escapedText(progress.pathAtWork) + ")";
+        const int columns = std::min(longestProgress, sizeOfTerminal(STDERR_FILENO).columns - 1);
+        showProgress(isStuck ? waitingProgress(progress, place, now - progress.pathAtWorkSince, columns)
+                             : progressLine(progress, place, now - started, columns));
     }
 
     void end()
@@ -121,7 +121,13 @@ std::string progressLine(
         + quantityText(progress.itemsFound, "clip") + "  " + durationText(elapsed) + "  Ctrl-C cancels";
     const std::string start = "scanning ";
     const int room = columns - displayWidth(facts) - displayWidth(start);
-    return cutAtEnd(start + cutInMiddle(escapedText(place), room > 8 ? room : 8) + facts, columns);
+    return withoutMarks(cutAtEnd(start + cutInMiddle(escapedName(place), room > 8 ? room : 8) + facts, columns));
+}
+
+std::string waitingProgress(
+    const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds waited, int columns)
+{
+    return withoutMarks(cutAtEnd(waitingLine(progress, place) + "  " + durationText(waited), columns));
 }
 
 } // namespace apps

@@ -3,7 +3,9 @@
 #include "host/OBMediaManager.h"
 #include "platform/Platform.h"
 
+#include <chrono>
 #include <memory>
+#include <string>
 #include <string_view>
 
 namespace apps {
@@ -32,5 +34,8 @@ std::string nameOfPlace(const platform::Platform& platform, std::string_view pat
 /// The line of progress, in at most `columns` columns.
 std::string progressLine(
     const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds elapsed, int columns);
+/// The one that takes its place while a disk keeps the load waiting.
+std::string waitingProgress(
+    const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds waited, int columns);
 
 } // namespace apps

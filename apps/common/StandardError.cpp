@@ -16,7 +16,7 @@
 namespace apps {
 namespace {
 
-    constexpr int longestProgress = 500;
+    constexpr std::array<int, 3> endingSignals { SIGINT, SIGTERM, SIGHUP };
 
     // What a signal handler needs lies in atomics: it may interrupt whoever holds the lock.
     std::atomic<int> shownColumns { 0 };
@@ -111,15 +111,22 @@ void eraseProgress()
 
 void eraseProgressOnSignals()
 {
-    for (const int signal : { SIGINT, SIGTERM, SIGHUP })
+    for (const int signal : endingSignals)
         handle(signal);
 }
 
-void leaveSignalsToOtherThreads()
+EndingSignalsHeld::EndingSignalsHeld()
 {
-    sigset_t all;
-    sigfillset(&all);
-    (void)::pthread_sigmask(SIG_BLOCK, &all, nullptr);
+    sigset_t held;
+    sigemptyset(&held);
+    for (const int signal : endingSignals)
+        sigaddset(&held, signal);
+    (void)::pthread_sigmask(SIG_BLOCK, &held, &_before);
+}
+
+EndingSignalsHeld::~EndingSignalsHeld()
+{
+    (void)::pthread_sigmask(SIG_SETMASK, &_before, nullptr);
 }
 
 } // namespace apps

@@ -1,11 +1,15 @@
 #pragma once
 
+#include <csignal>
 #include <string_view>
 
 namespace apps {
 
 // Standard error of this process, of which there is one: lines for people, and at its end one line of progress that
 // vanishes without a trace, also when a signal ends the process. No escape sequences. Any thread.
+
+/// The most columns that a line of progress can have.
+inline constexpr int longestProgress = 500;
 
 /// Prints `line` and a line feed; progress that is shown is erased first.
 void printError(std::string_view line);
@@ -18,7 +22,17 @@ void eraseProgress();
 /// that is ignored stays so.
 void eraseProgressOnSignals();
 
-/// Signals are handled on other threads than the calling one.
-void leaveSignalsToOtherThreads();
+/// While it lives, those signals wait for the calling thread or go to another; threads that it starts meanwhile never
+/// get one.
+class EndingSignalsHeld {
+public:
+    EndingSignalsHeld();
+    ~EndingSignalsHeld();
+    EndingSignalsHeld(const EndingSignalsHeld&) = delete;
+    EndingSignalsHeld& operator=(const EndingSignalsHeld&) = delete;
+
+private:
+    sigset_t _before {};
+};
 
 } // namespace apps

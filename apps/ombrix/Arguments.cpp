@@ -3,6 +3,8 @@
 #include "apps/common/DidYouMean.h"
 #include "apps/common/HostileNames.h"
 
+#include <algorithm>
+
 namespace ombrix {
 namespace {
 
@@ -38,7 +40,7 @@ namespace {
         ParsedArguments parse()
         {
             bool optionsEnded = false;
-            while (_next < _words.size() && _result.problem.empty()) {
+            while (_next < _words.size()) {
                 const std::string_view word = _words[_next++];
                 if (!optionsEnded && word == endOfOptions)
                     optionsEnded = true;
@@ -47,20 +49,49 @@ namespace {
                 else
                     readOperand(word);
             }
-            const Arguments& arguments = _result.arguments;
-            if (_result.problem.empty() && !arguments.command && !arguments.wantsHelp && !arguments.wantsVersion)
-                _result.problem = "no command given (\"ombrix --help\" lists them)";
+            checkWhole();
             return std::move(_result);
         }
 
     private:
+        /// What only the whole line can tell. Whoever asks for help gets it, whatever else was typed.
+        void checkWhole()
+        {
+            const Arguments& arguments = _result.arguments;
+            if (arguments.wantsHelp || arguments.wantsVersion)
+                _result.problem.clear();
+            else if (!arguments.command && _result.problem.empty())
+                fail("no command given (\"ombrix --help\" lists them)");
+            else if (arguments.command)
+                checkOptions(*arguments.command);
+        }
+
+        void checkOptions(const CommandInfo& command)
+        {
+            if (isTyped("--source") && !command.takesSource)
+                fail("option --source means nothing here");
+            for (const OptionInfo& option : command.options) {
+                if (isTyped(option.name) && isTyped(option.excludes))
+                    fail("options " + std::string(option.name) + " and " + std::string(option.excludes)
+                        + " exclude each other");
+                if (option.isRequired && !isTyped(option.name))
+                    fail("option " + std::string(option.name) + " " + std::string(option.value)
+                        + " is missing (\"ombrix help " + std::string(command.name) + "\")");
+            }
+        }
+
+        bool isTyped(std::string_view option) const
+        {
+            return std::find(_typed.begin(), _typed.end(), option) != _typed.end();
+        }
+
         void readOperand(std::string_view word)
         {
             Arguments& arguments = _result.arguments;
             if (!arguments.command) {
                 arguments.command = commandNamed(word);
                 if (!arguments.command)
-                    _result.problem = unknownCommand(word);
+                    fail(unknownCommand(word));
                 return;
             }
             arguments.operands.emplace_back(word);
@@ -88,7 +119,12 @@ namespace {
                     return fail("option " + std::string(name) + " needs a value: " + std::string(option->value));
                 value = _words[_next++];
             }
-            if (isGlobal)
+            if (isTyped(option->name) && !option->value.empty() && !option->mayRepeat)
+                return fail("option " + std::string(name) + " is given twice");
+            _typed.push_back(option->name);
+            if (isGlobal && !option->value.empty() && value.empty())
+                fail("option " + std::string(name) + " needs a value: " + std::string(option->value));
+            else if (isGlobal)
                 setGlobal(option->name, std::move(value));
             else
                 _result.arguments.options.emplace_back(option->name, std::move(value));
@@ -131,7 +167,7 @@ namespace {
                 names.push_back(option.name);
             if (!command && isOptionOfSomeCommand(name))
                 return " before the command (options of a command follow its name)";
-            return apps::didYouMean(name, names);
+            return apps::didYouMeanOption(name, names);
         }
 
         static bool isOptionOfSomeCommand(std::string_view name)
@@ -143,14 +179,18 @@ namespace {
             return false;
         }
 
+        /// Keeps the first problem, which later ones may only follow from.
         void fail(const std::string& problem)
         {
+            if (!_result.problem.empty())
+                return;
             const CommandInfo* command = _result.arguments.command;
             _result.problem = command ? std::string(command->name) + ": " + problem : problem;
         }
 
         const std::span<const std::string_view> _words;
         std::size_t _next = 0;
+        std::vector<std::string_view> _typed {}; // options, by name
         ParsedArguments _result;
     };
 

@@ -12,6 +12,9 @@
 
 namespace ombrix {
 
+/// The plug-in whose tree is meant where none is named.
+inline constexpr std::string_view defaultSource = "org.ombrix.OBMontaroPlugin";
+
 /// What was typed, byte for byte.
 struct Arguments {
     const CommandInfo* command = nullptr; ///< null when help or the version alone is wanted
@@ -19,7 +22,7 @@ struct Arguments {
     bool wantsHelp = false;
     bool wantsVersion = false;
     std::optional<std::string> machineFile {};
-    std::string source = "org.ombrix.OBMontaroPlugin";
+    std::string source { defaultSource };
     apps::When color = apps::When::automatic;
     apps::When hyperlink = apps::When::automatic;
     /// The command's own options, by name, in the order typed; without a value where they take none.

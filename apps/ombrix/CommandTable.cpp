@@ -8,21 +8,22 @@ namespace {
     constexpr std::size_t anyNumber = static_cast<std::size_t>(-1);
 
     constexpr OptionInfo json { "--json", "", "", "print one JSON document, every key always there" };
-    constexpr OptionInfo zero { "-0", "", "", "end every path with a zero byte instead of a line feed" };
-    constexpr OptionInfo group { "--group", "", "ID", "the group; the first with that ID counts" };
+    constexpr OptionInfo zero { "-0", "", "", "end every path with a zero byte instead of a line feed", false, false,
+        "--json" };
+    constexpr OptionInfo group { "--group", "", "ID", "the group; the first with that ID counts", true };
 
     constexpr OptionInfo global[] {
         { "--machine", "", "FILE", "use the machine that FILE describes, not this one" },
         { "--source", "", "IDENTIFIER", "the plug-in whose tree is meant" },
-        { "--color", "", "WHEN", "auto, always or never" },
-        { "--hyperlink", "", "WHEN", "names as links to their folders: auto, always, never" },
+        { "--color", "", "WHEN", "auto, always or never", false, true },
+        { "--hyperlink", "", "WHEN", "names as links to their folders: auto, always, never", false, true },
         { "--help", "-h", "", "this text, or that of a command" },
         { "--version", "", "", "the versions of the program and of its host interface" },
     };
 
     constexpr OptionInfo treeOptions[] {
         { "--all", "", "", "everything, also where it is longer than the terminal" },
-        { "--skipped", "", "", "list below the tree what was left out, and why" },
+        { "--skipped", "", "", "list below the tree what was left out, and why", false, false, "--json" },
         json,
     };
     constexpr Example treeExamples[] {
@@ -85,31 +86,32 @@ namespace {
             "Loads once and prints the tree, or the first group that has this ID, else this\n"
             "name. On a terminal the whole tree is folded to its height; each folded place\n"
             "names the command that unfolds it.",
-            treeOptions, treeExamples, runTree },
+            treeOptions, true, treeExamples, runTree },
         { "groups", Intent::look, "", 0, "list all groups that hold media",
-            "Loads once and prints the groups as a flat list, events first.", groupsOptions, groupsExamples,
+            "Loads once and prints the groups as a flat list, events first.", groupsOptions, true, groupsExamples,
             runGroups },
         { "objects", Intent::look, "", 0, "list the movies of one group",
             "Loads once and prints the path of every movie to be shown for the group, one a\n"
             "line, depth first.",
-            objectsOptions, objectsExamples, runObjects },
+            objectsOptions, true, objectsExamples, runObjects },
         { "paths", Intent::look, "", 0, "list the folders that are searched",
             "Prints the folders for projects and those for events, in the order in which\n"
             "they are searched. Loads nothing.",
-            pathsOptions, pathsExamples, runPaths },
+            pathsOptions, true, pathsExamples, runPaths },
         { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
-            "Prints what is known of the source without loading its tree.", infoOptions, infoExamples, runInfo },
+            "Prints what is known of the source without loading its tree.", infoOptions, true, infoExamples, runInfo },
         { "explain", Intent::ask, "PATH...", anyNumber, "say why files and folders are or are not in the tree",
             "Loads once and prints, for each path, every rule that it met on its way, the\n"
             "verdict, and what would make it appear. The path need not exist.",
-            explainOptions, explainExamples, runExplain },
+            explainOptions, true, explainExamples, runExplain },
         { "message", Intent::ask, "", 0, "say what an empty group tells the user",
             "Loads once and prints the text that is shown for the group while it is empty;\n"
             "nothing when there is none.",
-            messageOptions, messageExamples, runMessage },
+            messageOptions, true, messageExamples, runMessage },
         { "plugins", Intent::ask, "", 0, "list the plug-ins, and why one is refused",
-            "Loads every bundle that is found to see whether it works.", pluginsOptions, pluginsExamples, runPlugins },
-        { "help", Intent::ask, "[COMMAND]", 1, "explain a command", "The same as \"ombrix COMMAND --help\".", {},
+            "Loads every bundle that is found to see whether it works.", pluginsOptions, false, pluginsExamples,
+            runPlugins },
+        { "help", Intent::ask, "[COMMAND]", 1, "explain a command", "The same as \"ombrix COMMAND --help\".", {}, false,
             helpExamples, runHelp },
     };
 

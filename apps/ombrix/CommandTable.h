@@ -14,6 +14,9 @@ struct OptionInfo {
     std::string_view shortName; ///< "-h"; empty for most
     std::string_view value; ///< what its value is called in help; empty for an option without one
     std::string_view text;
+    bool isRequired = false;
+    bool mayRepeat = false; ///< the last value counts; else two values are a mistake, for one would be lost
+    std::string_view excludes {}; ///< the option that it makes no sense with
 };
 
 struct Example {
@@ -33,6 +36,7 @@ struct CommandInfo {
     std::string_view summary; ///< one line
     std::string_view details; ///< lines of at most 78 columns
     std::span<const OptionInfo> options; ///< its own ones
+    bool takesSource; ///< whether it asks one source, and so option --source means something
     std::span<const Example> examples;
     int (*run)(Program&); ///< answers the exit status
 };

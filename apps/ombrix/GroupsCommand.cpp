@@ -20,17 +20,15 @@ namespace {
         std::string name;
         std::string kind;
         std::string count;
-        std::string place;
+        std::string ID;
     };
 
     Row rowOf(const OBMediaGroup& group, const apps::Style& style)
     {
         const NodeKind kind = kindOf(group);
         const platform::Text name = group.name().empty() ? group.ID() : group.name();
-        const platform::Text place = group.path().empty() ? group.ID() : group.path();
-        return { apps::cutInMiddle(style.name(name), style.isTerminal() ? widestName : 1 << 20),
-            std::string(kindText(kind)), apps::quantityText(group.ownMediaObjects().size(), mediaUnit(kind)),
-            style.name(place) };
+        return { style.name(name), std::string(kindText(kind)),
+            apps::quantityText(group.ownMediaObjects().size(), mediaUnit(kind)), style.name(group.ID()) };
     }
 
     void printTable(Program& program, const OBMediaGroupList& groups)
@@ -41,17 +39,20 @@ namespace {
         int count = 0;
         for (const OBMediaGroupRef& group : groups) {
             rows.push_back(rowOf(*group, program.style()));
-            name = std::max(name, std::min(widestName, apps::displayWidth(rows.back().name)));
+            name = std::max(name, apps::displayWidth(rows.back().name));
             kind = std::max(kind, apps::displayWidth(rows.back().kind));
             count = std::max(count, apps::displayWidth(rows.back().count));
         }
-        for (const Row& row : rows) {
+        if (const std::optional<int> columns = program.columns())
+            name = std::min({ name, widestName, *columns / 3 });
+        const int countEnd = name + gap + kind + gap + count;
+        for (Row& row : rows) {
             TextLine line(program.style(), program.columns());
-            const int countEnd = name + gap + kind + gap + count;
-            line.addBehind(row.name, TextLine::Look::bold).add(name + gap, row.kind, TextLine::Look::dim);
-            line.add(countEnd - apps::displayWidth(row.count), row.count, TextLine::Look::dim)
-                .add(countEnd + gap, row.place);
-            program.printLine(line.text());
+            line.addBehind(apps::cutInMiddle(row.name, name), TextLine::Look::bold);
+            line.add(name + gap, row.kind, TextLine::Look::dim);
+            line.add(countEnd - apps::displayWidth(row.count), row.count, TextLine::Look::dim);
+            // It is there to be typed again, so it is longer than the line rather than cut.
+            program.printLine(line.text() + std::string(gap, ' ') + program.style().plain(row.ID));
         }
     }
 

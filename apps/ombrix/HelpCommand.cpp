@@ -48,10 +48,10 @@ namespace {
         if (!command.operands.empty())
             usage.append(" ").append(command.operands);
         for (const OptionInfo& option : command.options) {
-            usage.append(" [").append(option.name);
+            usage.append(option.isRequired ? " " : " [").append(option.name);
             if (!option.value.empty())
                 usage.append(" ").append(option.value);
-            usage += "]";
+            usage += option.isRequired ? "" : "]";
         }
         return usage + "\n";
     }
@@ -100,7 +100,8 @@ std::string helpText(const CommandInfo& command)
 
 std::string versionText()
 {
-    return "ombrix " + std::string(version) + " (host interface " + std::to_string(OBHostInterfaceVersion) + ")\n";
+    return "ombrix " + std::string(version) + " (host interface " + std::to_string(OBHostInterfaceVersion) + "."
+        + std::to_string(OBHostInterfaceMinorVersion) + ")\n";
 }
 
 int runHelp(Program& program)

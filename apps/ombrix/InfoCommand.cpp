@@ -1,9 +1,12 @@
 // "info": what is known of a source without loading its tree.
 
+#include "apps/common/DisplayWidth.h"
 #include "apps/common/HumanText.h"
 #include "apps/common/RecordJson.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Program.h"
+#include "apps/ombrix/SearchFolders.h"
+#include "apps/ombrix/SuggestedCommand.h"
 #include "apps/ombrix/TextLine.h"
 #include "host/OBBundle.h"
 #include "host/OBSourceInspection.h"
@@ -55,12 +58,14 @@ namespace {
         apps::printValue(program.output(), std::move(info));
     }
 
+    constexpr int labelEnd = 10;
+    constexpr int textStart = labelEnd + 3;
+
     void printFact(Program& program, std::string_view label, const std::string& text)
     {
-        constexpr int labelEnd = 10;
         TextLine line(program.style(), program.columns());
-        line.add(labelEnd - static_cast<int>(label.size()), label, TextLine::Look::dim).add(labelEnd + 3, text);
-        program.printLine(line.text());
+        line.add(labelEnd - static_cast<int>(label.size()), label, TextLine::Look::dim);
+        program.printWrapped(line, textStart, text);
     }
 
     std::string numberText(double number)
@@ -80,18 +85,35 @@ namespace {
             + (manager.canLoadData() ? "" : ", but nothing exists there");
     }
 
-    std::string existing(const platform::FileSystem& fileSystem, const std::vector<std::string>& paths)
+    std::string countsText(
+        const platform::FileSystem& fileSystem, const std::vector<std::string>& folders, std::string_view what)
     {
-        std::size_t found = 0;
-        for (const std::string& path : paths)
-            found += fileSystem.exists(path);
-        return apps::countText(found) + " of " + apps::countText(paths.size());
+        const SearchFolderCounts counts = countSearchFolders(fileSystem, folders);
+        std::string text = apps::countText(counts.existing) + " of " + apps::countText(folders.size()) + " "
+            + std::string(what) + " folders exist";
+        if (counts.unreadable > 0)
+            text += " (" + apps::countText(counts.unreadable) + " not readable)";
+        return text;
     }
 
-    std::string librariesText(const platform::FileSystem& fileSystem, OBSourceInspection& inspection)
+    std::string librariesText(OBMediaManager& manager, OBSourceInspection& inspection)
     {
-        return existing(fileSystem, inspection.projectSearchPaths()) + " project folders exist, "
-            + existing(fileSystem, inspection.eventSearchPaths()) + " event folders (\"ombrix paths\")";
+        const platform::FileSystem& fileSystem = manager.platform().fileSystem;
+        return countsText(fileSystem, inspection.projectSearchPaths(), "project") + ", "
+            + countsText(fileSystem, inspection.eventSearchPaths(), "event");
+    }
+
+    /// A command is to be typed, so it stands on a line of its own where it would be broken.
+    void printLibraries(Program& program, OBMediaManager& manager, OBSourceInspection& inspection)
+    {
+        const std::string text = librariesText(manager, inspection);
+        const std::string hint = "\"" + suggestedCommand(program.arguments(), "paths") + "\"";
+        const std::string both = text + "   " + hint;
+        if (!program.columns() || textStart + apps::displayWidth(both) <= *program.columns())
+            return printFact(program, "libraries", both);
+        printFact(program, "libraries", text);
+        TextLine line(program.style(), program.columns());
+        program.printLine(line.addWhole(textStart, hint).text());
     }
 
     /// The names in a list of types, or of lists of them.
@@ -122,7 +144,7 @@ namespace {
         program.printLine(title.text());
         printFact(program, "editor", editorText(program, manager));
         if (OBSourceInspection* inspection = manager.inspection()) {
-            printFact(program, "libraries", librariesText(manager.platform().fileSystem, *inspection));
+            printLibraries(program, manager, *inspection);
             if (const std::optional<bool> newest = inspection->mostRecentEventFirst())
                 printFact(program, "order", *newest ? "newest events first" : "oldest events first");
         }

@@ -8,8 +8,6 @@ namespace ombrix {
 
 int runObjects(Program& program)
 {
-    if (program.wantsJson() && program.arguments().has("-0"))
-        return program.failUsage("objects: options -0 and --json exclude each other");
     const Program::GroupAnswer answer = program.loadGroupOfOption();
     if (!answer.group)
         return answer.status;

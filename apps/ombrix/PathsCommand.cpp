@@ -4,6 +4,7 @@
 #include "apps/common/RecordJson.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Program.h"
+#include "apps/ombrix/SearchFolders.h"
 #include "apps/ombrix/TextLine.h"
 #include "host/OBSourceInspection.h"
 #include "platform/FileSystem.h"
@@ -23,42 +24,59 @@ namespace {
         return list;
     }
 
-    std::string_view stateOf(const platform::FileSystem& fileSystem, const std::string& path)
+    constexpr int indent = 2;
+    constexpr int gap = 3;
+    constexpr int leastPathWidth = 20;
+
+    /// A folder as it is laid out.
+    struct Row {
+        std::string path;
+        std::string state;
+    };
+
+    std::vector<Row> rowsOf(Program& program, const Paths& paths)
     {
-        const std::optional<platform::ItemStatus> status = fileSystem.status(path);
-        if (!status)
-            return "absent";
-        return status->kind == platform::ItemKind::folder ? "exists" : "not a folder";
+        std::vector<Row> rows;
+        for (const std::string& path : paths) {
+            const platform::FileProblem problem = searchProblem(program.session()->platform().fileSystem, path);
+            rows.push_back({ program.style().name(path), searchStateText(problem) });
+        }
+        return rows;
     }
 
-    void printPaths(Program& program, std::string_view title, const Paths& paths, int width)
+    void printRows(Program& program, std::string_view title, const std::vector<Row>& rows, int width)
     {
         program.printLine(program.style().bold(title));
-        for (const std::string& path : paths) {
-            TextLine line(program.style(), std::nullopt);
-            line.add(2, program.style().name(path));
-            line.add(2 + width + 3, stateOf(program.session()->platform().fileSystem, path), TextLine::Look::dim);
-            program.printLine(line.text());
+        for (const Row& row : rows) {
+            TextLine line(program.style(), program.columns());
+            line.add(indent, apps::cutInMiddle(row.path, width));
+            program.printWrapped(line, indent + width + gap, row.state, TextLine::Look::dim);
         }
     }
 
     void printText(Program& program, const Paths& projects, const Paths& events)
     {
-        int width = 0;
-        for (const Paths* paths : { &projects, &events }) {
-            for (const std::string& path : *paths)
-                width = std::max(width, apps::displayWidth(program.style().name(path)));
+        const std::vector<Row> rows[] { rowsOf(program, projects), rowsOf(program, events) };
+        int path = 0;
+        int state = 0;
+        for (const std::vector<Row>& list : rows) {
+            for (const Row& row : list) {
+                path = std::max(path, apps::displayWidth(row.path));
+                state = std::max(state, apps::displayWidth(row.state));
+            }
         }
-        printPaths(program, "projects", projects, width);
-        printPaths(program, "events", events, width);
+        if (const std::optional<int> columns = program.columns()) {
+            const int beside = *columns - indent - gap - std::min(state, *columns / 3);
+            path = std::min(path, std::max(leastPathWidth, beside));
+        }
+        printRows(program, "projects", rows[0], path);
+        printRows(program, "events", rows[1], path);
     }
 
 } // namespace
 
 int runPaths(Program& program)
 {
-    if (program.wantsJson() && program.arguments().has("-0"))
-        return program.failUsage("paths: options -0 and --json exclude each other");
     const std::shared_ptr<OBMediaManager> manager = program.manager();
     if (!manager)
         return failed;

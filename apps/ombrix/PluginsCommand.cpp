@@ -44,11 +44,16 @@ namespace {
             line.add(identifier + 3, style.name(plugin.version));
             line.add(identifier + 3 + version + 3, plugin.loaded ? "loaded" : "refused",
                 plugin.loaded ? TextLine::Look::plain : TextLine::Look::warning);
-            line.add(identifier + 3 + version + 3 + 10, style.name(plugin.path), TextLine::Look::dim);
+            const std::string path = style.name(plugin.path);
+            const int pathStart = identifier + 3 + version + 3 + 10;
+            const bool isBeside = !program.columns() || pathStart + apps::displayWidth(path) <= *program.columns();
+            if (isBeside)
+                line.add(pathStart, path, TextLine::Look::dim);
             program.printLine(line.text());
-            // A reason is what the reader came for, so it is never cut.
+            if (!isBeside)
+                program.printLine(TextLine(style, program.columns()).addName(4, path, TextLine::Look::dim).text());
             if (!plugin.reason.empty())
-                program.printLine(TextLine(style, std::nullopt).add(4, style.name(plugin.reason)).text());
+                program.printWrapped(TextLine(style, program.columns()), 4, style.name(plugin.reason));
         }
     }
 

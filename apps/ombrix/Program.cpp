@@ -1,10 +1,13 @@
 #include "apps/ombrix/Program.h"
 
+#include "apps/common/DisplayWidth.h"
 #include "apps/common/HostileNames.h"
 #include "apps/common/StandardError.h"
 #include "apps/ombrix/GroupSearch.h"
 #include "apps/ombrix/ProblemText.h"
 
+#include <algorithm>
+#include <climits>
 #include <utility>
 
 namespace ombrix {
@@ -44,6 +47,19 @@ void Program::printLine(std::string_view line)
     _output.write("\n");
 }
 
+void Program::printWrapped(const TextLine& before, int column, std::string_view laidOut, TextLine::Look look)
+{
+    constexpr int leastWidth = 20;
+    const std::optional<int> width = columns();
+    const int room = width ? std::max(leastWidth, *width - column) : INT_MAX;
+    bool isFirst = true;
+    for (const std::string& words : apps::wrappedWords(laidOut, room)) {
+        TextLine line = isFirst ? before : TextLine(_style, width);
+        printLine(line.addWhole(column, words, look).text());
+        isFirst = false;
+    }
+}
+
 void Program::printPath(std::string_view path)
 {
     if (_arguments.has("-0")) {
@@ -56,19 +72,26 @@ void Program::printPath(std::string_view path)
 
 int Program::fail(std::string_view place, std::string_view what) const
 {
-    apps::printError("ombrix: " + apps::escapedText(place) + ": " + std::string(what));
+    apps::printError("ombrix: " + apps::escapedText(std::string(place) + ": " + std::string(what)));
     return failed;
+}
+
+int Program::failGroup(std::string_view typed, std::string_view what, std::string_view suggestion) const
+{
+    if (typed.empty())
+        return fail(_arguments.command->name, "\"\" is the " + std::string(what) + " of no group");
+    return fail(typed, "no group has this " + std::string(what) + std::string(suggestion));
 }
 
 int Program::failUsage(std::string_view what) const
 {
-    apps::printError("ombrix: " + std::string(what));
+    apps::printError("ombrix: " + apps::escapedText(what));
     return wrongUsage;
 }
 
 void Program::warn(std::string_view what) const
 {
-    apps::printError("ombrix: warning: " + std::string(what));
+    apps::printError("ombrix: warning: " + apps::escapedText(what));
 }
 
 apps::Session* Program::session()
@@ -120,16 +143,12 @@ OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
 Program::GroupAnswer Program::loadGroupOfOption()
 {
     const std::string* identifier = _arguments.valueOf("--group");
-    if (!identifier) {
-        const std::string name(_arguments.command->name);
-        return { nullptr, failUsage(name + ": option --group ID is missing (\"ombrix help " + name + "\")") };
-    }
     const OBMediaGroupRef root = load();
     if (!root)
         return { nullptr, failed };
     OBMediaGroupRef group = groupWithID(root, *identifier);
     if (!group)
-        return { nullptr, fail(*identifier, "no group has this ID" + suggestedID(root, *identifier)) };
+        return { nullptr, failGroup(*identifier, "ID", suggestedID(root, *identifier)) };
     return { std::move(group), done };
 }
 

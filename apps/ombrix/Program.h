@@ -6,6 +6,7 @@
 #include "apps/common/Terminal.h"
 #include "apps/common/TreeLoad.h"
 #include "apps/ombrix/Arguments.h"
+#include "apps/ombrix/TextLine.h"
 
 #include <memory>
 #include <optional>
@@ -33,10 +34,15 @@ public:
 
     /// Prints one line of standard output.
     void printLine(std::string_view line);
+    /// Prints a laid-out text that begins at `column` after `before`, in as many lines as the terminal needs for it.
+    void printWrapped(
+        const TextLine& before, int column, std::string_view laidOut, TextLine::Look look = TextLine::Look::plain);
     /// Prints a path from disk: escaped on a terminal, and ended with a zero byte where that is asked for.
     void printPath(std::string_view path);
     /// Says on standard error what could not be done; answers the exit status.
     int fail(std::string_view place, std::string_view what) const;
+    /// The same of a group that nothing typed finds; `what` says what was taken for its name.
+    int failGroup(std::string_view typed, std::string_view what, std::string_view suggestion) const;
     int failUsage(std::string_view what) const;
     /// A remark on standard error that leaves the result as it is.
     void warn(std::string_view what) const;

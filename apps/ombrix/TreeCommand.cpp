@@ -1,7 +1,7 @@
 // "tree": the one command whose text is folded to the terminal. A part that was asked for by name is never folded, so
 // that the command which a folded place suggests shows what it promises.
 
-#include "apps/common/HostileNames.h"
+#include "apps/common/DisplayWidth.h"
 #include "apps/common/HumanText.h"
 #include "apps/common/RecordJson.h"
 #include "apps/common/StandardError.h"
@@ -9,8 +9,9 @@
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/GroupSearch.h"
 #include "apps/ombrix/Program.h"
-#include "apps/ombrix/ShellWord.h"
+#include "apps/ombrix/SearchFolders.h"
 #include "apps/ombrix/SkippedItems.h"
+#include "apps/ombrix/SuggestedCommand.h"
 #include "apps/ombrix/TextLine.h"
 #include "apps/ombrix/TreeText.h"
 #include "host/OBSourceInspection.h"
@@ -24,8 +25,6 @@ namespace {
 
     constexpr int standardOutput = 1;
     constexpr int standardError = 2;
-    /// Below a folded tree stand the footer and the shell's next prompt.
-    constexpr int linesBelowTree = 2;
 
     OBMediaGroupRef groupCalled(const OBMediaGroupRef& root, const std::string& text)
     {
@@ -34,15 +33,15 @@ namespace {
     }
 
     /// The command that shows all of `group`: by its name where that finds it, else by its ID.
-    std::string unfoldingCommand(const OBMediaGroupRef& root, const OBMediaGroupRef& group)
+    std::string unfoldingCommand(const Arguments& arguments, const OBMediaGroupRef& root, const OBMediaGroupRef& group)
     {
         if (group != root) {
             for (const platform::Text& text : { group->name(), group->ID() }) {
-                if (!text.empty() && text.view().front() != '-' && groupCalled(root, text.string()) == group)
-                    return "ombrix tree " + shellWord(text);
+                if (!text.empty() && groupCalled(root, text.string()) == group)
+                    return suggestedCommand(arguments, "tree", text);
             }
         }
-        return "ombrix tree --all";
+        return suggestedCommand(arguments, "tree --all");
     }
 
     void printSkipped(Program& program, const SkippedItems& skipped, const OBMediaGroupRef& group, bool isPart)
@@ -54,52 +53,84 @@ namespace {
             if (isPart && (folder.isAbsent() || !platform::isSameOrBelow(decision.path, folder)))
                 continue;
             ++count;
-            TextLine line(program.style(), program.columns());
-            line.addBehind(program.style().name(decision.path));
+            const TextLine empty(program.style(), program.columns());
+            program.printLine(TextLine(empty).addName(0, program.style().name(decision.path)).text());
             const std::string reason = decision.text.empty() ? std::string(decision.rule) : decision.text;
             const std::string remedy = decision.remedy.empty() ? std::string() : "; to list it, " + decision.remedy;
-            program.printLine(line.text());
-            TextLine why(program.style(), program.columns());
-            program.printLine(why.add(4, program.style().name(reason + remedy), TextLine::Look::dim).text());
+            program.printWrapped(empty, 4, program.style().name(reason + remedy), TextLine::Look::dim);
         }
         program.printLine(count == 0 ? "nothing was skipped" : apps::quantityText(count, "item") + " skipped");
     }
 
-    void printFooter(Program& program, OBMediaManager& manager)
+    std::string foldersText(OBMediaManager& manager, OBSourceInspection& inspection)
     {
-        std::string footer = apps::durationText(program.loadDuration());
-        if (OBSourceInspection* inspection = manager.inspection()) {
-            std::size_t absent = 0;
-            std::vector<std::string> folders = inspection->projectSearchPaths();
-            const std::vector<std::string> forEvents = inspection->eventSearchPaths();
-            folders.insert(folders.end(), forEvents.begin(), forEvents.end());
-            for (const std::string& folder : folders)
-                absent += !manager.platform().fileSystem.exists(folder);
-            footer += " · " + apps::quantityText(folders.size(), "folder") + " searched";
-            if (absent > 0)
-                footer += ", " + apps::countText(absent) + " absent";
-        }
-        if (const std::uint64_t skipped = manager.loadProgress().itemsSkipped)
-            footer += " · " + apps::quantityText(skipped, "item") + " skipped (\"ombrix tree --skipped\")";
-        const apps::Style style(
-            apps::Style::wishesFor(standardError, program.arguments().color, program.arguments().hyperlink));
-        const int columns = apps::sizeOfTerminal(standardError).columns;
-        apps::printError(TextLine(style, columns).add(0, footer, TextLine::Look::dim).text());
+        std::vector<std::string> folders = inspection.projectSearchPaths();
+        const std::vector<std::string> forEvents = inspection.eventSearchPaths();
+        folders.insert(folders.end(), forEvents.begin(), forEvents.end());
+        const SearchFolderCounts counts = countSearchFolders(manager.platform().fileSystem, folders);
+        std::string text = apps::quantityText(folders.size(), "folder") + " searched";
+        if (counts.absent > 0)
+            text += ", " + apps::countText(counts.absent) + " absent";
+        if (counts.unreadable > 0)
+            text += ", " + apps::countText(counts.unreadable) + " not readable";
+        return text;
     }
 
-    void printText(Program& program, OBMediaManager& manager, const OBMediaGroupRef& root, const OBMediaGroupRef& group)
+    /// What stands below a tree on a terminal, for people only: on standard error. Absent elsewhere.
+    std::optional<std::string> footerOf(Program& program, OBMediaManager& manager)
+    {
+        if (!program.columns() || !apps::isTerminal(standardError))
+            return std::nullopt;
+        std::string footer = apps::durationText(program.loadDuration());
+        if (OBSourceInspection* inspection = manager.inspection())
+            footer += " · " + foldersText(manager, *inspection);
+        const std::uint64_t skipped = manager.loadProgress().itemsSkipped;
+        if (skipped > 0 && !program.arguments().has("--skipped"))
+            footer += " · " + apps::quantityText(skipped, "item") + " skipped (\""
+                + suggestedCommand(program.arguments(), "tree --skipped") + "\")";
+        return footer;
+    }
+
+    void printFooter(Program& program, const std::string& footer)
+    {
+        const apps::Style style(
+            apps::Style::wishesFor(standardError, program.arguments().color, program.arguments().hyperlink));
+        apps::printError(style.dim(footer));
+    }
+
+    /// As many lines as fit above what stands below the tree; a line may be longer than the terminal is wide.
+    std::vector<TreeLine> linesThatFit(const std::vector<TreeNode>& nodes, const TreeTextWishes& wishes, int linesBelow)
+    {
+        constexpr std::size_t least = 4;
+        const int lines = apps::sizeOfTerminal(standardOutput).lines - linesBelow;
+        const auto most = std::max(least, static_cast<std::size_t>(std::max(0, lines)));
+        for (std::size_t room = most;; --room) {
+            std::vector<TreeLine> folded = foldedLines(nodes, room);
+            if (room == least || printTreeText(nodes, folded, wishes, [](std::string_view) {}) <= most)
+                return folded;
+        }
+    }
+
+    int linesOf(const std::string& text, int columns)
+    {
+        return 1 + std::max(0, apps::displayWidth(text) - 1) / columns;
+    }
+
+    void printText(Program& program, OBMediaManager& manager, const OBMediaGroupRef& root, const OBMediaGroupRef& group,
+        const std::optional<std::string>& footer)
     {
         const platform::Platform& platform = manager.platform();
         const std::vector<TreeNode> nodes = treeNodes(group, platform.fileSystem, manager.loadProblems());
-        const bool isFolded = program.columns() && group == root && !program.arguments().has("--all");
-        const auto most
-            = static_cast<std::size_t>(std::max(3, apps::sizeOfTerminal(standardOutput).lines - linesBelowTree));
-        const std::vector<TreeLine> lines = isFolded ? foldedLines(nodes, most) : unfoldedLines(nodes);
-        TreeTextWishes wishes { program.style(), program.columns(), platform.clock.now() };
+        const std::optional<int> columns = program.columns();
+        TreeTextWishes wishes { program.style(), columns, platform.clock.now() };
         wishes.emptyMessage = [&manager](const OBMediaGroupRef& empty) { return manager.defaultNoDataMessage(empty); };
-        wishes.unfoldingCommand = [&root](const OBMediaGroupRef& folded) { return unfoldingCommand(root, folded); };
+        wishes.unfoldingCommand
+            = [&](const OBMediaGroupRef& folded) { return unfoldingCommand(program.arguments(), root, folded); };
         wishes.linkTarget = [&platform](std::string_view path) { return platform.fileSystem.resolvedPath(path); };
-        printTreeText(nodes, lines, wishes, [&program](std::string_view line) { program.printLine(line); });
+        const bool isFolded = columns && group == root && !program.arguments().has("--all");
+        const int linesBelow = 1 + (footer && columns ? linesOf(*footer, *columns) : 0);
+        const std::vector<TreeLine> lines = isFolded ? linesThatFit(nodes, wishes, linesBelow) : unfoldedLines(nodes);
+        (void)printTreeText(nodes, lines, wishes, [&program](std::string_view line) { program.printLine(line); });
     }
 
 } // namespace
@@ -107,8 +138,7 @@ namespace {
 int runTree(Program& program)
 {
     const Arguments& arguments = program.arguments();
-    const bool listsSkipped = arguments.has("--skipped") && !program.wantsJson();
-    const auto skipped = listsSkipped ? std::make_shared<SkippedItems>() : nullptr;
+    const auto skipped = arguments.has("--skipped") ? std::make_shared<SkippedItems>() : nullptr;
     const OBMediaGroupRef root = program.load(skipped);
     if (!root)
         return failed;
@@ -116,7 +146,7 @@ int runTree(Program& program)
     const OBMediaGroupRef group = isPart ? groupCalled(root, arguments.operands[0]) : root;
     if (!group) {
         const std::string& typed = arguments.operands[0];
-        return program.fail(typed, "no group has this ID or name" + suggestedIDOrName(root, typed));
+        return program.failGroup(typed, "ID or name", suggestedIDOrName(root, typed));
     }
     if (program.wantsJson()) {
         apps::printGroup(program.output(), group);
@@ -124,13 +154,14 @@ int runTree(Program& program)
         return done;
     }
     const std::shared_ptr<OBMediaManager> manager = program.manager();
-    printText(program, *manager, root, group);
+    const std::optional<std::string> footer = footerOf(program, *manager);
+    printText(program, *manager, root, group, footer);
     if (skipped)
         printSkipped(program, *skipped, group, isPart);
     program.output().flush();
     program.warnOfUnreadFolders();
-    if (program.columns() && apps::isTerminal(standardError))
-        printFooter(program, *manager);
+    if (footer)
+        printFooter(program, *footer);
     return done;
 }
 

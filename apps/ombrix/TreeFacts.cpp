@@ -36,8 +36,9 @@ namespace {
         return volume == volumeOf(pathAbove) ? std::string() : std::string(volume);
     }
 
-    std::string rootSummary(const Totals& totals)
+    std::string rootSummary(const TreeNode& node)
     {
+        const Totals& totals = node.totals;
         std::string summary = apps::quantityText(totals.projects, "project");
         if (totals.events > 0)
             append(summary, apps::quantityText(totals.events, "event"));
@@ -47,17 +48,16 @@ namespace {
             append(summary, apps::quantityText(totals.movies, "movie"));
         if (totals.bytes > 0)
             append(summary, apps::sizeText(totals.bytes));
+        if (node.unreadableFolders > 0)
+            append(summary, apps::quantityText(node.unreadableFolders, "folder") + " unreadable");
         return summary;
     }
 
-    std::string folderSummary(const TreeNode& node, bool isFolded, platform::Date now)
+    std::string folderSummary(const Totals& totals)
     {
-        const Totals& totals = node.totals;
         std::string summary = totals.projects == 0 ? "no projects" : apps::quantityText(totals.projects, "project");
         if (totals.folders > 0)
             summary += " in " + apps::quantityText(totals.folders, "folder");
-        if (isFolded && totals.newest)
-            append(summary, "newest " + apps::dateText(*totals.newest, now));
         return summary;
     }
 
@@ -69,13 +69,13 @@ namespace {
         return summary;
     }
 
-    std::string summaryOf(const TreeNode& node, bool isFolded, bool isFirst, platform::Date now)
+    std::string summaryOf(const TreeNode& node, bool isFolded, bool isFirst)
     {
         switch (node.kind) {
         case NodeKind::root:
-            return rootSummary(node.totals);
+            return rootSummary(node);
         case NodeKind::folder:
-            return folderSummary(node, isFolded, now);
+            return folderSummary(node.totals);
         case NodeKind::eventLibrary:
             return apps::quantityText(node.totals.events, "event");
         case NodeKind::year:
@@ -106,7 +106,9 @@ NodeFacts factsOf(const std::vector<TreeNode>& nodes, const TreeLine& line, plat
 {
     const TreeNode& node = nodes[line.node];
     NodeFacts facts;
-    facts.summary = summaryOf(node, line.isFolded, line.node == 0, now);
+    facts.summary = summaryOf(node, line.isFolded, line.node == 0);
+    if (node.kind == NodeKind::folder && line.isFolded && node.totals.newest)
+        facts.newest = std::string(between) + "newest " + apps::dateText(*node.totals.newest, now);
     facts.note = noteOf(nodes, node);
     const std::uint64_t media = node.kind == NodeKind::event ? node.totals.clips : node.totals.movies;
     const bool holdsMedia = node.kind == NodeKind::project || node.kind == NodeKind::event
@@ -120,7 +122,12 @@ NodeFacts factsOf(const std::vector<TreeNode>& nodes, const TreeLine& line, plat
     return facts;
 }
 
-std::string moreText(const std::vector<TreeNode>& nodes, const TreeLine& line)
+std::string moreText(const TreeLine& line)
+{
+    return "… " + apps::countText(line.hidden) + " more";
+}
+
+std::string ageText(const std::vector<TreeNode>& nodes, const TreeLine& line)
 {
     Totals hidden;
     std::size_t node = line.firstHidden;
@@ -128,10 +135,7 @@ std::string moreText(const std::vector<TreeNode>& nodes, const TreeLine& line)
         hidden.add(nodes[node].totals);
         node = nodes[node].end;
     }
-    std::string text = "… " + apps::countText(line.hidden) + " more";
-    if (hidden.oldest)
-        text += ", back to " + apps::monthText(*hidden.oldest);
-    return text;
+    return hidden.oldest ? ", back to " + apps::monthText(*hidden.oldest) : std::string();
 }
 
 } // namespace ombrix

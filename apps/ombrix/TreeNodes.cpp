@@ -4,7 +4,8 @@
 #include "platform/PathText.h"
 
 #include <algorithm>
-#include <set>
+#include <map>
+#include <string>
 #include <string_view>
 
 namespace ombrix {
@@ -74,22 +75,41 @@ namespace {
         return totals;
     }
 
+    /// Marks what stands for the unread folder; false when nothing does.
+    bool markNodes(const std::multimap<std::string, TreeNode*>& byPath, const std::string& unread)
+    {
+        bool isMarked = false;
+        std::string path = unread;
+        while (path.size() > 1) {
+            const auto [first, last] = byPath.equal_range(path);
+            for (auto found = first; found != last; ++found) {
+                TreeNode& node = *found->second;
+                // The folder of movies inside a project has no group of its own.
+                const bool isLeaf = node.kind == NodeKind::project || node.kind == NodeKind::event;
+                const bool standsForIt = isLeaf || path == unread;
+                node.isUnreadable = node.isUnreadable || standsForIt;
+                isMarked = isMarked || standsForIt;
+            }
+            path = platform::pathByRemovingLastComponent(path);
+        }
+        return isMarked;
+    }
+
+    /// A library that could not be read has no group, and then only the root can tell of it.
     void markUnreadable(std::vector<TreeNode>& nodes, const std::vector<OBLoadProblem>& problems)
     {
         if (problems.empty())
             return;
-        std::set<std::string_view> folders;
-        std::set<std::string_view> holders;
-        for (const OBLoadProblem& problem : problems) {
-            folders.insert(problem.path);
-            holders.insert(platform::pathByRemovingLastComponent(problem.path));
-        }
+        std::multimap<std::string, TreeNode*> byPath;
         for (TreeNode& node : nodes) {
-            const platform::Text path = node.group->path();
-            // The folder of movies inside a project has no group of its own.
-            const bool isLeaf = node.kind == NodeKind::project || node.kind == NodeKind::event;
-            node.isUnreadable = path && (folders.count(path) > 0 || (isLeaf && holders.count(path) > 0));
+            if (const platform::Text path = node.group->path())
+                byPath.emplace(path.string(), &node);
         }
+        std::size_t untold = 0;
+        for (const OBLoadProblem& problem : problems)
+            untold += !markNodes(byPath, problem.path);
+        if (nodes[0].kind == NodeKind::root)
+            nodes[0].unreadableFolders = untold;
     }
 
 } // namespace

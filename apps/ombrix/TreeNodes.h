@@ -46,6 +46,7 @@ struct TreeNode {
     std::size_t end = 0; ///< one past the last node below it: those are [own index + 1, end)
     std::size_t children = 0;
     bool isLast = true; ///< among the children of its parent
+    std::size_t unreadableFolders = 0; ///< of the root: folders that could not be read and that no group stands for
     bool isUnreadable = false; ///< its folder, or one that holds its movies, could not be read
     Totals totals {};
 };

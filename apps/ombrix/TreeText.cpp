@@ -10,8 +10,8 @@ namespace ombrix {
 namespace {
 
     constexpr int gap = 3;
-    constexpr int widestNameInPipe = 60;
-    constexpr int leastNameWidth = 16;
+    constexpr int leastNameWidth = 16; // with the boxes before it
+    constexpr int leastWithoutBoxes = 8;
     constexpr int columnsOfLevel = 3;
 
     /// How wide the columns are. A width of 0 stands for a column that is not there.
@@ -40,12 +40,17 @@ namespace {
         {
         }
 
-        void print(const std::function<void(std::string_view)>& print)
+        std::size_t print(const std::function<void(std::string_view)>& print)
         {
             measure();
             _hasMoreBelow.clear();
-            for (const TreeLine& line : _lines)
-                print(textOf(line));
+            std::size_t height = 0;
+            for (const TreeLine& line : _lines) {
+                const TextLine text = textOf(line);
+                print(text.text());
+                height += text.height();
+            }
+            return height;
         }
 
     private:
@@ -61,16 +66,20 @@ namespace {
 
         std::string labelOf(const TreeLine& line) const
         {
-            return line.hidden > 0 ? moreText(_nodes, line) : nameOf(_nodes[line.node]);
+            return line.hidden > 0 ? moreText(line) : nameOf(_nodes[line.node]);
         }
 
         void measure()
         {
+            int leastName = leastNameWidth;
+            int widestSummary = 0;
             for (const TreeLine& line : _lines) {
-                const int label = prefixWidth(line) + apps::displayWidth(labelOf(line));
+                const int boxes = prefixWidth(line);
+                const int label = boxes + apps::displayWidth(labelOf(line));
                 const bool isFirst = line.node == 0 && line.hidden == 0;
                 if (!isFirst || _lines.size() == 1)
                     _columns.name = std::max(_columns.name, label);
+                leastName = std::max(leastName, line.hidden > 0 ? label : boxes + leastWithoutBoxes);
                 if (line.hidden > 0)
                     continue;
                 const NodeFacts facts = factsOf(_nodes, line, _wishes.now);
@@ -78,17 +87,32 @@ namespace {
                 _columns.unit = std::max(_columns.unit, apps::displayWidth(facts.unit));
                 _columns.size = std::max(_columns.size, apps::displayWidth(facts.size));
                 _columns.date = std::max(_columns.date, apps::displayWidth(facts.date));
+                widestSummary = std::max(widestSummary, apps::displayWidth(facts.summary));
             }
-            if (!_wishes.columns) {
-                _columns.name = std::min(_columns.name, widestNameInPipe);
-                return;
-            }
+            if (_wishes.columns)
+                fitInto(*_wishes.columns, leastName);
+            _summaryStart = summaryStart(widestSummary);
+        }
+
+        void fitInto(int columns, int leastName)
+        {
+            leastName = std::min(leastName, _columns.name);
             // Where it gets tight the size goes first: counts and dates tell groups apart.
-            if (*_wishes.columns - _columns.factsWidth() < leastNameWidth)
-                _columns.size = 0;
-            if (*_wishes.columns - _columns.factsWidth() < leastNameWidth)
-                _columns.date = 0;
-            _columns.name = std::min(_columns.name, std::max(leastNameWidth, *_wishes.columns - _columns.factsWidth()));
+            for (int* width : { &_columns.size, &_columns.date, &_columns.count }) {
+                if (columns - _columns.factsWidth() < leastName)
+                    *width = 0;
+            }
+            _columns.name = std::min(_columns.name, std::max(leastName, columns - _columns.factsWidth()));
+        }
+
+        /// In the column of the dates, or the nearest one to the left in which every summary is whole.
+        int summaryStart(int widest) const
+        {
+            for (const int start : { _columns.dateStart(), _columns.sizeStart() }) {
+                if (!_wishes.columns || start + widest <= *_wishes.columns)
+                    return start;
+            }
+            return _columns.countStart();
         }
 
         int mostPrefixColumns() const { return _wishes.columns ? std::max(9, *_wishes.columns / 3) : 1 << 30; }
@@ -118,25 +142,37 @@ namespace {
             return prefix + (line.isLast ? "└─ " : "├─ ");
         }
 
-        std::string textOf(const TreeLine& line)
+        TextLine textOf(const TreeLine& line)
         {
             const std::string prefix = prefixOf(line);
             TextLine text(_wishes.style, _wishes.columns);
             text.addBehind(prefix, TextLine::Look::dim);
+            if (line.hidden > 0) {
+                addHidden(text, line);
+                return text;
+            }
             std::string label = labelOf(line);
             if (_wishes.columns)
-                label = apps::cutInMiddle(label, std::max(leastNameWidth / 2, _columns.name - prefixWidth(line)));
-            if (line.hidden > 0) {
-                text.addBehind(label, TextLine::Look::dim);
-                text.addWhole(_columns.dateStart(), _wishes.unfoldingCommand(_nodes[line.node].group));
-                return text.text();
-            }
-            const TreeNode& node = _nodes[line.node];
-            const platform::Text path = node.group->path();
+                label = apps::cutInMiddle(label, std::max(leastWithoutBoxes, _columns.name - prefixWidth(line)));
+            const platform::Text path = _nodes[line.node].group->path();
             const bool isLink = _wishes.style.hasLinks() && path;
             text.addBehind(label, TextLine::Look::bold, isLink ? _wishes.linkTarget(path) : std::string());
             addFacts(text, line);
-            return text.text();
+            return text;
+        }
+
+        /// How many are hidden and the command that shows them, of which nothing may be cut; and how old they are where
+        /// there is room for it.
+        void addHidden(TextLine& text, const TreeLine& line) const
+        {
+            const std::string command = _wishes.unfoldingCommand(_nodes[line.node].group);
+            std::string label = moreText(line);
+            const std::string withAge = label + ageText(_nodes, line);
+            const int width = prefixWidth(line) + apps::displayWidth(withAge) + gap + apps::displayWidth(command);
+            if (!_wishes.columns || width <= *_wishes.columns)
+                label = withAge;
+            text.addBehind(label, TextLine::Look::dim);
+            text.addWhole(_summaryStart, command);
         }
 
         void addFacts(TextLine& text, const TreeLine& line) const
@@ -146,57 +182,62 @@ namespace {
             if (node.isUnreadable) {
                 text.add(_columns.countStart(), "unreadable", TextLine::Look::warning);
             } else if (!facts.count.empty()) {
-                const std::string count = apps::paddedBefore(facts.count, _columns.count);
-                addAligned(text, _columns.countStart(), _columns.countWidth(), count + " " + facts.unit, false);
-                if (_columns.size > 0)
-                    addAligned(text, _columns.sizeStart(), _columns.size, facts.size, true);
-                if (_columns.date > 0)
-                    addAligned(text, _columns.dateStart(), _columns.date, facts.date, true);
+                addColumns(text, facts);
             } else if (const platform::Text message = _wishes.emptyMessage(node.group); !message.empty()) {
                 text.add(_columns.countStart(), _wishes.style.name(message), TextLine::Look::dim);
                 return;
+            } else if (line.node == 0) {
+                text.addMoving(_summaryStart, facts.summary);
             } else {
-                addSummary(text, line, facts.summary);
+                text.add(_summaryStart, summaryThatFits(facts), TextLine::Look::dim);
             }
-            text.add(_columns.noteStart(), _wishes.style.name(facts.note), TextLine::Look::dim);
+            text.addName(_columns.noteStart(), _wishes.style.name(facts.note), TextLine::Look::dim);
         }
 
-        /// In the first column from the right that leaves it whole, so that summaries line up as far as they can.
-        void addSummary(TextLine& text, const TreeLine& line, const std::string& summary) const
+        std::string summaryThatFits(const NodeFacts& facts) const
         {
-            if (line.node == 0) {
-                text.addWhole(_columns.dateStart(), summary);
-                return;
-            }
-            const int width = apps::displayWidth(summary);
-            for (const int start : { _columns.dateStart(), _columns.sizeStart(), _columns.countStart() }) {
-                if (!_wishes.columns || start + width <= *_wishes.columns || start == _columns.countStart()) {
-                    text.add(start, summary, TextLine::Look::dim);
-                    return;
-                }
-            }
+            const std::string whole = facts.summary + facts.newest;
+            const bool fits = !_wishes.columns || _summaryStart + apps::displayWidth(whole) <= *_wishes.columns;
+            return fits ? whole : facts.summary;
         }
 
-        static void addAligned(TextLine& text, int start, int width, const std::string& fact, bool isRight)
+        void addColumns(TextLine& text, const NodeFacts& facts) const
+        {
+            if (_columns.count > 0)
+                addAligned(
+                    text, _columns.countStart(), apps::paddedBefore(facts.count, _columns.count) + " " + facts.unit);
+            if (_columns.size > 0)
+                addAtRight(text, _columns.sizeStart(), _columns.size, facts.size);
+            if (_columns.date > 0)
+                addAtRight(text, _columns.dateStart(), _columns.date, facts.date);
+        }
+
+        /// Blanks before a fact are no text: the line is searched and copied.
+        static void addAligned(TextLine& text, int start, std::string_view fact)
         {
             const std::size_t blanks = std::min(fact.find_first_not_of(' '), fact.size());
-            const int column = isRight ? start + width - apps::displayWidth(fact) : start + static_cast<int>(blanks);
-            text.add(column, std::string_view(fact).substr(blanks), TextLine::Look::dim);
+            text.add(start + static_cast<int>(blanks), fact.substr(blanks), TextLine::Look::dim);
+        }
+
+        static void addAtRight(TextLine& text, int start, int width, std::string_view fact)
+        {
+            text.add(start + width - apps::displayWidth(fact), fact, TextLine::Look::dim);
         }
 
         const std::vector<TreeNode>& _nodes;
         const std::vector<TreeLine>& _lines;
         const TreeTextWishes& _wishes;
         Columns _columns;
+        int _summaryStart = 0;
         std::vector<bool> _hasMoreBelow;
     };
 
 } // namespace
 
-void printTreeText(const std::vector<TreeNode>& nodes, const std::vector<TreeLine>& lines, const TreeTextWishes& wishes,
-    const std::function<void(std::string_view)>& print)
+std::size_t printTreeText(const std::vector<TreeNode>& nodes, const std::vector<TreeLine>& lines,
+    const TreeTextWishes& wishes, const std::function<void(std::string_view)>& print)
 {
-    TreePrinter(nodes, lines, wishes).print(print);
+    return TreePrinter(nodes, lines, wishes).print(print);
 }
 
 } // namespace ombrix

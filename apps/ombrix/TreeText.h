@@ -25,8 +25,9 @@ struct TreeTextWishes {
     std::function<std::string(std::string_view)> linkTarget {};
 };
 
-/// Hands one line after the other to `print`: names in one column, facts in columns right of them.
-void printTreeText(const std::vector<TreeNode>& nodes, const std::vector<TreeLine>& lines, const TreeTextWishes& wishes,
-    const std::function<void(std::string_view)>& print);
+/// Hands one line after the other to `print`: names in one column, facts in columns right of them. Answers how many
+/// lines of the terminal they take, of which a command too long for one takes several.
+std::size_t printTreeText(const std::vector<TreeNode>& nodes, const std::vector<TreeLine>& lines,
+    const TreeTextWishes& wishes, const std::function<void(std::string_view)>& print);
 
 } // namespace ombrix

@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <optional>
 
 namespace platform {
 namespace {
@@ -45,13 +46,31 @@ namespace {
         /// Moves to the first byte of the next token, and behind all of it, which ends at `end` or is one letter long.
         Place passToken(std::size_t end)
         {
-            const std::size_t start = std::min(_bytes.find_first_not_of(" \t\r\n,:", _offset), _bytes.size());
+            const std::size_t start = startOfNextToken();
             const Place place = moveTo(start);
             moveTo(std::max(end, start + 1));
             return place;
         }
 
+        /// The text that begins at the next token, as it is written there, up to its end or that of its line; absent
+        /// when that token is no text.
+        std::optional<std::string_view> writtenText() const
+        {
+            const std::size_t start = startOfNextToken();
+            if (start == _bytes.size() || _bytes[start] != '"')
+                return std::nullopt;
+            std::size_t end = start + 1;
+            while (end < _bytes.size() && _bytes[end] != '"' && _bytes[end] != '\n')
+                end += _bytes[end] == '\\' ? 2 : 1;
+            return _bytes.substr(start + 1, std::min(end, _bytes.size()) - start - 1);
+        }
+
     private:
+        std::size_t startOfNextToken() const
+        {
+            return std::min(_bytes.find_first_not_of(" \t\r\n,:", _offset), _bytes.size());
+        }
+
         std::string_view _bytes;
         std::size_t _offset = 0;
         Place _place;
@@ -62,9 +81,10 @@ namespace {
         return std::to_string(place.line) + ": " + std::string(what);
     }
 
-    std::string_view reasonFor(rapidjson::ParseErrorCode code)
+    std::string_view reasonFor(const rapidjson::ParseResult& outcome, std::string_view bytes)
     {
-        switch (code) {
+        constexpr std::string_view controlCharacter = "a text holds a line break or another control character";
+        switch (outcome.Code()) {
         case rapidjson::kParseErrorDocumentEmpty:
             return "the document is empty";
         case rapidjson::kParseErrorDocumentRootNotSingular:
@@ -80,11 +100,14 @@ namespace {
         case rapidjson::kParseErrorStringUnicodeEscapeInvalidHex:
         case rapidjson::kParseErrorStringUnicodeSurrogateInvalid:
         case rapidjson::kParseErrorStringEscapeInvalid:
+            // Some versions of the parser tell a bare control character so.
+            if (outcome.Offset() < bytes.size() && static_cast<unsigned char>(bytes[outcome.Offset()]) < 0x20)
+                return controlCharacter;
             return "a text has a wrong escape";
         case rapidjson::kParseErrorStringMissQuotationMark:
             return "the closing quote of a text is missing";
         case rapidjson::kParseErrorStringInvalidEncoding:
-            return "a text holds a line break or another control character";
+            return controlCharacter;
         case rapidjson::kParseErrorNumberTooBig:
         case rapidjson::kParseErrorNumberMissFraction:
         case rapidjson::kParseErrorNumberMissExponent:
@@ -130,7 +153,7 @@ namespace {
             node.kind = JsonNode::Kind::real;
             node.integer = 0;
             if (std::from_chars(digits, end, node.real).ec != std::errc())
-                return fail({ node.line, node.column }, "a number is out of range");
+                return fail({ node.line, node.column }, keyAtWork() + "a number is out of range");
             return addLeaf(std::move(node));
         }
         bool String(const char* bytes, rapidjson::SizeType length, bool)
@@ -159,6 +182,24 @@ namespace {
         bool StartArray() { return open(JsonNode::Kind::list); }
         bool EndArray(rapidjson::SizeType) { return close(); }
 
+        /// What a message about the place where the parser stopped begins with: the key whose text or value it is in,
+        /// or which is the last before it. Empty where no key is near.
+        std::string keyAtWork() const
+        {
+            for (auto level = _open.rbegin(); level != _open.rend(); ++level) {
+                if (level->kind != JsonNode::Kind::object)
+                    continue;
+                const bool isBetweenMembers = level->members.empty() || level->members.back().value.line > 0;
+                if (!isBetweenMembers)
+                    return namedKey(level->members.back().key);
+                if (const auto key = _cursor.writtenText())
+                    return namedKey(*key);
+                if (!level->members.empty())
+                    return "after " + namedKey(level->members.back().key);
+            }
+            return {};
+        }
+
         JsonNode takeRoot() { return std::move(_root); }
         const std::string& problem() const { return _problem; }
 
@@ -179,10 +220,12 @@ namespace {
             return false;
         }
 
+        static std::string namedKey(std::string_view key) { return "key " + quoted(key) + ": "; }
+
         bool checkText(std::string_view text, Place place)
         {
             // An escape can name half of a surrogate pair, which no UTF-8 holds.
-            return lengthOfValidPrefix(text) == text.size() || fail(place, "a text has a wrong escape");
+            return lengthOfValidPrefix(text) == text.size() || fail(place, keyAtWork() + "a text has a wrong escape");
         }
 
         bool addLeaf(JsonNode node)
@@ -232,15 +275,38 @@ namespace {
         std::size_t _values = 0;
     };
 
+    /// How parsing `bytes` ended.
+    struct Parsing {
+        explicit Parsing(std::string_view bytes)
+            : stream(bytes.data() ? bytes.data() : "", bytes.size())
+            , builder(bytes, stream)
+        {
+            // Its own conversion to the nearest real relies on undefined behaviour for some spellings of zero.
+            constexpr unsigned flags = rapidjson::kParseIterativeFlag | rapidjson::kParseNumbersAsStringsFlag;
+            outcome = rapidjson::Reader().Parse<flags>(stream, builder);
+        }
+
+        rapidjson::MemoryStream stream;
+        Builder builder;
+        rapidjson::ParseResult outcome {};
+    };
+
+    /// What is wrong with the byte at `offset`, told with the key it belongs to.
+    std::string problemWithByte(std::string_view bytes, std::size_t offset, std::string_view what)
+    {
+        const std::string key = Parsing(bytes.substr(0, offset)).builder.keyAtWork();
+        return problemAt(Cursor(bytes).moveTo(offset), key + std::string(what));
+    }
+
     std::string problemWithBytes(std::string_view bytes)
     {
         if (bytes.size() > largestJsonDocument)
             return "1: the document is larger than 16 MiB";
         // The parser takes a zero byte for the end of the document.
         if (const std::size_t zero = bytes.find('\0'); zero != std::string_view::npos)
-            return problemAt(Cursor(bytes).moveTo(zero), "the document holds a zero byte");
+            return problemWithByte(bytes, zero, "the document holds a zero byte");
         if (const std::size_t end = lengthOfValidPrefix(bytes); end != bytes.size())
-            return problemAt(Cursor(bytes).moveTo(end), "the document is not UTF-8");
+            return problemWithByte(bytes, end, "the document is not UTF-8");
         return {};
     }
 
@@ -265,18 +331,15 @@ JsonResult readJson(std::string_view bytes)
     if (!result.problem.empty())
         return result;
 
-    // Its own conversion to the nearest real relies on undefined behaviour for some spellings of zero.
-    constexpr unsigned flags = rapidjson::kParseIterativeFlag | rapidjson::kParseNumbersAsStringsFlag;
-    rapidjson::MemoryStream stream(bytes.data() ? bytes.data() : "", bytes.size());
-    rapidjson::Reader reader;
-    Builder builder(bytes, stream);
-    const rapidjson::ParseResult outcome = reader.Parse<flags>(stream, builder);
-    if (!builder.problem().empty())
-        result.problem = builder.problem();
+    Parsing parsing(bytes);
+    const rapidjson::ParseResult& outcome = parsing.outcome;
+    if (!parsing.builder.problem().empty())
+        result.problem = parsing.builder.problem();
     else if (outcome.IsError())
-        result.problem = problemAt(Cursor(bytes).moveTo(outcome.Offset()), reasonFor(outcome.Code()));
+        result.problem = problemAt(Cursor(bytes).moveTo(outcome.Offset()),
+            parsing.builder.keyAtWork() + std::string(reasonFor(outcome, bytes)));
     else
-        result.root = builder.takeRoot();
+        result.root = parsing.builder.takeRoot();
     return result;
 }
 

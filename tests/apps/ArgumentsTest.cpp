@@ -58,9 +58,34 @@ TEST_CASE("nothing behind two hyphens is an option")
     CHECK(parse({ "--", "tree" }).arguments.command == commandNamed("tree"));
 }
 
-TEST_CASE("of an option that is typed twice the last value counts")
+TEST_CASE("an option with a value is typed once, unless it only says how things look")
 {
-    CHECK(*parse({ "objects", "--group", "a", "--group", "b" }).arguments.valueOf("--group") == "b");
+    CHECK(parse({ "objects", "--group", "a", "--group=b" }).problem == "objects: option --group is given twice");
+    CHECK(parse({ "--machine", "a", "tree", "--machine=a" }).problem == "tree: option --machine is given twice");
+    CHECK(parse({ "tree", "--source", "a", "--source", "b" }).problem == "tree: option --source is given twice");
+    CHECK(parse({ "tree", "--color=always", "--color=never" }).arguments.color == apps::When::never);
+    CHECK(parse({ "tree", "--all", "--all", "--json", "--json" }).problem.empty());
+}
+
+TEST_CASE("an option that means nothing to a command, or beside another, is refused")
+{
+    CHECK(parse({ "plugins", "--source", "x" }).problem == "plugins: option --source means nothing here");
+    CHECK(parse({ "--source=x", "help", "tree" }).problem == "help: option --source means nothing here");
+    CHECK(parse({ "tree", "--skipped", "--json" }).problem == "tree: options --skipped and --json exclude each other");
+    CHECK(parse({ "paths", "--json", "-0" }).problem == "paths: options -0 and --json exclude each other");
+    CHECK(parse({ "objects", "--group", "x", "--json", "-0" }).problem
+        == "objects: options -0 and --json exclude each other");
+}
+
+TEST_CASE("an option that a command cannot do without is missed, and stands without brackets in help")
+{
+    for (const char* command : { "objects", "message" }) {
+        CHECK(parse({ command }).problem
+            == std::string(command) + ": option --group ID is missing (\"ombrix help " + command + "\")");
+        const std::string help = helpText(*commandNamed(command));
+        CHECK(help.find("  ombrix " + std::string(command) + " --group ID") != std::string::npos);
+    }
+    CHECK(helpText(*commandNamed("tree")).find(" [--all] ") != std::string::npos);
 }
 
 TEST_CASE("a mistake is told in one line with a suggestion")
@@ -79,6 +104,17 @@ TEST_CASE("a mistake is told in one line with a suggestion")
     CHECK(parse({ "--json", "tree" }).problem
         == "unknown option --json before the command (options of a command follow its name)");
     CHECK(parse({ "paths", "--group", "x" }).problem == "paths: unknown option --group");
+    CHECK(parse({ "tree", "--source=" }).problem == "tree: option --source needs a value: IDENTIFIER");
+}
+
+TEST_CASE("only an option whose own letters are near is suggested")
+{
+    CHECK(parse({ "message", "--json" }).problem == "message: unknown option --json");
+    CHECK(parse({ "help", "--json" }).problem == "help: unknown option --json");
+    CHECK(parse({ "groups", "--all" }).problem == "groups: unknown option --all");
+    CHECK(parse({ "tree", "-x" }).problem == "tree: unknown option -x");
+    CHECK(parse({ "tree", "-all" }).problem == "tree: unknown option -all (did you mean \"--all\"?)");
+    CHECK(parse({ "tree", "--hlep" }).problem == "tree: unknown option --hlep (did you mean \"--help\"?)");
 }
 
 TEST_CASE("help and the version need no command")
@@ -87,6 +123,18 @@ TEST_CASE("help and the version need no command")
     CHECK(parse({ "-h" }).arguments.wantsHelp);
     CHECK(parse({ "--version" }).arguments.wantsVersion);
     CHECK(parse({ "tree", "-h" }).arguments.command == commandNamed("tree"));
+}
+
+TEST_CASE("whoever asks for help or the version gets it whatever else is typed")
+{
+    const std::vector<std::string_view> lines[] { { "--help", "x" }, { "x", "--help" }, { "tree", "--help", "x", "y" },
+        { "tree", "--bogus", "-h" }, { "objects", "--help" }, { "--version", "x" }, { "plugins", "--version" } };
+    for (const auto& words : lines) {
+        const ParsedArguments parsed = parse(words);
+        CHECK(parsed.problem.empty());
+        CHECK(parsed.arguments.wantsHelp != parsed.arguments.wantsVersion);
+    }
+    CHECK(parse({ "objects", "--group", "-h" }).arguments.valueOf("--group") != nullptr);
 }
 
 TEST_CASE("every help text fits on one screen and every command has two examples that parse")

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <csignal>
+#include <filesystem>
 
 using namespace tests;
 
@@ -106,7 +107,18 @@ TEST_CASE("what is asked of a missing group, source, description or option is re
     checkRefused(machine.run({ "objects", "--group", "no\nsuch" }), 1);
     checkRefused(machine.run({ "message", "--group", "none" }), 1);
     checkRefused(machine.run({ "tree", "--source", "org.example.None" }), 1);
+    for (const char* command : { "tree", "objects --group", "message --group" }) {
+        std::vector<std::string> words { std::string(command).substr(0, std::string_view(command).find(' ')) };
+        if (words[0] != command)
+            words.emplace_back("--group");
+        words.emplace_back("");
+        const ProgramRun nameless = machine.run(words);
+        checkRefused(nameless, 1);
+        CHECK(contains(nameless.errors, "ombrix: " + words[0] + ": \"\" is the ID "));
+    }
     checkRefused(machine.run({ "message" }), 2);
+    checkRefused(machine.run({ "objects", "--group", "a", "--group", "b" }), 2);
+    checkRefused(machine.run({ "plugins", "--source", "x" }), 2);
     checkRefused(machine.run({ "tree", "--jsn" }), 2);
     checkRefused(runProgram({ { "tre" }, {}, {} }), 2);
     checkRefused(runProgram({ {}, {}, {} }), 2);
@@ -136,6 +148,21 @@ TEST_CASE("without the editor nothing is loaded, and what needs no load still an
     CHECK(runProgram({ { "paths", "--machine", file }, {}, {} }).status == 0);
 }
 
+TEST_CASE("a library that is there and cannot be read is neither absent nor fatal")
+{
+    const MadeMachine machine;
+    const std::string closed = machine.folder.path("home/Movies/Montaro Projects");
+    std::filesystem::remove_all(closed);
+    std::filesystem::create_symlink(closed, closed);
+    CHECK(contains(machine.run({ "paths" }).output, closed + "   not readable: its links lead in circles\n"));
+    CHECK(contains(machine.run({ "info" }).output, "project folders exist (1 not readable), "));
+    const ProgramRun tree = machine.run({ "tree" });
+    CHECK(tree.status == 0);
+    CHECK(contains(tree.output, "1 folder unreadable"));
+    CHECK(tree.errors == "ombrix: warning: " + closed + ": its links lead in circles\n");
+    CHECK(machine.run({ "paths", "--json" }).errors.empty());
+}
+
 TEST_CASE("a source that offers no inspection has empty lists and null")
 {
     const ProgramRun paths = runProgram(waitingSource({ "paths", "--json" }));
@@ -147,7 +174,7 @@ TEST_CASE("a source that offers no inspection has empty lists and null")
 
 TEST_CASE("the plug-ins of the folders named in the environment are found first")
 {
-    const ProgramRun run = runProgram(waitingSource({ "plugins", "--json" }));
+    const ProgramRun run = runProgram({ { "plugins", "--json" }, { { "OMBRIX_PLUGIN_PATH", WAITING_PLUGINS } }, {} });
     CHECK(run.status == 0);
     CHECK(contains(run.output, "[{\"identifier\":\"org.ombrix.tests.Waiting\",\"version\":\"1.0\""));
     CHECK(contains(run.output, "\"identifier\":\"org.ombrix.OBMontaroPlugin\""));
@@ -192,8 +219,9 @@ TEST_CASE("help and the version go to standard output")
     CHECK(help.status == 0);
     CHECK(help.errors.empty());
     CHECK(help.output == runProgram({ { "help" }, {}, {} }).output);
+    CHECK(help.output == runProgram({ { "--help", "x" }, {}, {} }).output);
     CHECK(runProgram({ { "tree", "-h" }, {}, {} }).output == runProgram({ { "help", "tree" }, {}, {} }).output);
-    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1)\n"));
+    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1.0)\n"));
 }
 
 TEST_CASE("logs go to standard error from level 2 on, one line each")

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <csignal>
+#include <cstdio>
 
 using namespace tests;
 
@@ -78,10 +79,50 @@ TEST_CASE("on a terminal the tree is folded to its height and names the command 
     CHECK(run.status == 0);
     CHECK(linesIn(run.output) <= 19);
     CHECK(contains(run.output, "more"));
-    CHECK(contains(run.output, "ombrix tree Clients\n"));
+    CHECK(contains(run.output, "ombrix tree Clients --machine " + machine.folder.path("machine.json") + "\n"));
     CHECK(contains(run.output, "└─ Events"));
     CHECK(linesIn(runOnTerminal(machine.wishes({ "tree", "Clients" }), { 20, 80 }).output) > 60);
     CHECK(linesIn(runOnTerminal(machine.wishes({ "tree", "--all" }), { 20, 80 }).output) > 60);
+}
+
+TEST_CASE("the command that unfolds a part works when it is pasted, whatever the part is called")
+{
+    for (const char* name : { "it's a \"quoted\" $HOME", "-odd", "line\nfeed\x1b", "Events", " *" }) {
+        const TemporaryFolder folder;
+        LibraryBuilder library(folder.folder("home/Movies/Montaro Projects"));
+        for (int project = 0; project < 40; ++project)
+            library.project(std::string(name) + "/Project " + std::to_string(project));
+        DescribedMachine description;
+        const std::string file = folder.path("my machine.json");
+        description.home(folder.path("home")).editor(folder.file("editor")).write(file);
+        const ProgramRun run = runOnTerminal({ { "tree", "--color=never", "--machine", file }, {}, {} }, { 12, 60 });
+        const std::size_t start = run.output.find("ombrix tree ");
+        REQUIRE(start != std::string::npos);
+        const std::string pasted = run.output.substr(start, run.output.find('\n', start) - start);
+        const std::string script
+            = folder.file("paste", "ombrix() { " OMBRIX_PROGRAM " \"$@\"; }\n" + pasted + " | grep -c 'Project '\n");
+        CAPTURE(pasted);
+        std::FILE* answer = ::popen(("bash '" + script + "'").c_str(), "r");
+        int count = 0;
+        CHECK(std::fscanf(answer, "%d", &count) == 1);
+        ::pclose(answer);
+        CHECK(count == 40);
+    }
+}
+
+TEST_CASE("IDs are whole on a terminal, and other columns line up")
+{
+    const LargeMachine machine;
+    LibraryBuilder(machine.folder.path("home/Movies/Montaro Projects"))
+        .project("Clients/A project with a name that is longer than any column for names");
+    for (const int columns : { 60, 80, 120 }) {
+        const ProgramRun run = runOnTerminal(machine.wishes({ "groups", "--color=never" }), { 24, columns });
+        const std::string place = "   " + machine.library.path("Clients/Project 7") + "\n";
+        CHECK(contains(run.output, place));
+        CHECK(contains(run.output, "   " + machine.library.path(hostileName).substr(0, 20)));
+        CHECK(contains(run.output, "A project"));
+        CHECK(contains(run.output, "…"));
+    }
 }
 
 TEST_CASE("the tree in a pipe says nothing of time even where standard error is a terminal")

@@ -2,6 +2,7 @@
 #include "apps/common/DisplayWidth.h"
 #include "apps/common/HostileNames.h"
 #include "apps/common/HumanText.h"
+#include "apps/common/LoadWatch.h"
 #include "apps/common/Style.h"
 #include "apps/ombrix/ShellWord.h"
 
@@ -97,10 +98,54 @@ TEST_CASE("what could harm a terminal is shown by its code")
     CHECK(escapedText("a\nb\tc\x7f") == "a\\x0ab\\x09c\\x7f");
     CHECK(escapedText("\u202egnp.exe") == "\\u202egnp.exe");
     CHECK(escapedText("\u2066x\u2069") == "\\u2066x\\u2069");
+    CHECK(escapedText("a\u200eb\u200f\u061c\ufeff") == "a\\u200eb\\u200f\\u061c\\ufeff");
+    CHECK(escapedText("a\u200bb\u200cc\u200dd\u2060") == "a\\u200bb\\u200cc\\u200dd\\u2060");
+    CHECK(escapedText("a\U000e0041") == "a\\U000e0041");
     CHECK(escapedText("\xff"
                       "a")
         == "\\xffa");
     CHECK(escapedText("\u009b") == "\\xc2\\x9b");
+}
+
+TEST_CASE("what joins pictures to one emoji is no harm")
+{
+    for (const char* emoji : { "👩‍👩‍👧‍👦", "❤️‍🔥", "👍🏽", "👩🏽‍⚕️",
+             "🏳️‍🌈", "\U0001f3f4\U000e0067\U000e0062\U000e0065\U000e006e\U000e0067\U000e007f" })
+        CHECK(escapedText(emoji) == emoji);
+    CHECK(escapedText("😀\u200d") == "😀\\u200d");
+    CHECK(escapedText("😀\u200da") == "😀\\u200da");
+}
+
+TEST_CASE("an escape is cut out whole and not in its middle")
+{
+    const std::string name = escapedName("ab\x1b\ncd\u202e.mov");
+    for (int columns = 0; columns <= 25; ++columns) {
+        for (const std::string& cut : { cutInMiddle(name, columns), cutAtEnd(name, columns) }) {
+            std::string left = withoutMarks(cut);
+            CAPTURE(left);
+            CHECK(displayWidth(cut) <= columns);
+            for (const char* whole : { "\\x1b", "\\x0a", "\\u202e" }) {
+                if (const std::size_t at = left.find(whole); at != std::string::npos)
+                    left.erase(at, std::string_view(whole).size());
+            }
+            CHECK(left.find('\\') == std::string::npos);
+        }
+    }
+}
+
+TEST_CASE("a line of progress that is cut holds whole escapes")
+{
+    OBLoadProgress progress;
+    progress.pathAtWork = "/Volumes/a\x1b\x1b\x1b\x1b\x1b\x1b";
+    for (int columns = 20; columns < 130; ++columns) {
+        for (const std::string& line : { progressLine(progress, "a\x1b\x1b\x1b\x1b\x1b\x1b", {}, columns),
+                 waitingProgress(progress, "a\x1b\x1b\x1b\x1b\x1b\x1b", {}, columns) }) {
+            CAPTURE(line);
+            CHECK(displayWidth(line) <= columns);
+            for (std::size_t at = line.find('\\'); at != std::string::npos; at = line.find('\\', at + 1))
+                CHECK(line.substr(at, 4) == "\\x1b");
+        }
+    }
 }
 
 TEST_CASE("an escaped name marks what was escaped in no column")

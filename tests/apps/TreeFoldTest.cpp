@@ -7,6 +7,7 @@
 
 #include <doctest/doctest.h>
 
+#include <set>
 #include <string>
 #include <vector>
 
@@ -63,6 +64,13 @@ std::vector<std::string> textOf(
     std::vector<std::string> text;
     printTreeText(nodes, lines, wishes, [&text](std::string_view line) { text.emplace_back(line); });
     return text;
+}
+
+int columnOf(const std::string& line, const std::string& text)
+{
+    const std::size_t at = line.rfind(text);
+    REQUIRE(at != std::string::npos);
+    return apps::displayWidth(std::string_view(line).substr(0, at));
 }
 
 } // namespace
@@ -148,6 +156,65 @@ TEST_CASE("no line is wider than the terminal, and facts line up at every width"
     }
 }
 
+TEST_CASE("counts, dates and summaries each stand in one column, however deep and long the names are")
+{
+    const tests::TemporaryFolder folder;
+    const OBMediaObjectRef movie = OBMediaObject::initWithMediaType_name(3, "a");
+    movie->setPath(folder.file("a.mov", "movie"));
+    const OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
+    OBMediaGroupRef innermost = root;
+    for (const char* name : { "A", "東京の夜", "a folder with quite a long name", "D" }) {
+        const OBMediaGroupRef project
+            = makeGroup(OBMontaroProjectGroupTypeIdentifier, std::string(90, 'x') + name + ".project");
+        project->setMediaObjects(OBMediaObjectList({ movie }));
+        const OBMediaGroupRef child = makeGroup(OBMontaroFolderGroupTypeIdentifier, name);
+        innermost->addChildGroup(project);
+        innermost->addChildGroup(child);
+        innermost = child;
+    }
+    innermost->addChildGroup(makeGroup(OBMontaroProjectGroupTypeIdentifier, "Draft"));
+    const std::vector<TreeNode> nodes = nodesOf(root);
+    for (const std::optional<int> columns :
+        { std::optional(60), std::optional(80), std::optional(120), std::optional<int>() }) {
+        std::set<int> movies;
+        std::set<int> projects;
+        for (const std::string& line : textOf(nodes, unfoldedLines(nodes), columns)) {
+            CAPTURE(line);
+            CHECK((!columns || apps::displayWidth(line) <= *columns));
+            CHECK((columns || line.find("…") == std::string::npos));
+            if (line.find("1 movie ") != std::string::npos)
+                movies.insert(columnOf(line, "1 movie "));
+            else if (line.find("─ ") != std::string::npos && line.find("Draft") == std::string::npos)
+                projects.insert(columnOf(line, line.substr(line.find(" project") - 1, 1) + " project"));
+        }
+        CHECK(movies.size() == 1);
+        CHECK(projects.size() == 1);
+    }
+}
+
+TEST_CASE("a command that unfolds is never cut, and the lines of the terminal that it needs are counted")
+{
+    const std::vector<TreeNode> nodes = nodesOf(makeTree(1, 1200));
+    const std::vector<TreeLine> lines = foldedLines(nodes, 6);
+    const std::string command = "ombrix tree 'Folder 0' --machine " + std::string(100, 'x') + "/machine.json";
+    for (const int columns : { 60, 80, 120 }) {
+        const apps::Style style { apps::StyleWishes() };
+        TreeTextWishes wishes { style, columns };
+        wishes.emptyMessage = [](const OBMediaGroupRef&) { return platform::Text(); };
+        wishes.unfoldingCommand = [&](const OBMediaGroupRef&) { return command; };
+        std::string text;
+        std::size_t height = 0;
+        const std::size_t told = printTreeText(nodes, lines, wishes, [&](std::string_view line) {
+            text.append(line).append("\n");
+            height += static_cast<std::size_t>(1 + (apps::displayWidth(line) - 1) / columns);
+        });
+        CHECK(text.find("… 1,198 more") != std::string::npos);
+        CHECK(text.find(" " + command + "\n") != std::string::npos);
+        CHECK(told == height);
+        CHECK(told > lines.size());
+    }
+}
+
 TEST_CASE("lines of a tree that is deeper than the terminal is wide still fit")
 {
     const OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
@@ -201,4 +268,11 @@ TEST_CASE("a folder that could not be read is marked, and a project whose movies
     }
     CHECK(marked == std::vector<std::string> { "/a/Folder 0", "/a/Folder 1/Project 0" });
     CHECK(textOf(nodes, unfoldedLines(nodes), std::nullopt)[1].find("unreadable") != std::string::npos);
+}
+
+TEST_CASE("the root tells of an unreadable library, for which no group stands")
+{
+    const std::vector<TreeNode> nodes
+        = nodesOf(makeTree(1, 1), { { "/home/Montaro Projects", platform::FileProblem::notPermitted } });
+    CHECK(textOf(nodes, unfoldedLines(nodes), std::nullopt)[0].find("1 folder unreadable") != std::string::npos);
 }

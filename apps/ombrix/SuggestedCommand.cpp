@@ -1,0 +1,22 @@
+#include "apps/ombrix/SuggestedCommand.h"
+
+#include "apps/ombrix/ShellWord.h"
+
+namespace ombrix {
+
+std::string suggestedCommand(const Arguments& arguments, std::string_view command, std::string_view operand)
+{
+    std::string text = "ombrix " + std::string(command);
+    const bool looksLikeOption = operand.starts_with('-');
+    if (!operand.empty() && !looksLikeOption)
+        text += " " + shellWord(operand);
+    if (arguments.machineFile)
+        text += " --machine " + shellWord(*arguments.machineFile);
+    if (arguments.source != defaultSource)
+        text += " --source " + shellWord(arguments.source);
+    if (looksLikeOption)
+        text += " -- " + shellWord(operand);
+    return text;
+}
+
+} // namespace ombrix

@@ -5,6 +5,7 @@
 #include "platform/described/DescribedPlatform.h"
 #include "platform/linux/LinuxPlatform.h"
 
+#include <chrono>
 #include <functional>
 #include <string>
 #include <utility>
@@ -26,6 +27,10 @@ namespace {
             return _threads.startDetached(name, std::move(body));
         }
         void setNiceOfCurrentThread(int nice) override { _threads.setNiceOfCurrentThread(nice); }
+        std::chrono::nanoseconds processorTimeOfCurrentThread() const override
+        {
+            return _threads.processorTimeOfCurrentThread();
+        }
 
     private:
         platform::Threads& _threads;
@@ -38,7 +43,7 @@ namespace {
         {
             const platform::Platform roles = real.platform();
             return { roles.fileSystem, roles.volumes, roles.workspace, roles.preferences, roles.metadataIndex,
-                roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock, threads,
+                roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock, roles.calendar, threads,
                 roles.mainRunLoop, roles.console, roles.bundles, roles.languages };
         }
 

@@ -1,6 +1,7 @@
 #include "plugin/ScanFindings.h"
 
 #include "platform/FileProblemText.h"
+#include "platform/PathText.h"
 
 #include <string>
 
@@ -45,11 +46,13 @@ std::string remedyOfProblem(FileProblem problem, std::string_view path)
 } // namespace
 
 OBScanDecision ScanFindings::searchedLibrary(
-    std::string_view path, std::string_view what, std::size_t index, std::size_t count)
+    std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome)
 {
+    const std::string_view volume = platform::pathByRemovingLastComponent(path) == "/" ? "boot volume" : "volume";
     OBScanDecision decision = finding("search folder", path,
-        ordinal(index + 1) + " of " + std::to_string(count) + " that are searched for " + std::string(what));
-    decision.itself = "a library shows what it holds, not itself";
+        std::string(isInHome ? "home folder" : volume) + ", " + ordinal(index + 1) + " of " + std::to_string(count)
+            + " for " + std::string(what));
+    decision.itself = "a search folder shows what it holds, not itself";
     return decision;
 }
 
@@ -64,9 +67,9 @@ OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform:
     return decision;
 }
 
-OBScanDecision ScanFindings::noProject(std::string_view path)
+OBScanDecision ScanFindings::noProject(std::string_view path, std::string_view reason)
 {
-    return finding("project", path, "it holds no CurrentVersion.mtrproject, so it is no project");
+    return finding("project", path, std::string(reason) + "; it is taken for no project");
 }
 
 OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries)
@@ -99,15 +102,16 @@ OBScanDecision ScanFindings::eventWithoutClips(std::string_view path)
     return decision;
 }
 
-OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target)
+OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target, bool exists)
 {
-    return finding("link", path, "it leads to " + std::string(target));
+    return finding("link", path, "it leads to " + std::string(target) + (exists ? "" : ", where nothing is"));
 }
 
-OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year)
+OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded)
 {
-    OBScanDecision decision = finding("year", path,
-        year < 0 ? std::string("it has no date, so its year is -1") : "it was made in " + std::to_string(year));
-    decision.inside = "a clip is not looked into";
-    return decision;
+    const std::string_view origin = isRecorded ? ", when it was recorded" : ", the earlier of birth and modification";
+    return finding("year", path,
+        std::to_string(year) + ": "
+            + (date.empty() ? std::string("it has no date")
+                            : (isRecorded ? "" : "file date ") + std::string(date) + std::string(origin)));
 }

@@ -21,6 +21,7 @@ public:
 
     void libraryBegan(const std::string& path) override;
     void scanDecided(const OBScanDecision& decision) override;
+    void linkFollowed(const std::string& path, const std::string& target) override;
     void objectMade(const std::string& path, const OBMediaObjectRef& object) override;
 
     /// A library, as often as it was searched.

@@ -69,13 +69,20 @@ OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform:
 
 OBScanDecision ScanFindings::noProject(std::string_view path, std::string_view reason)
 {
-    return finding("project", path, std::string(reason) + "; it is taken for no project");
+    return finding("project", path, std::string(reason) + ", so it is taken for no project");
 }
 
-OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries)
+OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::size_t entries)
 {
     OBScanDecision decision = finding("movies folder", path, "it holds " + entriesText(entries));
-    decision.itself = "a folder of movies is shown as its " + std::string(shownAs);
+    decision.itself = "a folder of movies is shown as its project";
+    return decision;
+}
+
+OBScanDecision ScanFindings::clipsFolder(std::string_view path, std::size_t entries)
+{
+    OBScanDecision decision = finding("clips folder", path, "it holds " + entriesText(entries));
+    decision.itself = "a folder of clips is shown as its event";
     return decision;
 }
 

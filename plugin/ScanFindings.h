@@ -21,7 +21,8 @@ OBScanDecision listedFolder(std::string_view path, const platform::FolderListing
 OBScanDecision noProject(std::string_view path, std::string_view reason);
 
 /// The folder in a project or event in which its movies lie held `entries` entries.
-OBScanDecision moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries);
+OBScanDecision moviesFolder(std::string_view path, std::size_t entries);
+OBScanDecision clipsFolder(std::string_view path, std::size_t entries);
 
 /// An event is left out, since its folder of clips, or what lies in it, gives none.
 OBScanDecision eventWithoutClipsFolder(std::string_view path, platform::FileProblem problem);

@@ -14,8 +14,6 @@ namespace {
 constexpr ScanFailure folderIsClosed { "its folder may be listed but not searched, so nothing is known of it",
     "permit searching its folder (chmod +x)" };
 
-constexpr ScanFailure leadsNowhere { "it is a symbolic link that leads nowhere", "let it lead to what is there" };
-
 std::string lowerCase(std::string_view text)
 {
     std::string lower(text);
@@ -31,11 +29,11 @@ ScanReason scanReason(
 {
     if (!rule.marker.empty())
         return reasonOfMarker(fileSystem, rule, path);
-    if (rule.asksKind) {
+    if (!rule.remedyOfDeadLink.empty()) {
         if (fileSystem.isOutOfReach(path))
             return folderIsClosed;
         if (item.kind == ItemKind::symbolicLink && !fileSystem.exists(path))
-            return leadsNowhere;
+            return { "it is a symbolic link that leads nowhere", rule.remedyOfDeadLink };
     }
     return rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
 }

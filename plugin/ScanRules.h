@@ -41,7 +41,8 @@ struct ScanRule {
     ScanFailure failure; ///< what is so when it does not
     ScanFailure inside {}; ///< of what is in an item that passes, and no further rule speaks of; empty for most
     std::string_view marker {}; ///< the entry that it looks for inside the item; empty for most rules
-    bool asksKind = false; ///< whether it takes only items of some kind
+    /// What to do about a link that leads nowhere, where it takes only items of some kind; empty for most rules.
+    std::string_view remedyOfDeadLink {};
     /// What is so of this very item instead, where that depends on what kind of item it is; null for most rules.
     ScanReason (*failureOf)(const platform::FolderItem& item) = nullptr;
 };
@@ -79,7 +80,7 @@ inline constexpr ScanRule isEventFolder { .name = "folder",
     .passes = [](const platform::FolderItem& item) { return item.flags.container; },
     .passed = "it is a folder",
     .failure = { "it is no folder", "put it into the folder \"Original Media\" of an event" },
-    .asksKind = true,
+    .remedyOfDeadLink = "put an event in its place",
     .failureOf = [](const platform::FolderItem& item) -> ScanReason {
         if (item.kind == platform::ItemKind::symbolicLink)
             return { "it is a symbolic link, and no link is taken for an event", "put what it leads to in its place" };
@@ -133,7 +134,7 @@ inline constexpr ScanRule isContainer { .name = "folder",
     .passes = [](const platform::FolderItem& item) { return item.flags.container; },
     .passed = "it is a folder",
     .failure = { "it is neither a project nor a folder", {} },
-    .asksKind = true,
+    .remedyOfDeadLink = "let it lead to a project",
     .failureOf = [](const platform::FolderItem& item) -> ScanReason {
         if (item.kind == platform::ItemKind::symbolicLink)
             return { "it is a symbolic link that leads to no project, and no other link is followed in a library",

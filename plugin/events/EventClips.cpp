@@ -116,7 +116,7 @@ EventClips OBMontaroPlugin::ClipReader::read()
 {
     if (!_result.hasEntries)
         return std::move(_result);
-    _scan.report.found([&] { return ScanFindings::moviesFolder(_result.folder, "event", _listing.size()); });
+    _scan.report.found([&] { return ScanFindings::clipsFolder(_result.folder, _listing.size()); });
     _realFolder = realFolder();
     _plainClips.reserve(_listing.size());
     std::string path(_realFolder);

@@ -44,7 +44,7 @@ struct SharedMovies {
     template <class Items> void take(const ScanReport& report, const Items& items)
     {
         if (items.size() != 0)
-            report.found([&] { return ScanFindings::moviesFolder(folder.path, "project", items.size()); });
+            report.found([&] { return ScanFindings::moviesFolder(folder.path, items.size()); });
         files.reserve(items.size());
         for (std::size_t index = 0; index < items.size(); ++index) {
             const platform::FolderItem item = items[index];

@@ -31,13 +31,13 @@ OBScanDecision finding(std::string_view rule, std::string_view path, std::string
     return decision;
 }
 
-std::string remedyOfProblem(FileProblem problem, std::string_view path)
+std::string remedyOfProblem(FileProblem problem, std::string_view folder)
 {
     switch (problem) {
     case FileProblem::notPermitted:
-        return "allow reading it: chmod u+rx '" + std::string(path) + "'";
+        return "permit reading " + std::string(folder) + " (chmod u+rx)";
     case FileProblem::pathTooLong:
-        return "move it to a place with a shorter path";
+        return "move " + std::string(folder) + " to a place with a shorter path";
     default:
         return {};
     }
@@ -63,13 +63,13 @@ OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform:
     const std::string problem(platform::textOfFileProblem(listing.problem()));
     OBScanDecision decision = finding("listing", path, "what it holds is not listed: " + problem);
     decision.inside = "the folder that holds it cannot be listed: " + problem;
-    decision.insideRemedy = remedyOfProblem(listing.problem(), path);
+    decision.insideRemedy = remedyOfProblem(listing.problem(), "the folder that holds it");
     return decision;
 }
 
 OBScanDecision ScanFindings::noProject(std::string_view path, std::string_view reason)
 {
-    return finding("project", path, std::string(reason) + ", so it is taken for no project");
+    return finding("project", path, std::string(reason) + "; it is taken for no project");
 }
 
 OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::size_t entries)
@@ -97,7 +97,7 @@ OBScanDecision ScanFindings::eventWithoutClipsFolder(std::string_view path, File
     decision.passed = false;
     decision.remedy = problem == FileProblem::none || isMissing
         ? "put its clips into a folder \"Original Media\""
-        : remedyOfProblem(problem, std::string(path) + "/Original Media");
+        : remedyOfProblem(problem, "its folder \"Original Media\"");
     return decision;
 }
 

@@ -81,7 +81,8 @@ def fault_of(answer, path, groups, objects, can_load):
         return "another path"
     if answer["listed"] is not bool(groups or objects) or answer["groups"] != groups or answer["objects"] != objects:
         return f"expected groups {groups} and objects {objects}"
-    return fault_of_steps(answer["steps"], answer["listed"]) or fault_of_remedy(answer, can_load)
+    return (fault_of_steps(answer["steps"], answer["listed"]) or fault_of_way(answer, can_load)
+            or fault_of_remedy(answer))
 
 
 def fault_of_steps(steps, listed):
@@ -97,10 +98,23 @@ def fault_of_steps(steps, listed):
     return None
 
 
-def fault_of_remedy(answer, can_load):
+def fault_of_way(answer, can_load):
+    """A way begins at a search folder; where nothing is listed, it leads down to the path and never aside."""
+    rules = [step["rule"] for step in answer["steps"]]
+    if not can_load:
+        return None if rules == ["editor"] else "not the missing editor alone"
+    if rules[0] != "search folder":
+        return "it does not begin at a search folder"
+    aside = [step["path"] for step in answer["steps"] if not is_above(step["path"], answer["path"])]
+    return f"a step aside {aside}" if aside and not answer["listed"] else None
+
+
+def is_above(folder, path):
+    return path == folder or path.startswith(folder.rstrip("/") + "/")
+
+
+def fault_of_remedy(answer):
     remedy = answer["remedy"]
     if remedy is not None and (answer["listed"] or not isinstance(remedy, str) or not remedy):
         return f"remedy {remedy!r}"
-    if not can_load and [step["rule"] for step in answer["steps"]] != ["editor"]:
-        return "not the missing editor alone"
     return None

@@ -41,6 +41,12 @@ public:
         if (_observer)
             _observer->scanDecided(finding());
     }
+    /// Likewise, of an entry that became a record; `path` answers its path.
+    template <class Path, class Finding> void foundRecord(const Path& path, const Finding& finding) const
+    {
+        if (_observer && _observer->wantsRecordExplained(path()))
+            _observer->scanDecided(finding());
+    }
     /// Likewise, of something that keeps the path out.
     template <class Finding> void keptOut(const Finding& finding) const
     {

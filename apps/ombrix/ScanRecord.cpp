@@ -58,6 +58,12 @@ void ScanRecord::keepForLater(const OBScanDecision& decision)
     _recent.push_back(decision);
 }
 
+bool ScanRecord::wantsRecordExplained(const std::string& path) const
+{
+    platform::Locked guard(_lock);
+    return isOfInterest(path);
+}
+
 void ScanRecord::linkFollowed(const std::string& path, const std::string& target)
 {
     platform::Locked guard(_lock);

@@ -178,10 +178,11 @@ void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
     else
         _plainClips.push_back({ file.entry, file.isPlainFile });
     const ClipYear year = yearOf(file, recorded);
-    _scan.report.found([&] {
+    const auto path = [&] { return entryPath(file.entry); };
+    _scan.report.foundRecord(path, [&] {
         const platform::Calendar& calendar = _plugin.platform().calendar;
         const std::string date = year.date ? calendar.textOfDate(*year.date, dateFormat) : std::string();
-        return ScanFindings::yearOfClip(entryPath(file.entry), year.year, date, year.isRecorded);
+        return ScanFindings::yearOfClip(path(), year.year, date, year.isRecorded);
     });
 }
 

@@ -25,6 +25,18 @@ public:
     /// twice.
     virtual void libraryBegan(const std::string& path) { (void)path; }
     virtual void scanDecided(const OBScanDecision& decision) = 0;
+    /// Whether the last word on an entry that became a record is wanted, which takes a while to put into words.
+    virtual bool wantsRecordExplained(const std::string& path) const
+    {
+        (void)path;
+        return true;
+    }
+    /// By way of a link, the entry at `path` stands for what lies at `target`. Told before what is decided of that.
+    virtual void linkFollowed(const std::string& path, const std::string& target)
+    {
+        (void)path;
+        (void)target;
+    }
     /// The entry at `path` became a record of another path, by way of a link.
     virtual void objectMade(const std::string& path, const OBMediaObjectRef& object)
     {

@@ -311,6 +311,12 @@ public:
 
     /// Whether anything exists at `path`, links followed.
     bool exists(std::string_view path) const { return status(path).has_value(); }
+
+    /// Whether a folder on the way to `path` may not be searched, so that nothing is known of what stands there.
+    bool isOutOfReach(std::string_view path) const
+    {
+        return !linkStatus(path) && openPlainFile(path).problem == FileProblem::notPermitted;
+    }
 };
 
 inline void FolderListing::Entry::take(const FolderItem& item)

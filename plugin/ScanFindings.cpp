@@ -1,6 +1,7 @@
 #include "plugin/ScanFindings.h"
 
 #include "platform/FileProblemText.h"
+#include "platform/PathText.h"
 
 #include <string>
 
@@ -30,13 +31,13 @@ OBScanDecision finding(std::string_view rule, std::string_view path, std::string
     return decision;
 }
 
-std::string remedyOfProblem(FileProblem problem, std::string_view path)
+std::string remedyOfProblem(FileProblem problem, std::string_view folder)
 {
     switch (problem) {
     case FileProblem::notPermitted:
-        return "allow reading it: chmod u+rx '" + std::string(path) + "'";
+        return "permit reading " + std::string(folder) + " (chmod u+rx)";
     case FileProblem::pathTooLong:
-        return "move it to a place with a shorter path";
+        return "move " + std::string(folder) + " to a place with a shorter path";
     default:
         return {};
     }
@@ -45,11 +46,13 @@ std::string remedyOfProblem(FileProblem problem, std::string_view path)
 } // namespace
 
 OBScanDecision ScanFindings::searchedLibrary(
-    std::string_view path, std::string_view what, std::size_t index, std::size_t count)
+    std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome)
 {
+    const std::string_view volume = platform::pathByRemovingLastComponent(path) == "/" ? "boot volume" : "volume";
     OBScanDecision decision = finding("search folder", path,
-        ordinal(index + 1) + " of " + std::to_string(count) + " that are searched for " + std::string(what));
-    decision.itself = "a library shows what it holds, not itself";
+        std::string(isInHome ? "home folder" : volume) + ", " + ordinal(index + 1) + " of " + std::to_string(count)
+            + " for " + std::string(what));
+    decision.itself = "a search folder shows what it holds, not itself";
     return decision;
 }
 
@@ -60,19 +63,26 @@ OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform:
     const std::string problem(platform::textOfFileProblem(listing.problem()));
     OBScanDecision decision = finding("listing", path, "what it holds is not listed: " + problem);
     decision.inside = "the folder that holds it cannot be listed: " + problem;
-    decision.insideRemedy = remedyOfProblem(listing.problem(), path);
+    decision.insideRemedy = remedyOfProblem(listing.problem(), "the folder that holds it");
     return decision;
 }
 
-OBScanDecision ScanFindings::noProject(std::string_view path)
+OBScanDecision ScanFindings::noProject(std::string_view path, std::string_view reason)
 {
-    return finding("project", path, "it holds no CurrentVersion.mtrproject, so it is no project");
+    return finding("project", path, std::string(reason) + "; it is taken for no project");
 }
 
-OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries)
+OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::size_t entries)
 {
     OBScanDecision decision = finding("movies folder", path, "it holds " + entriesText(entries));
-    decision.itself = "a folder of movies is shown as its " + std::string(shownAs);
+    decision.itself = "a folder of movies is shown as its project";
+    return decision;
+}
+
+OBScanDecision ScanFindings::clipsFolder(std::string_view path, std::size_t entries)
+{
+    OBScanDecision decision = finding("clips folder", path, "it holds " + entriesText(entries));
+    decision.itself = "a folder of clips is shown as its event";
     return decision;
 }
 
@@ -87,7 +97,7 @@ OBScanDecision ScanFindings::eventWithoutClipsFolder(std::string_view path, File
     decision.passed = false;
     decision.remedy = problem == FileProblem::none || isMissing
         ? "put its clips into a folder \"Original Media\""
-        : remedyOfProblem(problem, std::string(path) + "/Original Media");
+        : remedyOfProblem(problem, "its folder \"Original Media\"");
     return decision;
 }
 
@@ -99,15 +109,16 @@ OBScanDecision ScanFindings::eventWithoutClips(std::string_view path)
     return decision;
 }
 
-OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target)
+OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target, bool exists)
 {
-    return finding("link", path, "it leads to " + std::string(target));
+    return finding("link", path, "it leads to " + std::string(target) + (exists ? "" : ", where nothing is"));
 }
 
-OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year)
+OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded)
 {
-    OBScanDecision decision = finding("year", path,
-        year < 0 ? std::string("it has no date, so its year is -1") : "it was made in " + std::to_string(year));
-    decision.inside = "a clip is not looked into";
-    return decision;
+    const std::string_view origin = isRecorded ? ", when it was recorded" : ", the earlier of birth and modification";
+    return finding("year", path,
+        std::to_string(year) + ": "
+            + (date.empty() ? std::string("it has no date")
+                            : (isRecorded ? "" : "file date ") + std::string(date) + std::string(origin)));
 }

@@ -9,26 +9,30 @@
 /// What a scan finds at a path beyond the rules for single items, in the words of an explanation.
 namespace ScanFindings {
 
-/// A library is searched; it is one of `count` for `what` ("projects" or "events").
-OBScanDecision searchedLibrary(std::string_view path, std::string_view what, std::size_t index, std::size_t count);
+/// A library is searched; it is one of `count` for `what` ("projects" or "events"), and the home folder's when
+/// `isInHome`.
+OBScanDecision searchedLibrary(
+    std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome);
 
 /// A folder was listed, or could not be.
 OBScanDecision listedFolder(std::string_view path, const platform::FolderListing& listing);
 
-/// An item without a project's marker is looked at further: it may be an ordinary folder.
-OBScanDecision noProject(std::string_view path);
+/// An item is no project, for a reason of its marker, and is looked at further: it may be an ordinary folder.
+OBScanDecision noProject(std::string_view path, std::string_view reason);
 
 /// The folder in a project or event in which its movies lie held `entries` entries.
-OBScanDecision moviesFolder(std::string_view path, std::string_view shownAs, std::size_t entries);
+OBScanDecision moviesFolder(std::string_view path, std::size_t entries);
+OBScanDecision clipsFolder(std::string_view path, std::size_t entries);
 
 /// An event is left out, since its folder of clips, or what lies in it, gives none.
 OBScanDecision eventWithoutClipsFolder(std::string_view path, platform::FileProblem problem);
 OBScanDecision eventWithoutClips(std::string_view path);
 
-/// A link leads to the file that becomes the clip.
-OBScanDecision linkedClip(std::string_view path, std::string_view target);
+/// A link leads to what becomes the clip, whether or not anything is there.
+OBScanDecision linkedClip(std::string_view path, std::string_view target, bool exists);
 
-/// A clip counts to a year; -1 when it has no date.
-OBScanDecision yearOfClip(std::string_view path, int year);
+/// A clip counts to a year, by `date` as people write it: that of its recording, or of its file. Without one the year
+/// is -1.
+OBScanDecision yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded);
 
 } // namespace ScanFindings

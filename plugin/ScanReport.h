@@ -1,5 +1,6 @@
 #pragma once
 
+#include "plugin/ScanReason.h"
 #include "plugin/ScanRules.h"
 
 #include "host/OBMediaManager.h"
@@ -40,6 +41,12 @@ public:
         if (_observer)
             _observer->scanDecided(finding());
     }
+    /// Likewise, of an entry that became a record; `path` answers its path.
+    template <class Path, class Finding> void foundRecord(const Path& path, const Finding& finding) const
+    {
+        if (_observer && _observer->wantsRecordExplained(path()))
+            _observer->scanDecided(finding());
+    }
     /// Likewise, of something that keeps the path out.
     template <class Finding> void keptOut(const Finding& finding) const
     {
@@ -52,6 +59,12 @@ public:
         if (_observer)
             _observer->libraryBegan(std::string(path));
     }
+    /// `entry` answers the path of the link, or below one, that leads to `target`; called only where somebody listens.
+    template <class Entry> void linkFollowed(const Entry& entry, std::string_view target) const
+    {
+        if (_observer)
+            _observer->linkFollowed(entry(), std::string(target));
+    }
     void objectMade(const std::string& path, const OBMediaObjectRef& object) const
     {
         if (_observer)
@@ -62,29 +75,16 @@ private:
     void tell(const ScanRule& rule, bool passed, const platform::FolderItem& item, std::string_view folder) const
     {
         std::string path = platform::pathJoined(folder, item.name);
-        const ScanFailure told = passed ? ScanFailure { rule.passed, {} } : failureOf(rule, item, path);
+        const ScanReason reason
+            = passed ? ScanReason(rule.passed, {}) : scanReason(_manager.platform().fileSystem, rule, item, path);
         _observer->scanDecided({ .rule = rule.name,
             .path = std::move(path),
             .passed = passed,
-            .text = std::string(told.text),
-            .remedy = std::string(told.remedy),
+            .text = reason.text,
+            .remedy = reason.remedy,
             .itself = {},
-            .inside = std::string(rule.inside),
-            .insideRemedy = {} });
-    }
-
-    ScanFailure failureOf(const ScanRule& rule, const platform::FolderItem& item, const std::string& path) const
-    {
-        if (!rule.failureOf)
-            return { rule.failed, rule.remedy };
-        return isInClosedFolder(path) ? ScanRules::folderIsClosed : rule.failureOf(item);
-    }
-
-    bool isInClosedFolder(const std::string& path) const
-    {
-        const platform::FileSystem& fileSystem = _manager.platform().fileSystem;
-        return !fileSystem.linkStatus(path)
-            && fileSystem.openPlainFile(path).problem == platform::FileProblem::notPermitted;
+            .inside = std::string(rule.inside.text),
+            .insideRemedy = std::string(rule.inside.remedy) });
     }
 
     OBMediaManager& _manager;

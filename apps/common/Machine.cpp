@@ -5,6 +5,7 @@
 #include "platform/described/DescribedPlatform.h"
 #include "platform/linux/LinuxPlatform.h"
 
+#include <chrono>
 #include <functional>
 #include <string>
 #include <utility>

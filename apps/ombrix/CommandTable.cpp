@@ -68,7 +68,7 @@ namespace {
     };
 
     constexpr OptionInfo explainOptions[] {
-        { "-0", "", "", "read paths from standard input, each ended by a zero byte: -0 -" },
+        { "-0", "", "", "read paths ended by zero bytes from standard input" },
         { "--json", "", "", "print one JSON document a path, one a line" },
     };
     constexpr Example explainExamples[] {
@@ -119,7 +119,8 @@ namespace {
             "Prints what is known of the source without loading its tree.", infoOptions, true, infoExamples, runInfo },
         { "explain", Intent::ask, "PATH...", anyNumber, "say why files and folders are or are not in the tree",
             "Loads once and prints, for each path, every rule that it met on its way, the\n"
-            "verdict, and what would make it appear. The path need not exist.",
+            "verdict, and what would make it appear. The path need not exist. With \"-0 -\" the\n"
+            "paths come from standard input.",
             explainOptions, true, explainExamples, runExplain },
         { "message", Intent::ask, "", 0, "say what an empty group tells the user",
             "Loads once and prints the text that is shown for the group while it is empty;\n"

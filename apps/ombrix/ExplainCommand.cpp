@@ -1,20 +1,16 @@
 // "explain": one load whose scan is listened to, then one answer a path. Where the editor is missing there is no scan,
 // and that alone is the answer.
 
-#include "apps/common/DisplayWidth.h"
 #include "apps/common/RecordJson.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Explanation.h"
+#include "apps/ombrix/ExplanationText.h"
 #include "apps/ombrix/Program.h"
-#include "apps/ombrix/TextLine.h"
-#include "host/OBConstants.h"
 #include "host/OBSourceInspection.h"
 #include "platform/PathText.h"
 
-#include <algorithm>
 #include <filesystem>
 #include <iostream>
-#include <iterator>
 #include <optional>
 
 namespace ombrix {
@@ -68,118 +64,35 @@ namespace {
             { "remedy", explanation.remedy.empty() ? Value() : Value(std::string_view(explanation.remedy)) } };
     }
 
-    std::string_view kindOfGroup(const OBMediaGroup& group)
-    {
-        const OBTypeIdentifierRef type = group.typeIdentifier();
-        if (type == OBMontaroEventGroupTypeIdentifier)
-            return "event";
-        if (type == OBMontaroProjectGroupTypeIdentifier)
-            return "project";
-        return type == OBMontaroFolderGroupTypeIdentifier ? "folder" : "group";
-    }
-
-    /// The place that says most of it: the innermost.
-    const TreePlace& mainPlace(const Explanation& explanation)
-    {
-        return *std::max_element(explanation.places.begin(), explanation.places.end(),
-            [](const TreePlace& left, const TreePlace& right) { return left.names.size() < right.names.size(); });
-    }
-
-    std::string verdict(const TreePlace& place)
-    {
-        const std::string group = std::string(kindOfGroup(*place.group)) + " " + place.group->name().string();
-        if (!place.object)
-            return group;
-        const bool isClip = place.group->typeIdentifier() == OBMontaroEventGroupTypeIdentifier;
-        return (isClip ? "clip \"" : "movie \"") + place.object->name().string() + "\" of the " + group;
-    }
-
-    std::string breadcrumbs(const TreePlace& place)
-    {
-        std::string text;
-        for (const platform::Text& name : place.names)
-            text += name.string() + " › ";
-        return text + place.group->name().string();
-    }
-
-    /// Paths by what tells them apart: the library as it is, everything else by what it is called in there.
-    class StepTable {
+    /// Prints one explanation after the other.
+    class Answers {
     public:
-        StepTable(Program& program, const Explanation& explanation)
+        Answers(Program& program, std::size_t count)
             : _program(program)
-            , _explanation(explanation)
         {
-            for (const ExplainedStep& step : explanation.steps)
-                _ruleWidth = std::max(_ruleWidth, apps::displayWidth(program.style().name(step.rule)));
+            const platform::FileSystem& fileSystem = program.session()->platform().fileSystem;
+            _wishes.namesPath = count > 1;
+            _wishes.home = fileSystem.homeFolder();
+            _wishes.linkTarget = [&fileSystem](std::string_view path) { return fileSystem.resolvedPath(path); };
         }
 
-        void print() const
+        void print(const Explanation& explanation)
         {
-            for (std::size_t index = 0; index < _explanation.steps.size(); ++index)
-                printStep(index);
+            if (_program.wantsJson()) {
+                apps::printValue(_program.output(), jsonOf(explanation));
+                return;
+            }
+            if (!_isFirst)
+                _program.printLine("");
+            _isFirst = false;
+            printExplanation(_program, explanation, _wishes);
         }
 
     private:
-        static constexpr int numberWidth = 3;
-        static constexpr int verdictColumn = numberWidth + 1;
-        static constexpr int ruleColumn = verdictColumn + 5;
-
-        void printStep(std::size_t index) const
-        {
-            const apps::Style& style = _program.style();
-            const ExplainedStep& step = _explanation.steps[index];
-            const bool decides = index + 1 == _explanation.steps.size() && !step.passed;
-            TextLine line(style, std::nullopt); // a reason is never cut
-            line.add(0, apps::paddedBefore(std::to_string(index + 1), numberWidth));
-            line.add(verdictColumn, step.passed ? "ok" : "NO",
-                step.passed ? TextLine::Look::plain : TextLine::Look::warning);
-            line.add(ruleColumn, style.name(step.rule));
-            const std::string place = index == 0 || step.path != _explanation.steps[index - 1].path
-                ? style.name(shortPath(step.path)) + ": "
-                : std::string();
-            line.add(ruleColumn + _ruleWidth + 3, place + style.name(step.text) + (decides ? "   ← decides" : ""),
-                TextLine::Look::plain);
-            _program.printLine(line.text());
-        }
-
-        std::string shortPath(const std::string& path) const
-        {
-            const std::string& first = _explanation.steps.front().path;
-            const std::string_view below = platform::pathRelativeTo(path, first);
-            return below.empty() ? path : std::string(below);
-        }
-
         Program& _program;
-        const Explanation& _explanation;
-        int _ruleWidth = 0;
+        ExplanationTextWishes _wishes {};
+        bool _isFirst = true;
     };
-
-    void printText(Program& program, const Explanation& explanation)
-    {
-        const apps::Style& style = program.style();
-        if (explanation.isListed()) {
-            const TreePlace& place = mainPlace(explanation);
-            program.printLine(style.bold("listed") + "   " + style.plain(style.name(verdict(place))));
-            program.printLine("         " + style.dim(style.name(breadcrumbs(place))));
-        } else {
-            program.printLine(
-                style.bold("not listed") + "   " + style.plain(style.name(explanation.steps.back().text)));
-        }
-        StepTable(program, explanation).print();
-        if (!explanation.remedy.empty())
-            program.printLine("to list it   " + style.plain(style.name(explanation.remedy)));
-    }
-
-    void print(Program& program, const Explanation& explanation, bool isFirst)
-    {
-        if (program.wantsJson()) {
-            apps::printValue(program.output(), jsonOf(explanation));
-            return;
-        }
-        if (!isFirst)
-            program.printLine("");
-        printText(program, explanation);
-    }
 
     Explanation withoutEditor(const std::string& path)
     {
@@ -219,8 +132,9 @@ namespace {
         const std::shared_ptr<OBMediaManager> manager = program.manager();
         const Paths folders = searchedFolders(*manager);
         const Explainer explainer(manager->platform().fileSystem, folders, *record, places);
-        for (std::size_t index = 0; index < paths.size(); ++index)
-            print(program, explainer.explain(paths[index]), index == 0);
+        Answers answers(program, paths.size());
+        for (const std::string& path : paths)
+            answers.print(explainer.explain(path));
         return done;
     }
 
@@ -248,8 +162,9 @@ int runExplain(Program& program)
         return failed;
     if (manager->canLoadData())
         return explainLoaded(program, paths);
-    for (std::size_t index = 0; index < paths.size(); ++index)
-        print(program, withoutEditor(paths[index]), index == 0);
+    Answers answers(program, paths.size());
+    for (const std::string& path : paths)
+        answers.print(withoutEditor(path));
     return done;
 }
 

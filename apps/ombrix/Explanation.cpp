@@ -1,3 +1,8 @@
+// The way to a path, told by what the scan decided of it and of the folders that it lies in.
+//
+// The one surprise: whether a path is listed is asked of the tree alone; the decisions only say why. Where no library
+// lists it at the place where it lies, a link leads to it, and the way is the link's.
+
 #include "apps/ombrix/Explanation.h"
 
 #include "platform/PathText.h"
@@ -20,6 +25,12 @@ namespace {
         return platform::pathJoined(folder, below.substr(0, below.find('/')));
     }
 
+    bool bearsNameOf(const std::string& path, const std::string& folder)
+    {
+        const std::string name = "/" + std::string(platform::lastPathComponent(folder)) + "/";
+        return (path + "/").find(name) != std::string::npos;
+    }
+
 } // namespace
 
 /// The steps from a library to a path, and whether they end in a record.
@@ -36,93 +47,164 @@ struct Explainer::Way {
     }
 };
 
+Explainer::Explainer(const platform::FileSystem& fileSystem, const std::vector<std::string>& folders,
+    const ScanRecord& record, const TreePlaces& places)
+    : _fileSystem(fileSystem)
+    , _folders(folders)
+    , _record(record)
+    , _places(places)
+{
+    for (const ScanRecord::Library& library : record.libraries()) {
+        DecisionIndex& index = _decisions.emplace_back();
+        for (std::size_t number = 0; number < library.decisions.size(); ++number)
+            index[library.decisions[number].path].push_back(number);
+    }
+    for (const ScanRecord::Made& made : record.objectsMade()) {
+        _madeByEntry[made.entry].push_back(&made);
+        _madeByTarget.emplace(made.object->path().string(), &made);
+    }
+}
+
 Explanation Explainer::explain(const std::string& path) const
 {
     Explanation explanation { path };
-    explanation.places = _places.withPath(path);
-    for (const ScanRecord::Made& made : _record.objectsMade()) {
-        if (made.entry != path || made.object->path() == std::string_view(path))
-            continue;
-        const std::vector<TreePlace>& places = _places.ofObject(made.object.get());
-        explanation.places.insert(explanation.places.end(), places.begin(), places.end());
-    }
+    explanation.places = placesOf(path);
     Way way = chosenWay(explanation);
     explanation.steps = std::move(way.steps);
     explanation.remedy = std::move(way.remedy);
     return explanation;
 }
 
+/// Those with that very path, and those that were made from it by way of a link; in the order of the tree.
+std::vector<TreePlace> Explainer::placesOf(const std::string& path) const
+{
+    std::vector<TreePlace> found = _places.withPath(path);
+    const auto made = _madeByEntry.find(path);
+    if (made == _madeByEntry.end())
+        return found;
+    for (const ScanRecord::Made* each : made->second) {
+        if (each->object->path() == std::string_view(path))
+            continue;
+        const std::vector<TreePlace>& places = _places.ofObject(each->object.get());
+        found.insert(found.end(), places.begin(), places.end());
+    }
+    std::sort(found.begin(), found.end(),
+        [](const TreePlace& left, const TreePlace& right) { return left.order < right.order; });
+    return found;
+}
+
 /// The way through the first library that lists the path, else through the first that meets it.
 Explainer::Way Explainer::chosenWay(const Explanation& explanation) const
 {
     std::vector<Way> ways;
-    for (const ScanRecord::Library& library : _record.libraries()) {
-        if (!platform::isSameOrBelow(explanation.path, library.path))
+    for (std::size_t library = 0; library < _decisions.size(); ++library) {
+        if (!platform::isSameOrBelow(explanation.path, _record.libraries()[library].path))
             continue;
         Way way = wayThrough(library, explanation.path, explanation.isListed());
         if (way.passes)
             return way;
         ways.push_back(std::move(way));
     }
-    if (explanation.isListed()) {
-        // No library lists it where it lies, so a link in one leads to it.
-        Way way;
-        if (const ScanRecord::Made* made = entryOf(explanation.path)) {
-            for (const ScanRecord::Library& library : _record.libraries()) {
-                if (platform::isSameOrBelow(made->entry, library.path) && !way.passes)
-                    way = wayThrough(library, made->entry, true);
-            }
-        }
-        way.steps.push_back({ "record", explanation.path, true, "the tree shows it by this path" });
-        way.remedy.clear();
-        return way;
-    }
+    if (explanation.isListed())
+        return wayByLink(explanation.path);
     return ways.empty() ? wayOutside(explanation.path) : std::move(ways.front());
 }
 
-Explainer::Way Explainer::wayThrough(const ScanRecord::Library& library, const std::string& path, bool isListed) const
+/// The way of the link that leads to a path which no library lists where it lies.
+Explainer::Way Explainer::wayByLink(const std::string& path) const
 {
     Way way;
-    way.passes = true;
-    std::vector<const OBScanDecision*> met;
-    for (const OBScanDecision& decision : library.decisions) {
-        if (!platform::isSameOrBelow(path, decision.path))
-            continue;
-        met.push_back(&decision);
-        way.steps.push_back(stepOf(decision));
-        if (!decision.passed) {
-            way.passes = false;
-            way.remedy = decision.remedy;
+    if (const ScanRecord::Made* made = madeInto(path)) {
+        for (std::size_t library = 0; library < _decisions.size() && !way.passes; ++library) {
+            if (platform::isSameOrBelow(made->entry, _record.libraries()[library].path))
+                way = wayThrough(library, made->entry, true);
+        }
+    }
+    way.steps.push_back({ "real path", path, true, "the tree shows it by this path" });
+    way.remedy.clear();
+    return way;
+}
+
+Explainer::Way Explainer::wayThrough(std::size_t library, const std::string& path, bool isListed) const
+{
+    const Decisions met = decisionsOnWay(library, path);
+    if (isListed)
+        return wayToRecord(met, path);
+    Way way;
+    for (const OBScanDecision* decision : met) {
+        way.steps.push_back(stepOf(*decision));
+        if (!decision->passed) {
+            way.remedy = decision->remedy;
             return way;
         }
     }
     if (met.empty())
-        way.end("search folder", library.path, "the scan was stopped before it came here", "load again");
-    else if (met.back()->path != path)
-        endBelow(way, met, path);
-    else if (!isListed)
-        way.end("record", path,
-            met.back()->itself.empty() ? "it is no group and no movie of its own" : met.back()->itself, {});
+        way.end("search folder", _record.libraries()[library].path, "the scan was stopped before it came here",
+            "load again");
+    else
+        endAt(way, met, path);
     return way;
 }
 
-/// Ends a way at a path of which no rule speaks, below one that passed.
-void Explainer::endBelow(Way& way, const std::vector<const OBScanDecision*>& decisions, const std::string& path) const
+/// A folder that is kept out by itself may be listed all the same in the place of another, so what was decided last
+/// counts.
+Explainer::Way Explainer::wayToRecord(const Decisions& met, const std::string& path) const
 {
-    const std::string& folder = decisions.back()->path;
+    Way way;
+    way.passes = !met.empty() && met.back()->passed
+        && std::any_of(met.begin(), met.end(), [&](const OBScanDecision* decision) { return decision->path == path; });
+    for (const OBScanDecision* decision : met) {
+        if (decision->passed)
+            way.steps.push_back(stepOf(*decision));
+    }
+    return way;
+}
+
+/// Ends a way on which every rule passed, and which leads to no record.
+void Explainer::endAt(Way& way, const Decisions& met, const std::string& path) const
+{
+    const std::string* itself = nullptr;
+    const OBScanDecision* unlisted = nullptr;
+    bool wasReached = false;
+    for (const OBScanDecision* decision : met) {
+        if (decision->path != path)
+            continue;
+        wasReached = true;
+        if (!decision->itself.empty())
+            itself = &decision->itself;
+        if (!decision->inside.empty() && decision->rule == "listing")
+            unlisted = decision;
+    }
+    if (!wasReached)
+        endBelow(way, met, path);
+    else if (unlisted && !_fileSystem.linkStatus(path) && !_fileSystem.isOutOfReach(path))
+        way.end("existence", path, "nothing is there", {});
+    else
+        way.end("record", path, itself ? *itself : "it is no group and no movie of its own", {});
+}
+
+/// Ends a way at a path of which no rule speaks, below one that passed.
+void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path) const
+{
+    std::string_view folder;
+    for (const OBScanDecision* decision : met) {
+        if (decision->path.size() > folder.size())
+            folder = decision->path;
+    }
     const OBScanDecision* inside = nullptr;
-    for (const OBScanDecision* decision : decisions) {
+    for (const OBScanDecision* decision : met) {
         if (decision->path == folder && !decision->inside.empty())
             inside = decision;
     }
+    const std::string missing = firstMissing(folder, path);
     const std::string next = firstBelow(folder, path);
-    const bool cannotBeListed = inside && inside->rule == "listing";
-    if (cannotBeListed) {
+    if (inside && inside->rule == "listing")
         way.end("listing", next, inside->inside, inside->insideRemedy);
-        return;
-    }
-    if (std::string missing = firstMissing(folder, path); !missing.empty())
-        way.end("existence", std::move(missing), "nothing is there", {});
+    else if (!missing.empty() && _fileSystem.isOutOfReach(missing))
+        way.end("existence", missing, "a folder that it lies in may not be searched, so nothing is known of it",
+            "permit searching its folder (chmod +x)");
+    else if (!missing.empty())
+        way.end("existence", missing, "nothing is there", {});
     else if (inside)
         way.end("place", next, inside->inside, inside->insideRemedy);
     else
@@ -141,16 +223,14 @@ Explainer::Way Explainer::wayOutside(const std::string& path) const
             return way;
         }
     }
-    const auto bearsName = [&](const std::string& folder) {
-        const std::string name = "/" + std::string(platform::lastPathComponent(folder));
-        return (path + "/").find(name + "/") != std::string::npos;
-    };
-    const auto nameless = std::find_if(_folders.begin(), _folders.end(), bearsName);
-    if (nameless != _folders.end())
+    const auto has = [&](auto&& isSo) { return std::any_of(_folders.begin(), _folders.end(), isSo); };
+    if (has([&](const std::string& folder) { return bearsNameOf(path, folder); }))
         way.end("search folder", path,
             "its volume or folder is not searched; folders of that name are searched in the home folder's Movies and "
             "at the top of local volumes and removable media",
             "move the library there, or mount its volume");
+    else if (has([&](const std::string& folder) { return platform::isSameOrBelow(folder, path); }))
+        way.end("search folder", path, "it holds folders that are searched, and is none itself", {});
     else
         way.end("search folder", path,
             "it lies in none of the " + std::to_string(_folders.size()) + " folders that are searched",
@@ -158,13 +238,31 @@ Explainer::Way Explainer::wayOutside(const std::string& path) const
     return way;
 }
 
-const ScanRecord::Made* Explainer::entryOf(const std::string& path) const
+/// What was decided of `path` and of the folders that it lies in, in the order in which it was decided.
+Explainer::Decisions Explainer::decisionsOnWay(std::size_t library, const std::string& path) const
 {
-    for (const ScanRecord::Made& made : _record.objectsMade()) {
-        if (made.object->path() == std::string_view(path))
-            return &made;
+    const DecisionIndex& index = _decisions[library];
+    const std::string& top = _record.libraries()[library].path;
+    std::vector<std::size_t> numbers;
+    for (std::string_view above = path; platform::isSameOrBelow(above, top);
+         above = platform::pathByRemovingLastComponent(above)) {
+        if (const auto found = index.find(above); found != index.end())
+            numbers.insert(numbers.end(), found->second.begin(), found->second.end());
+        if (above.size() <= 1)
+            break;
     }
-    return nullptr;
+    std::sort(numbers.begin(), numbers.end());
+    Decisions decisions;
+    for (const std::size_t number : numbers)
+        decisions.push_back(&_record.libraries()[library].decisions[number]);
+    return decisions;
+}
+
+/// The entry that became the record with this path; null when a path is a record by itself.
+const ScanRecord::Made* Explainer::madeInto(const std::string& path) const
+{
+    const auto found = _madeByTarget.find(path);
+    return found == _madeByTarget.end() ? nullptr : found->second;
 }
 
 /// The first thing on the way from `folder` to `path` that does not exist; empty when all do.

@@ -4,9 +4,10 @@
 #include "apps/ombrix/TreePlaces.h"
 #include "platform/FileSystem.h"
 
-#include <memory>
+#include <cstddef>
 #include <string>
 #include <string_view>
+#include <unordered_map>
 #include <vector>
 
 namespace ombrix {
@@ -34,29 +35,35 @@ class Explainer {
 public:
     /// All that is handed over outlives this object. `folders` are those that are searched.
     Explainer(const platform::FileSystem& fileSystem, const std::vector<std::string>& folders, const ScanRecord& record,
-        const TreePlaces& places)
-        : _fileSystem(fileSystem)
-        , _folders(folders)
-        , _record(record)
-        , _places(places)
-    {
-    }
+        const TreePlaces& places);
 
     Explanation explain(const std::string& path) const;
 
 private:
+    using Decisions = std::vector<const OBScanDecision*>;
+    /// What was decided in one library, by path: places in the library's list.
+    using DecisionIndex = std::unordered_map<std::string_view, std::vector<std::size_t>>;
     struct Way;
-    Way wayThrough(const ScanRecord::Library& library, const std::string& path, bool isListed) const;
-    void endBelow(Way& way, const std::vector<const OBScanDecision*>& decisions, const std::string& path) const;
-    Way wayOutside(const std::string& path) const;
+
+    std::vector<TreePlace> placesOf(const std::string& path) const;
     Way chosenWay(const Explanation& explanation) const;
-    const ScanRecord::Made* entryOf(const std::string& path) const;
+    Way wayByLink(const std::string& path) const;
+    Way wayThrough(std::size_t library, const std::string& path, bool isListed) const;
+    Way wayToRecord(const Decisions& met, const std::string& path) const;
+    void endAt(Way& way, const Decisions& met, const std::string& path) const;
+    void endBelow(Way& way, const Decisions& met, const std::string& path) const;
+    Way wayOutside(const std::string& path) const;
+    Decisions decisionsOnWay(std::size_t library, const std::string& path) const;
+    const ScanRecord::Made* madeInto(const std::string& path) const;
     std::string firstMissing(std::string_view folder, std::string_view path) const;
 
     const platform::FileSystem& _fileSystem;
     const std::vector<std::string>& _folders;
     const ScanRecord& _record;
     const TreePlaces& _places;
+    std::vector<DecisionIndex> _decisions {}; // one for each library of the record
+    std::unordered_map<std::string_view, std::vector<const ScanRecord::Made*>> _madeByEntry {};
+    std::unordered_map<std::string, const ScanRecord::Made*> _madeByTarget {}; // the first of each
 };
 
 } // namespace ombrix

@@ -3,6 +3,7 @@
 #include "platform/PathText.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace ombrix {
 namespace {
@@ -57,15 +58,24 @@ void ScanRecord::keepForLater(const OBScanDecision& decision)
     _recent.push_back(decision);
 }
 
+bool ScanRecord::wantsRecordExplained(const std::string& path) const
+{
+    platform::Locked guard(_lock);
+    return isOfInterest(path);
+}
+
+void ScanRecord::linkFollowed(const std::string& path, const std::string& target)
+{
+    platform::Locked guard(_lock);
+    if (!_libraries.empty() && !isOfInterest(path) && isOfInterest(target))
+        keepDecisionsOf(path);
+}
+
 void ScanRecord::objectMade(const std::string& path, const OBMediaObjectRef& object)
 {
-    const std::string target = object->path().string();
     platform::Locked guard(_lock);
-    if (!isOfInterest(path) && !isOfInterest(target))
-        return;
-    if (!isOfInterest(path) && !_libraries.empty())
-        keepDecisionsOf(path);
-    _made.push_back({ path, object });
+    if (isOfInterest(path))
+        _made.push_back({ path, object });
 }
 
 /// From now on what leads to `entry` is of interest, and what was decided of it already is kept.
@@ -78,11 +88,11 @@ void ScanRecord::keepDecisionsOf(const std::string& entry)
         kept.insert(kept.end(), earlier.begin(), earlier.end());
     }
     for (const OBScanDecision& decision : _recent) {
-        if (platform::isSameOrBelow(entry, decision.path))
+        if (platform::isSameOrBelow(entry, decision.path)) {
             kept.push_back(decision);
+            _paths.insert(decision.path);
+        }
     }
-    for (const OBScanDecision& decision : _recent)
-        _paths.insert(decision.path);
     _recent.clear();
     _paths.insert(entry);
 }

@@ -21,6 +21,8 @@ public:
 
     void libraryBegan(const std::string& path) override;
     void scanDecided(const OBScanDecision& decision) override;
+    bool wantsRecordExplained(const std::string& path) const override;
+    void linkFollowed(const std::string& path, const std::string& target) override;
     void objectMade(const std::string& path, const OBMediaObjectRef& object) override;
 
     /// A library, as often as it was searched.
@@ -43,7 +45,7 @@ private:
     void keepForLater(const OBScanDecision& decision) REQUIRES(_lock);
     void keepDecisionsOf(const std::string& entry) REQUIRES(_lock);
 
-    platform::Mutex _lock;
+    mutable platform::Mutex _lock;
     std::unordered_set<std::string> _paths GUARDED_BY(_lock); // those asked for, those that led to them, and all above
     // Decisions about paths that a link may yet make interesting: what lies directly in the library, and what led to
     // the path at hand.

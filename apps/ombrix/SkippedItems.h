@@ -14,6 +14,7 @@ namespace ombrix {
 class SkippedItems final : public OBScanObserver {
 public:
     void scanDecided(const OBScanDecision& decision) override;
+    bool wantsRecordExplained(const std::string&) const override { return false; }
 
     /// The decisions that kept something out, one a path, in the order in which they were taken.
     std::vector<OBScanDecision> decisions() const;

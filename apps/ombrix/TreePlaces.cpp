@@ -60,18 +60,21 @@ TreePlaces::TreePlaces(const OBMediaGroupRef& root, const std::unordered_set<std
     const std::unordered_set<const OBMediaObject*>& objects)
 {
     std::string path;
+    std::size_t order = 0;
     for (Walk walk(root); walk.current(); walk.advance()) {
         const OBMediaGroupRef& group = *walk.current();
         if (const platform::Text own = group->path(); own && paths.count(path = own.view()))
-            _byPath[path].push_back({ group, nullptr, walk.namesAbove() });
+            _byPath[path].push_back({ group, nullptr, walk.namesAbove(), order });
+        ++order;
         const OBMediaObjectList list = group->ownMediaObjects();
         std::size_t index = 0;
         list.visit([&](const OBMediaObject& object) {
             if (objects.count(&object))
-                _byObject[&object].push_back({ group, list[index], walk.namesAbove() });
+                _byObject[&object].push_back({ group, list[index], walk.namesAbove(), order });
             if (const platform::Text own = object.path(); own && paths.count(path = own.view()))
-                _byPath[path].push_back({ group, list[index], walk.namesAbove() });
+                _byPath[path].push_back({ group, list[index], walk.namesAbove(), order });
             ++index;
+            ++order;
             return true;
         });
     }

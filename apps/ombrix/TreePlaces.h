@@ -3,6 +3,7 @@
 #include "host/OBMediaGroup.h"
 #include "host/OBMediaObject.h"
 
+#include <cstddef>
 #include <string>
 #include <unordered_map>
 #include <unordered_set>
@@ -15,6 +16,7 @@ struct TreePlace {
     OBMediaGroupRef group; ///< the group, or the group on which the object was set
     OBMediaObjectRef object {}; ///< null for a group
     std::vector<platform::Text> names {}; ///< of the groups above, from the root down
+    std::size_t order = 0; ///< grows from each record of the tree to the next, depth first
 };
 
 /// The records of a tree that have one of some paths, or are one of some objects. Depth first: a group's own objects

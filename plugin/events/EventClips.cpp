@@ -24,6 +24,7 @@ namespace {
 
 constexpr int yearOfNoDate = -1;
 constexpr int latestRecordedYear = 9999;
+constexpr std::string_view dateFormat = "%-d %b %Y"; // for people who ask about a clip
 
 /// Names and flags of the entries, and what a clip's list and an event's year need of each file.
 constexpr platform::ListingRequest clipListing { .fileFacts = true };
@@ -67,6 +68,13 @@ struct FoundFile {
     bool isPlainFile = false;
 };
 
+/// The year that a clip counts to, and the date that gave it.
+struct ClipYear {
+    int year = yearOfNoDate;
+    std::optional<Date> date {};
+    bool isRecorded = false;
+};
+
 } // namespace
 
 /// Reads the folder of one event's clips, in listing order.
@@ -88,10 +96,9 @@ public:
 private:
     Text realFolder() const;
     std::string entryPath(std::string_view name) const { return platform::pathJoined(_result.folder, name); }
-    bool isClip(const FolderItem& item) const;
     void takeLink(const FolderItem& link);
     void take(const FoundFile& file);
-    int yearOf(const FoundFile& file, const std::optional<Date>& recorded);
+    ClipYear yearOf(const FoundFile& file, const std::optional<Date>& recorded);
     std::optional<Date> fileDate(const FoundFile& file) const;
     void addClip(std::string_view name, const FoundFile& file);
     void addPlainClips();
@@ -109,7 +116,7 @@ EventClips OBMontaroPlugin::ClipReader::read()
 {
     if (!_result.hasEntries)
         return std::move(_result);
-    _scan.report.found([&] { return ScanFindings::moviesFolder(_result.folder, "event", _listing.size()); });
+    _scan.report.found([&] { return ScanFindings::clipsFolder(_result.folder, _listing.size()); });
     _realFolder = realFolder();
     _plainClips.reserve(_listing.size());
     std::string path(_realFolder);
@@ -118,11 +125,15 @@ EventClips OBMontaroPlugin::ClipReader::read()
             continue;
         if (item.kind == ItemKind::symbolicLink) {
             takeLink(item);
-        } else if (isClip(item)) {
-            path.resize(_realFolder.size());
-            path.append(1, '/').append(item.name);
-            take({ item.name, path, item.facts, false, item.kind == ItemKind::file });
+            continue;
         }
+        path.resize(_realFolder.size());
+        path.append(1, '/').append(item.name);
+        if (_realFolder != _result.folder)
+            _scan.report.linkFollowed([&] { return entryPath(item.name); }, path);
+        if (_scan.report.passes(ScanRules::isVisible, item, _result.folder)
+            && _scan.report.passes(ScanRules::isNoFolder, item, _result.folder))
+            take({ item.name, path, item.facts, false, item.kind == ItemKind::file });
     }
     addPlainClips();
     return std::move(_result);
@@ -139,21 +150,18 @@ Text OBMontaroPlugin::ClipReader::realFolder() const
     return Text(std::string_view(path).substr(path == "/" ? 1 : 0));
 }
 
-bool OBMontaroPlugin::ClipReader::isClip(const FolderItem& item) const
-{
-    return _scan.report.passes(ScanRules::isVisible, item, _result.folder)
-        && _scan.report.passes(ScanRules::isNoFolder, item, _result.folder);
-}
-
 void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
 {
     const platform::FileSystem& files = _plugin.platform().fileSystem;
     const std::string path = files.resolvedPath(entryPath(link.name));
-    _scan.report.found([&] { return ScanFindings::linkedClip(entryPath(link.name), path); });
+    _scan.report.linkFollowed([&] { return entryPath(link.name); }, path);
+    _scan.report.found([&] { return ScanFindings::linkedClip(entryPath(link.name), path, files.exists(path)); });
     FolderItem target;
     target.name = link.name;
+    target.kind = link.kind;
     target.flags = files.itemFlags(path);
-    if (!isClip(target))
+    if (!_scan.report.passes(ScanRules::targetIsVisible, target, _result.folder)
+        || !_scan.report.passes(ScanRules::targetIsNoFolder, target, _result.folder))
         return;
     std::optional<platform::FileFacts> facts;
     if (const auto status = files.status(path))
@@ -171,23 +179,28 @@ void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
         addClip(platform::nameWithoutExtension(platform::lastPathComponent(file.path)), file);
     else
         _plainClips.push_back({ file.entry, file.isPlainFile, file.facts });
-    const int year = yearOf(file, recorded);
-    _scan.report.found([&] { return ScanFindings::yearOfClip(entryPath(file.entry), year); });
+    const ClipYear year = yearOf(file, recorded);
+    const auto path = [&] { return entryPath(file.entry); };
+    _scan.report.foundRecord(path, [&] {
+        const platform::Calendar& calendar = _plugin.platform().calendar;
+        const std::string date = year.date ? calendar.textOfDate(*year.date, dateFormat) : std::string();
+        return ScanFindings::yearOfClip(path(), year.year, date, year.isRecorded);
+    });
 }
 
 /// The year of a clip is that of its recording where that can be a year of a clip, else that of its file. Counts it for
 /// the event.
-int OBMontaroPlugin::ClipReader::yearOf(const FoundFile& file, const std::optional<Date>& recorded)
+ClipYear OBMontaroPlugin::ClipReader::yearOf(const FoundFile& file, const std::optional<Date>& recorded)
 {
-    int year = recorded ? _plugin.platform().calendar.yearOfDate(*recorded) : yearOfNoDate;
-    std::optional<Date> date = recorded;
-    if (year < 0 || year > latestRecordedYear) {
+    ClipYear found;
+    if (recorded)
+        found = { _plugin.platform().calendar.yearOfDate(*recorded), recorded, true };
+    if (found.year < 0 || found.year > latestRecordedYear) {
         const std::optional<Date> ofFile = fileDate(file);
-        year = ofFile ? _years.yearOf(*ofFile) : yearOfNoDate;
-        date = recorded ? recorded : ofFile;
+        found = { ofFile ? _years.yearOf(*ofFile) : yearOfNoDate, ofFile, false };
     }
-    _result.dates.take(year, date);
-    return year;
+    _result.dates.take(found.year, recorded ? recorded : found.date);
+    return found;
 }
 
 std::optional<Date> OBMontaroPlugin::ClipReader::fileDate(const FoundFile& file) const

@@ -111,7 +111,10 @@ void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& sca
             return;
         const Text& path = (*paths)[index];
         scan.report.libraryBegan(path);
-        scan.report.found([&] { return ScanFindings::searchedLibrary(path, "events", index, count); });
+        scan.report.found([&] {
+            return ScanFindings::searchedLibrary(
+                path, "events", index, count, path == _MontaroDefaultEventsFolderPath());
+        });
         if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
             carrier->setParentID(OBMontaro);
             carrier->setID(path);

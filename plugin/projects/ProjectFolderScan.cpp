@@ -37,11 +37,15 @@ std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin
 }
 
 /// What is no project is not left out for that.
-bool isProject(const ScanReport& report, const FolderItem& item, const Text& folder)
+bool isProject(const OBMontaroPlugin& plugin, const ScanReport& report, const FolderItem& item, const Text& folder)
 {
     if (ScanRules::hasProjectMarker.passes(item))
         return report.passes(ScanRules::hasProjectMarker, item, folder);
-    report.found([&] { return ScanFindings::noProject(platform::pathJoined(folder, item.name)); });
+    report.found([&] {
+        const std::string path = platform::pathJoined(folder, item.name);
+        return ScanFindings::noProject(
+            path, reasonOfMarker(plugin.platform().fileSystem, ScanRules::hasProjectMarker, path).text);
+    });
     return false;
 }
 
@@ -64,7 +68,9 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
                 break;
             const Text& path = (*paths)[index];
             scan.report.libraryBegan(path);
-            scan.report.found([&] { return ScanFindings::searchedLibrary(path, "projects", index, count); });
+            scan.report.found([&] {
+                return ScanFindings::searchedLibrary(path, "projects", index, count, path == _MontaroDefaultPath());
+            });
             if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
                 library->setName(localizedString("MontaroProjectLibrary"));
                 library->setTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
@@ -112,6 +118,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
         listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                : OBMediaGroup::modDateForFile(path) });
     if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
+        scan.report.found([&] { return ScanFindings::listedFolder(path, listing); });
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
     }
@@ -122,7 +129,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
         if (!scan.report.passes(ScanRules::nameIsNotHidden, item, listed)
             || !scan.report.passes(ScanRules::isVisible, item, listed))
             continue;
-        if (isProject(scan.report, item, listed)) {
+        if (isProject(*this, scan.report, item, listed)) {
             folder->addChildGroup(projectGroup(listed, listing, item, scan));
         } else if (scan.report.passes(ScanRules::isContainer, item, listed)
             && scan.report.passes(ScanRules::isNotPackage, item, listed)) {

@@ -52,7 +52,7 @@ struct SharedMovies {
     {
         const std::string place = report.isObserved() ? folder() : std::string();
         if (items.size() != 0)
-            report.found([&] { return ScanFindings::moviesFolder(place, "project", items.size()); });
+            report.found([&] { return ScanFindings::moviesFolder(place, items.size()); });
         files.reserve(items.size());
         for (std::size_t index = 0; index < items.size(); ++index) {
             const platform::FolderItem item = items[index];

@@ -195,7 +195,7 @@ TEST_CASE("what was left out is listed on request with the reason")
 {
     const MadeMachine machine;
     const ProgramRun run = machine.run({ "tree", "--skipped" });
-    CHECK(contains(run.output, machine.library.path("Trip/Shared Items/c.MOV") + "\n    its extension"));
+    CHECK(contains(run.output, machine.library.path("Trip/Shared Items/c.MOV") + "\n    the extension \"MOV\""));
     CHECK(contains(run.output, "\n1 item skipped\n"));
     CHECK(contains(machine.run({ "tree", "Draft", "--skipped" }).output, "\nnothing was skipped\n"));
 }

@@ -50,9 +50,10 @@ namespace {
         std::vector<std::string> variables = environmentOf(wishes, term);
         const std::vector<char*> arguments = pointersTo(words);
         const std::vector<char*> environment = pointersTo(variables);
+        const char* input = wishes.inputFile.empty() ? "/dev/null" : wishes.inputFile.c_str();
         const pid_t child = ::fork();
         if (child == 0) {
-            ::dup2(::open("/dev/null", O_RDONLY), 0);
+            ::dup2(::open(input, O_RDONLY), 0);
             ::dup2(descriptors.output, 1);
             ::dup2(descriptors.errors, 2);
             ::close_range(3, ~0U, 0);

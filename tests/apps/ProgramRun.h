@@ -18,6 +18,7 @@ struct RunWishes {
     std::vector<std::string> arguments {};
     std::vector<std::pair<std::string, std::string>> environment {}; ///< beside the few variables every run gets
     std::string outputFile {}; ///< where standard output goes instead of into the answer
+    std::string inputFile {}; ///< what standard input holds; nothing without one
 };
 
 /// Runs the program with pipes and waits for its end.

@@ -20,10 +20,12 @@ import time
 
 sys.dont_write_bytecode = True  # nothing is left behind in the sources
 
+import explained
 import faulty
 from files import Description
 from machine import Machine
 from model import PLUGIN_IDENTIFIER, Model
+from records import ROOT, Group
 
 NOBODY = 65534
 TIME_ZONES = ["UTC0", "EAST-14", "WEST+12", "HALF-5:30", "SUMMER+8LIGHT,M3.2.0,M11.1.0"]
@@ -93,15 +95,15 @@ class Checker:
         self.random = random.Random(f"check {seed}")
         self.zone = TIME_ZONES[seed % len(TIME_ZONES)]
 
-    def run(self, machine_file, *arguments, **variables):
-        """Exit status, standard output and standard error."""
+    def run(self, machine_file, *arguments, given=None, **variables):
+        """Exit status, standard output and standard error. `given` is what standard input holds."""
         environment = {key: value for key, value in os.environ.items()
                        if not key.startswith(("LC_", "LANG", "XDG_", "OMBRIX_", "CLICOLOR")) and key != "NO_COLOR"}
         environment.update(LC_ALL="C", TZ=self.zone, HOME="/nonexistent", **variables)
         place = [b"--machine", os.fsencode(machine_file)]
         words = [os.fsencode(word) for word in arguments]
         words = place + words if self.random.random() < 0.5 else words + place
-        done = subprocess.run([os.fsencode(self.options.ombrix)] + words, env=environment, stdin=subprocess.DEVNULL,
+        done = subprocess.run([os.fsencode(self.options.ombrix)] + words, env=environment, input=given or b"",
                               capture_output=True, timeout=LONGEST_RUN, check=False)
         return done.returncode, done.stdout, done.stderr
 
@@ -136,6 +138,7 @@ class Checker:
         self.expect_document(model.info(), machine.file, "info")
         self.check_log(model, machine)
         if not model.can_load():
+            self.check_explanations(model, machine, Group(ROOT, "", b"", None, ""))
             for command in (["tree"], ["groups"], ["objects", "--group", "Montaro"], ["message", "--group", "Montaro"]):
                 self.expect_refusal(machine.file, *command)
             return
@@ -144,6 +147,22 @@ class Checker:
         self.expect_document([group.printed(model.files, with_children=False) for group in model.flat_groups()],
                              machine.file, "groups")
         self.check_parts(model, machine, root)
+        self.check_explanations(model, machine, root)
+
+    def check_explanations(self, model, machine, root):
+        """Every path there is, in one run: one document a line, and none that differs from the tree."""
+        places = explained.Places(root)
+        paths = explained.interesting_paths(model, machine, places, self.random)
+        done = self.run(machine.file, "explain", "-0", "-", "--json", given=b"\0".join(paths))
+        self.expect(0, done, "explain")
+        lines = done[1].split(b"\n")
+        if len(lines) != len(paths) + 1 or lines[-1]:
+            raise Difference(f"explain: {len(paths)} paths, {len(lines) - 1} lines")
+        for path, line in zip(paths, lines):
+            answer = document(("explain", path), line)
+            fault = explained.fault_of(answer, path, *places.of(path), model.can_load())
+            if fault:
+                raise Difference(f"explain {path!r}: {fault}\n{json.dumps(answer, indent=1)}")
 
     def check_log(self, model, machine):
         _, _, log = self.run(machine.file, "info", OMBRIX_LOG="2")

@@ -264,7 +264,7 @@ class Model:
             if place.state != "gone" and (files.is_invisible(place.path) or files.is_container(place.path)):
                 continue
             clip = MediaObject(split_extension(last_component(place.path))[0], place.path, EDITOR_IDENTIFIER,
-                               "smallAppIcon", {PROJECT_PATH: place.path})
+                               "smallAppIcon", {PROJECT_PATH: place.path}, join(folder, name))
             date = files.creation_date(place.path) if place.state == "there" else None
             year = -1 if date is None else time.localtime(date // 10**9).tm_year
             if year < minimum:

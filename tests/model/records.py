@@ -54,9 +54,10 @@ def printed_attributes(attributes):
 
 
 class MediaObject:
-    def __init__(self, name, path, source, icon, attributes):
+    def __init__(self, name, path, source, icon, attributes, entry=None):
         self.name = name
         self.path = path
+        self.entry = entry if entry is not None else path  # what the scan found; elsewhere where a link was followed
         self.source = source
         self.icon = icon
         self.attributes = attributes

@@ -15,6 +15,7 @@ import unittest
 sys.dont_write_bytecode = True  # nothing is left behind in the sources
 
 import check
+import explained
 import movie
 import preferences
 import reader
@@ -373,6 +374,40 @@ class Comparing(unittest.TestCase):
         self.assertRaises(check.Difference, check.document, "x", b'{"a": NaN}')
         self.assertRaises(check.Difference, check.document, "x", b'{"a": 1, "a": 2}')
         self.assertRaises(check.Difference, check.document, "x", b'"\xff"')
+
+
+class Explaining(OnMachine):
+    def test_a_record_stands_for_its_path_and_for_the_link_that_it_was_made_from(self):
+        self.file("store", "real.mov")
+        self.event("Coast", [("plain.mov", None)])
+        entry = self.path(self.events + "/Coast/Original Media/linked")
+        os.symlink(self.path("store/real.mov"), entry)
+        places = explained.Places(self.load()[1])
+        coast = self.path(self.events + "/Coast")
+        real = self.path("store/real.mov")
+        objects = [{"group": "Montaro", "path": real}, {"group": coast, "path": real}]
+        self.assertEqual(places.of(os.fsencode(real)), ([], objects))
+        self.assertEqual(places.of(os.fsencode(entry)), ([], objects))
+        self.assertEqual(places.of(os.fsencode(coast)), ([coast], []))
+        self.assertEqual(places.of(os.fsencode(self.path("store"))), ([], []))
+
+    def test_faults_are_seen(self):
+        def fault(**changes):
+            steps = [{"rule": "search folder", "path": "/l", "passed": True, "text": "x"},
+                     {"rule": "r", "path": "/l/a", "passed": False, "text": "y"}]
+            answer = {"path": "/l/a/b", "listed": False, "groups": [], "objects": [], "steps": steps, "remedy": "z"}
+            for key, value in changes.items():
+                answer[key] = value(steps) if callable(value) else value
+            return explained.fault_of(answer, b"/l/a/b", [], [], True)
+
+        self.assertIsNone(fault())
+        self.assertIsNone(fault(remedy=None))
+        for changes in ({"path": "/l/a"}, {"listed": True}, {"groups": ["/l/a/b"]}, {"steps": []}, {"remedy": ""},
+                        {"remedy": 1}, {"steps": lambda steps: steps[:1]}, {"steps": lambda steps: steps[1:]},
+                        {"steps": lambda steps: steps[::-1]}, {"more": 1},
+                        {"steps": lambda steps: [steps[0], {**steps[1], "path": "/l/ab"}]},
+                        {"steps": lambda steps: [steps[0], {**steps[1], "text": ""}]}):
+            self.assertIsNotNone(fault(**changes), changes)
 
 
 if __name__ == "__main__":

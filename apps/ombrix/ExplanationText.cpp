@@ -1,0 +1,223 @@
+// An explanation in columns: number, verdict, rule, path, and what was found there.
+//
+// The one surprise: each path is told by what it adds to the one before, and not again while it stays the same. A
+// terminal that is too narrow for two columns gets the findings below the paths.
+
+#include "apps/ombrix/ExplanationText.h"
+
+#include "apps/common/DisplayWidth.h"
+#include "apps/ombrix/TextLine.h"
+#include "host/OBConstants.h"
+#include "platform/PathText.h"
+
+#include <algorithm>
+#include <vector>
+
+namespace ombrix {
+namespace {
+
+    constexpr int gap = 3;
+    constexpr std::string_view listedTitle = "listed";
+    constexpr std::string_view unlistedTitle = "not listed";
+    constexpr std::string_view remedyTitle = "to list it";
+    constexpr std::string_view decidesMark = "← decides";
+
+    int columnBehind(std::string_view title)
+    {
+        return apps::displayWidth(title) + gap;
+    }
+
+    std::string_view kindOfGroup(const OBMediaGroup& group)
+    {
+        const OBTypeIdentifierRef type = group.typeIdentifier();
+        if (type == OBMontaroEventGroupTypeIdentifier)
+            return "event";
+        if (type == OBMontaroProjectGroupTypeIdentifier)
+            return "project";
+        return type == OBMontaroFolderGroupTypeIdentifier ? "folder" : "group";
+    }
+
+    /// The place that says most of it: the innermost, and there the first.
+    const TreePlace& mainPlace(const Explanation& explanation)
+    {
+        return *std::max_element(explanation.places.begin(), explanation.places.end(),
+            [](const TreePlace& left, const TreePlace& right) { return left.names.size() < right.names.size(); });
+    }
+
+    std::string breadcrumbs(const TreePlace& place)
+    {
+        std::string text;
+        for (const platform::Text& name : place.names)
+            text += name.string() + " › ";
+        return text + place.group->name().string();
+    }
+
+    class ExplanationText {
+    public:
+        ExplanationText(Program& program, const Explanation& explanation, const ExplanationTextWishes& wishes)
+            : _program(program)
+            , _style(program.style())
+            , _explanation(explanation)
+            , _wishes(wishes)
+        {
+            for (std::size_t index = 0; index < explanation.steps.size(); ++index) {
+                _paths.push_back(_style.name(newPartOfPath(index)));
+                _pathWidth = std::max(_pathWidth, std::min(widestPath, apps::displayWidth(_paths.back())));
+                _pathColumn
+                    = std::max(_pathColumn, ruleColumn + columnBehind(_style.name(explanation.steps[index].rule)));
+            }
+            const int textColumn = _pathColumn + _pathWidth + gap;
+            _textIsBelow = program.columns() && *program.columns() - textColumn < leastTextWidth;
+            _textColumn = _textIsBelow ? _pathColumn : textColumn;
+        }
+
+        void print() const
+        {
+            if (_wishes.namesPath)
+                _program.printLine(_style.bold(_style.name(abbreviated(_explanation.path)), linkTo(_explanation.path)));
+            if (_explanation.isListed())
+                printPlace(mainPlace(_explanation));
+            else
+                printParagraph(unlistedTitle, TextLine::Look::bold, reason());
+            for (std::size_t index = 0; index < _explanation.steps.size(); ++index)
+                printStep(index);
+            if (!_explanation.remedy.empty())
+                printParagraph(remedyTitle, TextLine::Look::bold, _explanation.remedy);
+        }
+
+    private:
+        static constexpr int numberWidth = 3;
+        static constexpr int ruleColumn = numberWidth + 3 + gap;
+        static constexpr int widestPath = 40;
+        static constexpr int leastPathWidth = 8;
+        static constexpr int leastTextWidth = 40;
+
+        TextLine emptyLine() const { return { _style, _program.columns() }; }
+
+        void printParagraph(std::string_view title, TextLine::Look look, std::string_view text) const
+        {
+            _program.printWrapped(emptyLine().add(0, title, look), columnBehind(title), _style.name(text));
+        }
+
+        void printPlace(const TreePlace& place) const
+        {
+            const int column = columnBehind(listedTitle);
+            TextLine line = emptyLine();
+            line.add(0, listedTitle, TextLine::Look::bold);
+            const std::string kind(kindOfGroup(*place.group));
+            if (place.object) {
+                const bool isClip = place.group->typeIdentifier() == OBMontaroEventGroupTypeIdentifier;
+                line.add(column, isClip ? "clip \"" : "movie \"");
+                line.addBehind(
+                    _style.name(place.object->name()), TextLine::Look::bold, linkTo(place.object->path().view()));
+                line.addBehind("\" of the " + kind + " ");
+            } else {
+                line.add(column, kind + " ");
+            }
+            const platform::Text path = place.group->path();
+            line.addBehind(
+                _style.name(place.group->name()), TextLine::Look::bold, path ? linkTo(path.view()) : std::string());
+            _program.printLine(line.text());
+            _program.printWrapped(emptyLine(), column, _style.name(breadcrumbs(place)), TextLine::Look::dim);
+        }
+
+        /// Why the path is not listed, told of a folder that it lies in where that decides.
+        std::string reason() const
+        {
+            const ExplainedStep& last = _explanation.steps.back();
+            if (last.path == _explanation.path)
+                return last.text;
+            return std::string(platform::lastPathComponent(last.path)) + ": " + last.text;
+        }
+
+        void printStep(std::size_t index) const
+        {
+            const ExplainedStep& step = _explanation.steps[index];
+            TextLine line = emptyLine();
+            line.add(0, apps::paddedBefore(std::to_string(index + 1), numberWidth) + " ");
+            line.addBehind(step.passed ? "ok" : "NO", step.passed ? TextLine::Look::plain : TextLine::Look::warning);
+            line.add(ruleColumn, _style.name(step.rule));
+            if (step.passed)
+                printFinding(line, _paths[index], _style.name(step.text));
+            else
+                printDeciding(line, _paths[index]);
+        }
+
+        void printFinding(TextLine& line, const std::string& path, const std::string& text) const
+        {
+            if (!path.empty() && _textIsBelow) {
+                _program.printLine(line.addName(_pathColumn, path).text());
+                _program.printWrapped(emptyLine(), _textColumn, text, TextLine::Look::dim);
+                return;
+            }
+            if (!path.empty())
+                line.add(_pathColumn, cutTo(_pathWidth, path));
+            _program.printWrapped(line, _textColumn, text, TextLine::Look::dim);
+        }
+
+        /// What decides was said above the steps.
+        void printDeciding(TextLine& line, const std::string& path) const
+        {
+            const int room = _textIsBelow
+                ? std::max(leastPathWidth, *_program.columns() - _pathColumn - columnBehind(decidesMark))
+                : _pathWidth;
+            if (!path.empty())
+                line.add(_pathColumn, cutTo(room, path));
+            const int column
+                = _textIsBelow ? _pathColumn + std::min(room, apps::displayWidth(path)) + gap : _textColumn;
+            _program.printLine(line.addWhole(path.empty() ? _textColumn : column, decidesMark).text());
+        }
+
+        std::string cutTo(int width, const std::string& path) const
+        {
+            return _program.columns() ? apps::cutInMiddle(path, width) : path;
+        }
+
+        /// What the path of a step adds to that of the step before; empty where it is the same.
+        std::string newPartOfPath(std::size_t index) const
+        {
+            const std::string& path = _explanation.steps[index].path;
+            if (index == 0)
+                return abbreviated(path);
+            const std::string& before = _explanation.steps[index - 1].path;
+            if (path == before)
+                return {};
+            const std::string_view below = platform::pathRelativeTo(path, before);
+            if (!below.empty())
+                return std::string(below);
+            const std::string& library = _explanation.steps.front().path;
+            const std::string_view inLibrary = platform::pathRelativeTo(path, library);
+            return inLibrary.empty() ? abbreviated(path) : std::string(inLibrary);
+        }
+
+        std::string abbreviated(const std::string& path) const
+        {
+            if (!_wishes.home || *_wishes.home == "/" || !platform::isSameOrBelow(path, *_wishes.home))
+                return path;
+            return platform::pathJoined("~", platform::pathRelativeTo(path, *_wishes.home));
+        }
+
+        std::string linkTo(std::string_view path) const
+        {
+            return _style.hasLinks() ? _wishes.linkTarget(path) : std::string();
+        }
+
+        Program& _program;
+        const apps::Style& _style;
+        const Explanation& _explanation;
+        const ExplanationTextWishes& _wishes;
+        std::vector<std::string> _paths {}; // laid out, one for each step
+        int _pathWidth = 0;
+        int _pathColumn = 0;
+        int _textColumn = 0;
+        bool _textIsBelow = false;
+    };
+
+} // namespace
+
+void printExplanation(Program& program, const Explanation& explanation, const ExplanationTextWishes& wishes)
+{
+    ExplanationText(program, explanation, wishes).print();
+}
+
+} // namespace ombrix

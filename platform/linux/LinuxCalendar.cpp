@@ -1,5 +1,7 @@
 #include "platform/linux/LinuxCalendar.h"
 
+#include "platform/Immortal.h"
+
 #include <climits>
 #include <clocale>
 #include <cstddef>
@@ -30,11 +32,6 @@ namespace {
             if (!_locale)
                 _locale = newlocale(LC_ALL_MASK, "C", nullptr);
         }
-        ~TimeLocale()
-        {
-            if (_locale)
-                freelocale(_locale);
-        }
         TimeLocale(const TimeLocale&) = delete;
         TimeLocale& operator=(const TimeLocale&) = delete;
         locale_t get() const { return _locale; }
@@ -42,6 +39,13 @@ namespace {
     private:
         locale_t _locale;
     };
+
+    /// Opened once: it is read from a dozen files.
+    locale_t timeLocale()
+    {
+        static Immortal<TimeLocale> locale;
+        return locale->get();
+    }
 
 } // namespace
 
@@ -57,11 +61,11 @@ std::string LinuxCalendar::textOfDate(const Date& date, std::string_view format)
 {
     constexpr std::size_t longest = 4096;
     const std::optional<tm> parts = localTime(date);
-    const TimeLocale locale;
-    if (!parts || !locale.get() || format.empty())
+    const locale_t locale = timeLocale();
+    if (!parts || !locale || format.empty())
         return {};
     std::vector<char> text(longest);
-    const std::size_t length = strftime_l(text.data(), text.size(), std::string(format).c_str(), &*parts, locale.get());
+    const std::size_t length = strftime_l(text.data(), text.size(), std::string(format).c_str(), &*parts, locale);
     return { text.data(), length };
 }
 

@@ -224,7 +224,8 @@ void OBMontaroPlugin::ClipReader::addClip(std::string_view name, const FoundFile
     clip->setIcon(_scan.clipKind->icon);
     clip->setFileFacts(file.facts);
     _result.clips = _result.clips.appending(clip);
-    _scan.report.objectMade(entryPath(file.entry), clip);
+    if (_scan.report.isObserved())
+        _scan.report.objectMade(entryPath(file.entry), clip);
 }
 
 void OBMontaroPlugin::ClipReader::addPlainClips()

@@ -199,6 +199,8 @@ public:
 
     /// For whoever makes a listing.
     void append(const FolderItem& item);
+    /// Makes room for so many more items, whose names take so many bytes; more may come.
+    void reserve(std::size_t items, std::size_t bytesOfNames);
     void setItem(std::size_t index, const FolderItem& item);
     /// Adds an item of the subfolder of the item that is appended next.
     void appendToSubfolder(std::string_view name, ItemKind kind);
@@ -371,20 +373,25 @@ inline FolderItem FolderListing::adopted(const FolderItem& item)
     return own;
 }
 
+inline void FolderListing::reserve(std::size_t items, std::size_t bytesOfNames)
+{
+    // Only the first call knows how much there is; what grows beyond doubles.
+    if (_entries.empty()) {
+        _entries.reserve(items);
+        _names.reserve(bytesOfNames);
+    }
+}
+
 inline void FolderListing::append(const FolderItem& item)
 {
-    if (_entries.empty()) {
-        // Most folders are small; what grows beyond this doubles.
-        _entries.reserve(8);
-        _names.reserve(128);
-    }
-    const FolderItem own = adopted(item);
+    const bool isForeign = item.subfolder && item.subfolder->_listing != this;
+    const std::optional<FolderItem> own = isForeign ? std::optional(adopted(item)) : std::nullopt;
     Entry& entry = _entries.emplace_back();
     entry.nameOffset = static_cast<std::uint32_t>(_names.size());
     entry.nameLength = static_cast<std::uint32_t>(item.name.size());
     _names.append(item.name);
-    entry.take(own);
-    noteLinks(own);
+    entry.take(own ? *own : item);
+    noteLinks(item);
 }
 
 inline void FolderListing::setItem(std::size_t index, const FolderItem& item)

@@ -69,6 +69,9 @@ namespace {
 
     void FolderReader::takeBlock(const char* block, std::size_t length)
     {
+        // Most folders fit one block, which bounds what they hold; an entry takes twice its name and some more.
+        constexpr std::size_t usualEntry = 32;
+        _listing.reserve(length / usualEntry + 1, length / 2);
         for (std::size_t offset = 0; offset < length;) {
             const auto* entry = reinterpret_cast<const dirent64*>(block + offset);
             take(*entry);
@@ -128,8 +131,10 @@ namespace {
         const auto status = readItemStatus(_folder, name, AT_SYMLINK_NOFOLLOW);
         if (!status)
             return;
-        item.kind = status->kind;
-        item.flags = flagsOfItem(item.name, item.kind);
+        if (status->kind != item.kind) {
+            item.kind = status->kind;
+            item.flags = flagsOfItem(item.name, item.kind);
+        }
         if (isAsked())
             item.facts = FileFacts { status->creationDate, status->size };
     }

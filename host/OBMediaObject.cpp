@@ -248,10 +248,15 @@ void OBMediaObject::setAttribute_forKey(Value value, Text key)
 
 Value::Dictionary OBMediaObject::attributes() const
 {
+    Locked guard(_lock);
+    return attributesLocked(pathLocked());
+}
+
+Value::Dictionary OBMediaObject::attributesLocked(const Text& path) const
+{
     static platform::Immortal<HeaderKeys> keys;
     const OBMediaObjectKind& kind = _origin.kind();
     Value::Dictionary result;
-    Locked guard(_lock);
     if (_own)
         result = _own->attributes;
     else
@@ -262,7 +267,7 @@ Value::Dictionary OBMediaObject::attributes() const
             result.emplace_back(key, std::move(value));
     };
     for (const Text& key : kind.ownPathKeys)
-        addMissing(key, pathLocked());
+        addMissing(key, path);
     if (kind.groupPathKey)
         addMissing(kind.groupPathKey, _origin.groupPath());
     addMissing(keys->resolution, attributeBesideOwn(OBMediaObjectResolutionKey));
@@ -270,6 +275,22 @@ Value::Dictionary OBMediaObject::attributes() const
         addMissing(key, value);
     addMissing(keys->duration, attributeBesideOwn(OBMediaObjectDurationKey));
     return result;
+}
+
+OBMediaObjectRecord OBMediaObject::record() const
+{
+    Locked guard(_lock);
+    OBMediaObjectRecord record;
+    const OBMediaObjectKind& kind = _origin.kind();
+    record.mediaType = _own ? _own->mediaType : kind.mediaType;
+    record.name = _own ? _own->name : _origin.nameOfObject(*this);
+    record.mediaSourceType = _own ? _own->mediaSourceType : kind.mediaSourceType;
+    record.sourcePluginIdentifier = _own ? _own->sourcePluginIdentifier : kind.sourcePluginIdentifier;
+    record.path = pathLocked();
+    record.pathIsReal = _pathIsReal;
+    record.icon = _own ? handedOut(_own->icon) : _origin.icon();
+    record.attributes = attributesLocked(record.path);
+    return record;
 }
 
 OBImageRef OBMediaObject::icon() const

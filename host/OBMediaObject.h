@@ -58,6 +58,18 @@ private:
     mutable std::optional<platform::Value> _read GUARDED_BY(_lock);
 };
 
+/// All fields of a media object at one moment.
+struct OBMediaObjectRecord {
+    int mediaType = 0;
+    platform::Text name {};
+    int mediaSourceType = 0;
+    platform::Text sourcePluginIdentifier {};
+    platform::Text path {};
+    bool pathIsReal = false; ///< the path was seen to hold no symbolic link: it is its own real path
+    OBImageRef icon {};
+    platform::Value::Dictionary attributes {};
+};
+
 /// One movie file of the tree.
 ///
 /// An object is made by itself with `initWithMediaType_name`, or together with the other files of its folder by
@@ -83,6 +95,9 @@ public:
     void setMediaSourceType(int code);
     platform::Text sourcePluginIdentifier() const;
     void setSourcePluginIdentifier(platform::Text identifier);
+
+    /// All of it at once, for whoever prints a million.
+    OBMediaObjectRecord record() const;
 
     /// The file; absent when none was set.
     platform::Text path() const;
@@ -139,6 +154,7 @@ private:
     OwnFields& own() REQUIRES(_lock);
     platform::Text pathLocked() const REQUIRES(_lock);
     std::optional<platform::FileFacts> factsLocked() const REQUIRES(_lock);
+    platform::Value::Dictionary attributesLocked(const platform::Text& path) const REQUIRES(_lock);
     platform::Value attributeBesideOwn(std::string_view key) const REQUIRES(_lock);
     platform::Value attributeOfMovie(std::string_view key) const REQUIRES(_lock);
     OBImageRef withoutCycle(OBImageRef image) const;

@@ -47,17 +47,18 @@ namespace {
 
     void writeObject(JsonWriter& writer, const OBMediaObject& object)
     {
+        const OBMediaObjectRecord record = object.record();
         writer.beginObject();
         writer.plainKey("mediaType");
-        writer.integer(object.mediaType());
-        writeText(writer, "name", object.name());
+        writer.integer(record.mediaType);
+        writeText(writer, "name", record.name);
         writer.plainKey("mediaSourceType");
-        writer.integer(object.mediaSourceType());
-        writeText(writer, "sourcePluginIdentifier", object.sourcePluginIdentifier());
-        writeText(writer, "path", object.path());
-        writeText(writer, "aliasResolvedPath", object.aliasResolvedPath());
-        writeIcon(writer, object.icon());
-        writeAttributes(writer, object.attributes());
+        writer.integer(record.mediaSourceType);
+        writeText(writer, "sourcePluginIdentifier", record.sourcePluginIdentifier);
+        writeText(writer, "path", record.path);
+        writeText(writer, "aliasResolvedPath", record.pathIsReal ? record.path : object.aliasResolvedPath());
+        writeIcon(writer, record.icon);
+        writeAttributes(writer, record.attributes);
         writer.endObject();
     }
 

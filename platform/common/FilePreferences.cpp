@@ -1,8 +1,8 @@
 #include "platform/common/FilePreferences.h"
 
+#include "platform/FileProblemText.h"
 #include "platform/FileSystem.h"
 #include "platform/PathText.h"
-#include "platform/FileProblemText.h"
 #include "platform/common/WholeFile.h"
 #include "platform/formats/PropertyList.h"
 

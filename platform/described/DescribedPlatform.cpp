@@ -1,11 +1,11 @@
 #include "platform/described/DescribedPlatform.h"
 
+#include "platform/FileProblemText.h"
 #include "platform/PathText.h"
 #include "platform/Workspace.h"
 #include "platform/common/FileMetadataIndex.h"
 #include "platform/common/FileMovies.h"
 #include "platform/common/FilePreferences.h"
-#include "platform/FileProblemText.h"
 #include "platform/common/LexicalPath.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/WholeFile.h"

@@ -1,8 +1,8 @@
 #include "platform/linux/LinuxBundles.h"
 
+#include "platform/FileProblemText.h"
 #include "platform/FileSystem.h"
 #include "platform/PathText.h"
-#include "platform/FileProblemText.h"
 #include "platform/common/WholeFile.h"
 #include "platform/formats/Manifest.h"
 #include "platform/formats/PropertyList.h"

@@ -243,3 +243,55 @@ TEST_CASE("without a host nothing is read of files")
     CHECK(OBMediaObject::marvexProperties(object->path())->all().isNull());
     CHECK_FALSE(OBMediaGroup::modDateForFile(object->path()).has_value());
 }
+
+TEST_CASE("a record of an object holds what its fields answer, also where somebody has changed them")
+{
+    const HostMachine machine;
+    OBMediaObjectKind kind;
+    kind.mediaType = 3;
+    kind.mediaSourceType = 4;
+    kind.sourcePluginIdentifier = "source";
+    kind.ownPathKeys = { "Path" };
+    const OBFileOfFolder file { "clip.mov", true };
+    const OBMediaObjectList objects = OBMediaObjectBatch::objects(
+        std::make_shared<const OBMediaObjectKind>(kind), { "/folder", true }, { &file, 1 });
+    const auto checkRecord = [](const OBMediaObject& object) {
+        const OBMediaObjectRecord record = object.record();
+        CHECK(record.mediaType == object.mediaType());
+        CHECK(record.name == object.name());
+        CHECK(record.mediaSourceType == object.mediaSourceType());
+        CHECK(record.sourcePluginIdentifier == object.sourcePluginIdentifier());
+        CHECK(record.path == object.path());
+        CHECK(record.icon == object.icon());
+        CHECK(record.attributes == object.attributes());
+    };
+    checkRecord(*objects[0]);
+    CHECK(objects[0]->record().pathIsReal);
+    CHECK(objects[0]->record().attributes == platform::Value::Dictionary { { "Path", "/folder/clip.mov" } });
+    objects[0]->setPath("/elsewhere/other.mov");
+    objects[0]->setMediaSourceType(5);
+    objects[0]->setAttribute_forKey(true, "Key");
+    checkRecord(*objects[0]);
+    CHECK_FALSE(objects[0]->record().pathIsReal);
+    CHECK(objects[0]->record().path == "/elsewhere/other.mov");
+}
+
+TEST_CASE("an object keeps what was seen of its file until it gets another path, and asks nothing of the disk for it")
+{
+    const HostMachine machine;
+    const platform::FileFacts facts { { 1'300'000'000, 5 }, 1234 };
+    const std::vector<OBFileOfFolder> files { { "a.mov", true, facts }, { "b.mov", true, std::nullopt } };
+    const OBMediaObjectList objects
+        = OBMediaObjectBatch::objects(std::make_shared<const OBMediaObjectKind>(), { "/nowhere", true }, files);
+    CHECK(objects[0]->fileFacts() == facts);
+    CHECK_FALSE(objects[1]->fileFacts());
+    objects[0]->setMediaSourceType(4);
+    CHECK(objects[0]->fileFacts() == facts);
+    objects[0]->setPath("/nowhere/c.mov");
+    CHECK_FALSE(objects[0]->fileFacts());
+    objects[0]->setFileFacts(facts);
+    CHECK(objects[0]->fileFacts() == facts);
+    const OBMediaObjectRef other = OBMediaObject::initWithMediaType_name(3, "other");
+    other->setPathOfObject(*objects[0]);
+    CHECK(other->fileFacts() == facts);
+}

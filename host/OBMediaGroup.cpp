@@ -238,7 +238,7 @@ OBMediaObjectList OBMediaGroup::mediaObjects() const
             children = _fields.childGroups;
     }
     for (const OBMediaGroupRef& child : children)
-        own = own.appending(child->mediaObjects());
+        own = child ? own.appending(child->mediaObjects()) : own;
     return own;
 }
 

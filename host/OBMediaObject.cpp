@@ -163,16 +163,23 @@ std::optional<platform::FileFacts> OBMediaObject::factsLocked() const
 Text OBMediaObject::aliasResolvedPath() const
 {
     Text path;
+    bool wasReal = false;
     {
         Locked guard(_lock);
         path = pathLocked();
-        if (_pathIsReal)
-            return path;
+        wasReal = _pathIsReal;
     }
     const auto core = FrameworkCore::current();
-    if (!core || path.isAbsent() || !core->platform().fileSystem.exists(path))
+    if (!core || path.isAbsent())
         return {};
-    return Text(core->platform().fileSystem.resolvedPath(path));
+    const platform::FileSystem& fileSystem = core->platform().fileSystem;
+    if (wasReal) {
+        // What was a plain file by its real path, and still is one, needs no walk along its path.
+        const std::optional<platform::ItemStatus> now = fileSystem.linkStatus(path);
+        if (now && now->kind == platform::ItemKind::file)
+            return path;
+    }
+    return fileSystem.exists(path) ? Text(fileSystem.resolvedPath(path)) : Text();
 }
 
 OBMarvexPropertiesRef OBMediaObject::marvexProperties(Text path)

@@ -183,7 +183,8 @@ OBMediaObjectBatch::OBMediaObjectBatch(MakeKey, const TrailingBytes& trailing,
 
 std::size_t OBMediaObjectBatch::keptFacts(std::span<const OBFileOfFolder> files)
 {
-    return files.front().facts ? files.size() : 0;
+    const auto hasFacts = [](const OBFileOfFolder& file) { return file.facts.has_value(); };
+    return std::any_of(files.begin(), files.end(), hasFacts) ? files.size() : 0;
 }
 
 OBMediaObjectBatch::~OBMediaObjectBatch()

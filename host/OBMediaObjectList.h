@@ -87,7 +87,7 @@ struct OBFolderOfFiles {
 struct OBFileOfFolder {
     std::string_view name {};
     bool isPlainFile = false; ///< it was seen to be a plain file, no link to one
-    std::optional<platform::FileFacts> facts {}; ///< kept for all files of a folder where the first has them
+    std::optional<platform::FileFacts> facts {}; ///< kept where they are known
 };
 
 struct TrailingBytes;

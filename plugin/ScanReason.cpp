@@ -35,7 +35,12 @@ ScanReason scanReason(
         if (item.kind == ItemKind::symbolicLink && !fileSystem.exists(path))
             return { "it is a symbolic link that leads nowhere", rule.remedyOfDeadLink };
     }
-    return rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
+    ScanReason reason = rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
+    if (const std::string name = ScanRules::nameWithLowerCaseExtension(item.name);
+        &rule == &ScanRules::hasMovieExtension && !name.empty()
+        && fileSystem.linkStatus(platform::pathJoined(platform::pathByRemovingLastComponent(path), name)))
+        reason.remedy = "give it a name that is not taken, and the extension of " + name;
+    return reason;
 }
 
 ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, const std::string& path)
@@ -57,10 +62,15 @@ ScanReason ScanRules::reasonOfExtension(std::string_view name)
     const std::string_view extension = platform::extensionOfName(name);
     if (extension.empty())
         return hasMovieExtension.failure;
-    const std::string lower = lowerCase(extension);
-    const bool isOnlyCase = std::find(movieExtensions.begin(), movieExtensions.end(), lower) != movieExtensions.end();
+    const std::string renamed = nameWithLowerCaseExtension(name);
     return { "the extension \"" + std::string(extension)
             + "\" is not one of mov, m4v, mp4, 3gp (case matters for project movies)",
-        isOnlyCase ? "rename it to " + std::string(platform::nameWithoutExtension(name)) + "." + lower
-                   : std::string(hasMovieExtension.failure.remedy) };
+        renamed.empty() ? std::string(hasMovieExtension.failure.remedy) : "rename it to " + renamed };
+}
+
+std::string ScanRules::nameWithLowerCaseExtension(std::string_view name)
+{
+    const std::string lower = lowerCase(platform::extensionOfName(name));
+    const bool isOnlyCase = std::find(movieExtensions.begin(), movieExtensions.end(), lower) != movieExtensions.end();
+    return isOnlyCase ? std::string(platform::nameWithoutExtension(name)) + "." + lower : std::string();
 }

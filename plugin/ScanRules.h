@@ -115,6 +115,8 @@ inline constexpr ScanRule targetIsNoFolder { .name = "kind",
 
 /// Why the extension of `name` is not a project movie's.
 ScanReason reasonOfExtension(std::string_view name);
+/// The name that would make a movie of a file of which only the case of the extension is wrong; empty for others.
+std::string nameWithLowerCaseExtension(std::string_view name);
 
 inline constexpr ScanRule hasMovieExtension { .name = "extension",
     .passes =

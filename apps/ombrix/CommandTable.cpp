@@ -23,7 +23,7 @@ namespace {
 
     constexpr OptionInfo treeOptions[] {
         { "--all", "", "", "everything, also where it is longer than the terminal" },
-        { "--skipped", "", "", "list below the tree what was left out, and why", false, false, "--json" },
+        { "--skipped", "", "", "list below the tree, or beside JSON, what was left out" },
         json,
     };
     constexpr Example treeExamples[] {

@@ -9,9 +9,11 @@
 #include "host/OBSourceInspection.h"
 #include "platform/PathText.h"
 
+#include <algorithm>
+#include <cstdio>
 #include <filesystem>
-#include <iostream>
 #include <optional>
+#include <utility>
 
 namespace ombrix {
 namespace {
@@ -21,21 +23,31 @@ namespace {
 
     constexpr const char* standardInput = "-";
 
-    /// Every path ended by a zero byte; the last may lack it.
-    Paths pathsOfStandardInput()
+    /// Every path ended by a zero byte; the last may lack it. Absent when it cannot be read to its end.
+    std::optional<Paths> pathsOfStandardInput()
     {
         Paths paths;
-        for (std::string path; std::getline(std::cin, path, '\0');)
+        std::string path;
+        for (int byte = std::getc(stdin); byte != EOF; byte = std::getc(stdin)) {
+            if (byte != '\0')
+                path.push_back(static_cast<char>(byte));
+            else
+                paths.push_back(std::exchange(path, {}));
+        }
+        if (!path.empty())
             paths.push_back(path);
-        return paths;
+        return std::ferror(stdin) ? std::nullopt : std::optional(std::move(paths));
     }
 
-    /// Absolute, "." and ".." taken out as text; no link is looked at.
+    /// Absolute, "." and ".." taken out as text; no link is looked at. The empty path stays empty, and is explained as
+    /// what lies nowhere; absent where there is no current folder.
     std::optional<std::string> absolutePath(const std::string& path)
     {
         std::error_code error;
         const std::filesystem::path current = std::filesystem::current_path(error);
-        if (path.empty() || (error && path.front() != '/'))
+        if (path.empty())
+            return path;
+        if (error && path.front() != '/')
             return std::nullopt;
         const std::string normal = (current / path).lexically_normal().string();
         return std::string(platform::pathWithoutTrailingSlashes(normal));
@@ -146,7 +158,12 @@ int runExplain(Program& program)
     if (program.arguments().has("-0")) {
         if (asked != Paths { standardInput })
             return program.failUsage("explain: option -0 reads paths from standard input: \"explain -0 -\"");
-        asked = pathsOfStandardInput();
+        std::optional<Paths> read = pathsOfStandardInput();
+        if (!read)
+            return program.fail("standard input", "it cannot be read");
+        asked = std::move(*read);
+    } else if (std::find(asked.begin(), asked.end(), std::string()) != asked.end()) {
+        return program.failUsage("explain: \"\" is no path");
     } else if (asked.empty()) {
         return program.failUsage("explain: no PATH given (\"ombrix help explain\")");
     }
@@ -154,7 +171,7 @@ int runExplain(Program& program)
     for (const std::string& path : asked) {
         const std::optional<std::string> absolute = absolutePath(path);
         if (!absolute)
-            return program.failUsage("explain: \"" + path + "\" is no path");
+            return program.fail(path, "it is relative, and there is no current folder");
         paths.push_back(*absolute);
     }
     const std::shared_ptr<OBMediaManager> manager = program.manager();

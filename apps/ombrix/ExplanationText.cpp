@@ -37,11 +37,18 @@ namespace {
         return type == OBMontaroFolderGroupTypeIdentifier ? "folder" : "group";
     }
 
-    /// The place that says most of it: the innermost, and there the first.
+    /// The place that the steps lead to; of several the innermost, and there the first.
     const TreePlace& mainPlace(const Explanation& explanation)
     {
+        const auto rank = [&explanation](const TreePlace& place) {
+            const platform::Text folder = place.group->path();
+            const auto leadsThere
+                = [&](const ExplainedStep& step) { return folder && platform::isSameOrBelow(step.path, folder); };
+            const bool isOnTheWay = std::any_of(explanation.steps.begin(), explanation.steps.end(), leadsThere);
+            return std::pair(isOnTheWay, place.names.size());
+        };
         return *std::max_element(explanation.places.begin(), explanation.places.end(),
-            [](const TreePlace& left, const TreePlace& right) { return left.names.size() < right.names.size(); });
+            [&](const TreePlace& left, const TreePlace& right) { return rank(left) < rank(right); });
     }
 
     std::string breadcrumbs(const TreePlace& place)

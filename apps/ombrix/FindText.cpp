@@ -5,6 +5,7 @@
 #include "apps/common/DisplayWidth.h"
 #include "apps/ombrix/TextLine.h"
 #include "apps/ombrix/TreeNodes.h"
+#include "platform/FileSystem.h"
 
 #include <algorithm>
 #include <string>
@@ -80,9 +81,12 @@ void printFindText(Program& program, const apps::FoundNames& found, std::size_t 
         place = std::max(place, std::min(widestCell, apps::displayWidth(rows.back().place)));
     }
     const int placeColumn = name + gap + kind + gap;
+    const platform::FileSystem& fileSystem = program.session()->platform().fileSystem;
     for (const Row& row : rows) {
         TextLine line(program.style(), program.columns());
-        line.addBehind(row.name, TextLine::Look::bold, row.path);
+        // A link leads to where the file lies, not by the name of a volume that only this system resolves.
+        const bool isLink = program.style().hasLinks() && row.path;
+        line.addBehind(row.name, TextLine::Look::bold, isLink ? fileSystem.resolvedPath(row.path) : std::string());
         line.add(name + gap, row.kind, TextLine::Look::dim).add(placeColumn, row.place);
         const int pathColumn = placeColumn + place + gap;
         program.printLine(line.add(pathColumn, pathBehind(pathColumn, row, program), TextLine::Look::dim).text());

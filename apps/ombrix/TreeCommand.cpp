@@ -2,6 +2,7 @@
 // that the command which a folded place suggests shows what it promises.
 
 #include "apps/common/DisplayWidth.h"
+#include "apps/common/HostileNames.h"
 #include "apps/common/HumanText.h"
 #include "apps/common/RecordJson.h"
 #include "apps/common/StandardError.h"
@@ -45,22 +46,41 @@ namespace {
         return suggestedCommand(arguments, "tree --all");
     }
 
-    void printSkipped(Program& program, const SkippedItems& skipped, const OBMediaGroupRef& group, bool isPart)
+    /// What was kept out of the tree, or of the part of it that `group` is.
+    std::vector<OBScanDecision> decisionsFor(const SkippedItems& skipped, const OBMediaGroupRef& group, bool isPart)
     {
         const platform::Text folder = group->path();
+        std::vector<OBScanDecision> decisions = skipped.decisions();
+        const auto isElsewhere = [&](const OBScanDecision& decision) {
+            return isPart && (folder.isAbsent() || !platform::isSameOrBelow(decision.path, folder));
+        };
+        decisions.erase(std::remove_if(decisions.begin(), decisions.end(), isElsewhere), decisions.end());
+        return decisions;
+    }
+
+    std::string reasonOf(const OBScanDecision& decision)
+    {
+        const std::string reason = decision.text.empty() ? std::string(decision.rule) : decision.text;
+        return reason + (decision.remedy.empty() ? std::string() : "; to list it, " + decision.remedy);
+    }
+
+    void printSkipped(Program& program, const std::vector<OBScanDecision>& decisions)
+    {
         program.printLine("");
-        std::size_t count = 0;
-        for (const OBScanDecision& decision : skipped.decisions()) {
-            if (isPart && (folder.isAbsent() || !platform::isSameOrBelow(decision.path, folder)))
-                continue;
-            ++count;
+        for (const OBScanDecision& decision : decisions) {
             const TextLine empty(program.style(), program.columns());
             program.printLine(TextLine(empty).addName(0, program.style().name(decision.path)).text());
-            const std::string reason = decision.text.empty() ? std::string(decision.rule) : decision.text;
-            const std::string remedy = decision.remedy.empty() ? std::string() : "; to list it, " + decision.remedy;
-            program.printWrapped(empty, 4, program.style().name(reason + remedy), TextLine::Look::dim);
+            program.printWrapped(empty, 4, program.style().name(reasonOf(decision)), TextLine::Look::dim);
         }
-        program.printLine(count == 0 ? "nothing was skipped" : apps::quantityText(count, "item") + " skipped");
+        program.printLine(
+            decisions.empty() ? "nothing was skipped" : apps::quantityText(decisions.size(), "item") + " skipped");
+    }
+
+    /// Beside a document, which has no place for it.
+    void tellSkipped(const std::vector<OBScanDecision>& decisions)
+    {
+        for (const OBScanDecision& decision : decisions)
+            apps::printError("skipped: " + apps::escapedText(decision.path + ": " + reasonOf(decision)));
     }
 
     std::string foldersText(OBMediaManager& manager, OBSourceInspection& inspection)
@@ -167,6 +187,8 @@ int runTree(Program& program)
     }
     if (program.wantsJson()) {
         apps::printGroup(program.output(), group);
+        if (skipped)
+            tellSkipped(decisionsFor(*skipped, group, isPart));
         program.warnOfUnreadFolders();
         return done;
     }
@@ -174,7 +196,7 @@ int runTree(Program& program)
     const std::optional<std::string> footer = footerOf(program, *manager);
     printText(program, *manager, root, group, footer);
     if (skipped)
-        printSkipped(program, *skipped, group, isPart);
+        printSkipped(program, decisionsFor(*skipped, group, isPart));
     program.output().flush();
     program.warnOfUnreadFolders();
     if (footer)

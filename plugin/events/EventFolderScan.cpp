@@ -165,8 +165,8 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     return carrier;
 }
 
-/// One event of `library`; null when it has no clips. It shows in the flat list as soon as its folder of clips has been
-/// found to hold something.
+/// One event of `library`; null when it has no clips. The flat list shows it all the same where its folder of clips
+/// holds anything at all.
 OBMediaGroupRef OBMontaroPlugin::eventGroup(
     const Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan)
 {

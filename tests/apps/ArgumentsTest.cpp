@@ -71,7 +71,7 @@ TEST_CASE("an option that means nothing to a command, or beside another, is refu
 {
     CHECK(parse({ "plugins", "--source", "x" }).problem == "plugins: option --source means nothing here");
     CHECK(parse({ "--source=x", "help", "tree" }).problem == "help: option --source means nothing here");
-    CHECK(parse({ "tree", "--skipped", "--json" }).problem == "tree: options --skipped and --json exclude each other");
+    CHECK(parse({ "paths", "-0", "--json" }).problem == "paths: options -0 and --json exclude each other");
     CHECK(parse({ "paths", "--json", "-0" }).problem == "paths: options -0 and --json exclude each other");
     CHECK(parse({ "objects", "--group", "x", "--json", "-0" }).problem
         == "objects: options -0 and --json exclude each other");

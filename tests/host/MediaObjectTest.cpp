@@ -190,6 +190,19 @@ TEST_CASE("a path that was seen to hold no link resolves to itself without links
     CHECK(other->aliasResolvedPath() == Text(file));
 }
 
+TEST_CASE("a file that has gone since it was found has no real path, and one that a link replaced leads elsewhere")
+{
+    TestHost test;
+    const std::string elsewhere = test.machine.folder.file("elsewhere.mov");
+    const std::string file = test.machine.folder.file("real/trip.mov");
+    test.host();
+    const auto object = fileOfFolder(test.machine.folder.path("real"), "trip.mov", true);
+    removeItem(file);
+    CHECK(object->aliasResolvedPath().isAbsent());
+    makeLink(file, elsewhere);
+    CHECK(object->aliasResolvedPath() == Text(elsewhere));
+}
+
 TEST_CASE("a new path of an object is resolved afresh")
 {
     TestHost test;

@@ -16,8 +16,9 @@
 
 struct EventClips;
 struct EventScan;
-struct FoundEvent;
+struct FoundFolder;
 struct ProjectScan;
+struct ReadEvent;
 
 /// An ordered list of folders to search; immutable, replaced whole. Null until it has been prepared.
 using MontaroSearchPaths = std::shared_ptr<const std::vector<platform::Text>>;
@@ -153,7 +154,8 @@ private:
     class ClipReader;
     void walkEventLibraries(OBMediaGroup& collected, EventScan& scan);
     OBMediaGroupRef eventGroup(
-        const platform::Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan);
+        const platform::Text& library, const FoundFolder& found, const ReadEvent& read, EventScan& scan);
+    ReadEvent readEvent(const platform::Text& library, const FoundFolder& folder, const EventScan& scan);
     EventClips clipsOfEvent(const platform::Text& event, const EventScan& scan);
     void groupEventsByYear(OBMediaGroup& library, const OBMediaGroupList& events, const EventScan& scan);
     void sortEventsWithinYears(const OBMediaGroup& library);

@@ -22,8 +22,8 @@ using platform::Value;
 
 namespace {
 
-/// Names and flags of the entries, and of each whether it is an event, and since when.
-constexpr platform::ListingRequest eventListing { MontaroEventIdentifierPathComponent, true, true };
+/// Names and flags of the entries. Which of them are events is found out where several threads may wait for a disk.
+constexpr platform::ListingRequest libraryListing { .folderStatus = true };
 
 OBMediaGroupRef makeGroup(
     OBTypeIdentifierRef type, const Text& name, const Text& identifier, const Text& parentID, const OBImageRef& icon)
@@ -43,17 +43,17 @@ std::shared_ptr<const OBMediaObjectKind> clipKind()
         MontaroBundleIdentifier, sharedValues().smallAppIcon.load(), { OBMontaroProjectPathKey } });
 }
 
-std::vector<FoundEvent> eventsInLibrary(const ScanReport& report, const Text& library, const FolderListing& listing)
+/// The folders of a library that may be events.
+std::vector<FoundFolder> foldersInLibrary(const ScanReport& report, const Text& library, const FolderListing& listing)
 {
-    std::vector<FoundEvent> events;
+    std::vector<FoundFolder> folders;
     for (const FolderItem item : listing) {
         if (report.passes(ScanRules::nameIsNotHidden, item, library)
             && report.passes(ScanRules::isVisible, item, library)
-            && report.passes(ScanRules::isEventFolder, item, library)
-            && report.passes(ScanRules::hasEventMarker, item, library))
-            events.push_back({ item.name, Text::joined(library, "/", item.name), item.modificationDate });
+            && report.passes(ScanRules::isEventFolder, item, library))
+            folders.push_back({ item.name, Text::joined(library, "/", item.name) });
     }
-    return events;
+    return folders;
 }
 
 void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newestFirst)
@@ -136,7 +136,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
 {
     if (!path)
         return nullptr;
-    const FolderListing listing = listFolder(path, eventListing);
+    const FolderListing listing = listFolder(path, libraryListing);
     scan.report.found([&] { return ScanFindings::listedFolder(path, listing); });
     if (listing.empty())
         return nullptr;
@@ -146,30 +146,46 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     carrier->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                                         : OBMediaGroup::modDateForFile(path));
 
-    const std::vector<FoundEvent> events = eventsInLibrary(scan.report, path, listing);
-    noteFoldersFound(events.size());
-    std::vector<EventClips> clips(events.size());
-    const auto read = [&](std::size_t index) { clips[index] = clipsOfEvent(events[index].path, scan); };
+    const std::vector<FoundFolder> folders = foldersInLibrary(scan.report, path, listing);
+    noteFoldersFound(folders.size());
+    std::vector<ReadEvent> events(folders.size());
+    const auto read = [&](std::size_t index) { events[index] = readEvent(path, folders[index], scan); };
     const auto take = [&](std::size_t index) {
-        carrier->addChildGroup(eventGroup(path, events[index], std::exchange(clips[index], {}), scan));
+        carrier->addChildGroup(eventGroup(path, folders[index], std::exchange(events[index], {}), scan));
     };
     if (scan.report.isObserved()) {
         // Whoever is told of decisions is told of them in their order.
-        for (std::size_t index = 0; index < events.size(); ++index) {
+        for (std::size_t index = 0; index < folders.size(); ++index) {
             read(index);
             take(index);
         }
     } else {
-        performInOrder(events.size(), read, take);
+        performInOrder(folders.size(), read, take);
     }
     return carrier;
+}
+
+/// Looks into one folder of `library`. Any thread.
+ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& folder, const EventScan& scan)
+{
+    FolderItem item;
+    item.name = folder.name;
+    item.kind = platform::ItemKind::folder;
+    item.flags.container = true;
+    item.marker = _isMTEvent(folder.path) ? platform::MarkerAnswer::present : platform::MarkerAnswer::absent;
+    if (!scan.report.passes(ScanRules::hasEventMarker, item, library))
+        return {};
+    return { true, OBMediaGroup::modDateForFile(folder.path), clipsOfEvent(folder.path, scan) };
 }
 
 /// One event of `library`; null when it has no clips. The flat list shows it all the same where its folder of clips
 /// holds anything at all.
 OBMediaGroupRef OBMontaroPlugin::eventGroup(
-    const Text& library, const FoundEvent& found, const EventClips& clips, EventScan& scan)
+    const Text& library, const FoundFolder& found, const ReadEvent& read, EventScan& scan)
 {
+    if (!read.isEvent)
+        return nullptr;
+    const EventClips& clips = read.clips;
     noteFolderRead(clips.folder, clips.problem);
     if (!clips.hasEntries) {
         scan.report.keptOut([&] { return ScanFindings::eventWithoutClipsFolder(found.path, clips.problem); });
@@ -178,8 +194,7 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
     const OBMediaGroupRef event
         = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
     event->setPath(found.path);
-    event->setModificationDate(
-        found.modificationDate ? found.modificationDate : OBMediaGroup::modDateForFile(found.path));
+    event->setModificationDate(read.modificationDate);
     scan.addToFlatGroups(event);
 
     event->setMediaObjects(clips.clips);

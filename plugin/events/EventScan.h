@@ -29,11 +29,10 @@ struct EventScan {
     }
 };
 
-/// An event folder that was found in a library.
-struct FoundEvent {
+/// A folder of a library.
+struct FoundFolder {
     platform::Text name;
     platform::Text path;
-    std::optional<platform::Date> modificationDate;
 };
 
 /// What the folder of an event's clips held when it was read.
@@ -43,6 +42,13 @@ struct EventClips {
     bool hasEntries = false; ///< of any kind, clips or not
     OBMediaObjectList clips {};
     ClipDates dates {};
+};
+
+/// What a look into a folder of a library told.
+struct ReadEvent {
+    bool isEvent = false;
+    std::optional<platform::Date> modificationDate {};
+    EventClips clips {};
 };
 
 /// The folder in an event in which its clips lie.

@@ -178,7 +178,7 @@ TEST_CASE("clips carry the properties of the file at their path, and neither res
     CHECK(clip->marvexProperties()->valueForKey("kMDItemDurationSeconds").real());
 }
 
-TEST_CASE("a scan lists each library and each folder of clips once, and asks nothing else of what is no link")
+TEST_CASE("a scan lists each library and each folder of clips once, and asks nothing more of a clip that is no link")
 {
     EventMachine machine;
     for (const char* name : { "a.mov", "b.mov" })
@@ -190,7 +190,9 @@ TEST_CASE("a scan lists each library and each folder of clips once, and asks not
     source->_reloadMontaroEvents_updateRootMediaGroup("Montaro", false);
     machine.files.onEachCall = nullptr;
     const std::string library = "DISK/home/Movies/Montaro Events";
-    CHECK(calls.take() == Lines { library, library + "/Trip/Original Media", "/Montaro Events" });
+    CHECK(calls.take()
+        == Lines { library, library + "/Trip/CurrentVersion.mtrevent", library + "/Trip",
+            library + "/Trip/Original Media", "/Montaro Events" });
 }
 
 TEST_CASE("a clip whose recording is dated bears that date as a name, and counts to that year")

@@ -28,12 +28,8 @@ constexpr platform::ListingRequest libraryListing { .folderStatus = true };
 OBMediaGroupRef makeGroup(
     OBTypeIdentifierRef type, const Text& name, const Text& identifier, const Text& parentID, const OBImageRef& icon)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
-    group->setName(name);
-    group->setID(identifier);
-    group->setParentID(parentID);
-    group->setIcon(icon);
-    return group;
+    return OBMediaGroup::withFields(
+        { .typeIdentifier = type, .name = name, .ID = identifier, .parentID = parentID, .icon = icon });
 }
 
 /// What all clips of all events share. They are the editor's own files, so they bear the editor's identifier.

@@ -21,12 +21,11 @@ namespace {
 OBMediaGroupRef makeYearGroup(const Value& year, const OBImageRef& icon)
 {
     const Text name(std::to_string(year.integer() ? *year.integer() : 0));
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(OBMontaroEventCalendarGroupTypeIdentifier);
-    group->setName(name);
-    group->setID(name);
-    group->setParentID(OBMontaro);
-    group->setIcon(icon);
-    return group;
+    return OBMediaGroup::withFields({ .typeIdentifier = OBMontaroEventCalendarGroupTypeIdentifier,
+        .name = name,
+        .ID = name,
+        .parentID = OBMontaro,
+        .icon = icon });
 }
 
 void setYear(OBMediaGroup& group, const Value& year)

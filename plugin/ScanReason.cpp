@@ -39,7 +39,8 @@ ScanReason scanReason(
     if (const std::string name = ScanRules::nameWithLowerCaseExtension(item.name);
         &rule == &ScanRules::hasMovieExtension && !name.empty()
         && fileSystem.linkStatus(platform::pathJoined(platform::pathByRemovingLastComponent(path), name)))
-        reason.remedy = "give it a name that is not taken, and the extension of " + name;
+        reason.remedy
+            = "give it another name, one that is free and ends in ." + std::string(platform::extensionOfName(name));
     return reason;
 }
 

@@ -97,6 +97,16 @@ TEST_CASE("an event is left out without a folder of clips, with an empty one, an
         "nothing in its folder \"Original Media\" is a clip", "put a clip into its folder \"Original Media\"");
 }
 
+TEST_CASE("a movie whose name with the right extension is taken is not advised to take it")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip
+        = machine.projects.project("Trip").movieWithBytes("final.MOV", "").movieWithBytes("final.mov", "");
+    checkUnlisted(machine.answer(trip.moviePath("final.MOV")), "extension",
+        "the extension \"MOV\" is not one of mov, m4v, mp4, 3gp (case matters for project movies)",
+        "give it another name, one that is free and ends in .mov");
+}
+
 TEST_CASE("an extension that no project movie has is named, and only its case is changed where that is enough")
 {
     ExplainedMachine machine;

@@ -198,6 +198,9 @@ TEST_CASE("what was left out is listed on request with the reason")
     CHECK(contains(run.output, machine.library.path("Trip/Shared Items/c.MOV") + "\n    the extension \"MOV\""));
     CHECK(contains(run.output, "\n1 item skipped\n"));
     CHECK(contains(machine.run({ "tree", "Draft", "--skipped" }).output, "\nnothing was skipped\n"));
+    const ProgramRun beside = machine.run({ "tree", "--skipped", "--json" });
+    CHECK(beside.output == machine.run({ "tree", "--json" }).output);
+    CHECK(beside.errors.starts_with("skipped: "));
 }
 
 TEST_CASE("a write that fails is told in one line, and a reader that left is not told of")

@@ -236,6 +236,28 @@ TEST_CASE("paths are read from standard input, each ended by a zero byte")
     CHECK(runProgram(machine.wishes({})).status == 2);
 }
 
+TEST_CASE("an empty path among others is explained as one that lies nowhere")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip = machine.projects.project("Trip").movie("a.mov");
+    RunWishes wishes = machine.wishes({ "-0", "-", "--json" });
+    wishes.inputFile = machine.folder.file("paths", std::string("\0", 1) + trip.path());
+    const ProgramRun run = runProgram(wishes);
+    CHECK(run.status == 0);
+    CHECK(run.output.starts_with("{\"path\":\"\",\"listed\":false,"));
+    CHECK(contains(run.output, "\n{\"path\":\"" + trip.path() + "\",\"listed\":true,"));
+}
+
+TEST_CASE("standard input that cannot be read is a failure, not an end")
+{
+    ExplainedMachine machine;
+    RunWishes wishes = machine.wishes({ "-0", "-" });
+    wishes.inputFile = machine.folder.path();
+    const ProgramRun run = runProgram(wishes);
+    CHECK(run.status == 1);
+    CHECK(run.errors == "ombrix: standard input: it cannot be read\n");
+}
+
 TEST_CASE("in a text the deciding rule is marked, its reason is whole, and lines fit the terminal")
 {
     ExplainedMachine machine;

@@ -66,8 +66,8 @@ private:
 platform::Platform withRoles(
     const platform::Platform& base, platform::Movies& movies, platform::MainRunLoop& mainRunLoop)
 {
-    return { base.fileSystem, base.volumes, base.workspace, base.preferences, base.metadataIndex, movies,
-        base.notifications, base.workspaceNotifications, base.clock, base.calendar, base.threads, mainRunLoop,
+    return { base.fileSystem, base.pathWatching, base.volumes, base.workspace, base.preferences, base.metadataIndex,
+        movies, base.notifications, base.workspaceNotifications, base.clock, base.calendar, base.threads, mainRunLoop,
         base.console, base.bundles, base.languages };
 }
 

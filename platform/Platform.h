@@ -12,6 +12,7 @@ class MainRunLoop;
 class MetadataIndex;
 class Movies;
 class NotificationCenter;
+class PathWatching;
 class Preferences;
 class Threads;
 class Volumes;
@@ -22,6 +23,7 @@ class Workspace;
 /// The roles outlive whoever is handed this bundle, and every thread that was started through `threads`.
 struct Platform {
     FileSystem& fileSystem;
+    PathWatching& pathWatching;
     Volumes& volumes;
     Workspace& workspace;
     Preferences& preferences;

@@ -1,6 +1,8 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -30,6 +32,15 @@ public:
     /// A number that is another one whenever the lists or the names may have changed since it was last asked for, so
     /// that whoever keeps them need not read them again; 0 where that cannot be told. Cheap.
     virtual std::uint64_t generation() const { return 0; }
+
+    /// Calls `changed` after anything was mounted or unmounted, on a thread of its own, until the answer is destroyed.
+    /// Null where that never happens or cannot be noticed. No call is on its way once the answer has been destroyed,
+    /// unless that happens inside `changed`.
+    virtual std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const
+    {
+        static_cast<void>(changed);
+        return nullptr;
+    }
 };
 
 } // namespace platform

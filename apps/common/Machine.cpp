@@ -42,9 +42,9 @@ namespace {
         platform::Platform realPlatform()
         {
             const platform::Platform roles = real.platform();
-            return { roles.fileSystem, roles.volumes, roles.workspace, roles.preferences, roles.metadataIndex,
-                roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock, roles.calendar, threads,
-                roles.mainRunLoop, roles.console, roles.bundles, roles.languages };
+            return { roles.fileSystem, roles.pathWatching, roles.volumes, roles.workspace, roles.preferences,
+                roles.metadataIndex, roles.movies, roles.notifications, roles.workspaceNotifications, roles.clock,
+                roles.calendar, threads, roles.mainRunLoop, roles.console, roles.bundles, roles.languages };
         }
 
         platform::LinuxPlatform real;

@@ -2,6 +2,7 @@
 
 #include "platform/FileProblemText.h"
 #include "platform/PathText.h"
+#include "platform/PathWatching.h"
 #include "platform/Workspace.h"
 #include "platform/common/FileMetadataIndex.h"
 #include "platform/common/FileMovies.h"
@@ -62,6 +63,7 @@ struct DescribedPlatform::Roles {
         : volumes(description, fileSystem, base.volumes)
         , links(description.links, volumes, base.fileSystem.withoutAddedLinks())
         , fileSystem(base.fileSystem.withoutAddedLinks(), links, description.home)
+        , pathWatching(base.pathWatching.withPathsOf(fileSystem, volumes))
         , workspace(description.editorPath)
     {
     }
@@ -69,6 +71,7 @@ struct DescribedPlatform::Roles {
     DescribedVolumes volumes;
     LinkTable links;
     DescribedFileSystem fileSystem;
+    std::unique_ptr<PathWatching> pathWatching;
     DescribedWorkspace workspace;
     FilePreferences preferences { fileSystem };
     FileMovies movies { fileSystem };
@@ -87,6 +90,7 @@ Platform DescribedPlatform::platform() const
 {
     return {
         .fileSystem = _roles->fileSystem,
+        .pathWatching = *_roles->pathWatching,
         .volumes = _roles->volumes,
         .workspace = _roles->workspace,
         .preferences = _roles->preferences,

@@ -6,6 +6,7 @@
 #include "platform/common/LinkTable.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/LocalNotificationCenter.h"
+#include "platform/common/StillPaths.h"
 #include "platform/linux/LinuxBundles.h"
 #include "platform/linux/LinuxCalendar.h"
 #include "platform/linux/LinuxClock.h"
@@ -26,6 +27,7 @@ struct LinuxPlatform::Roles {
     LinuxVolumes volumes { linkedFiles };
     LinkTable links { {}, volumes, realFiles };
     LinkedFileSystem linkedFiles { realFiles, links };
+    StillPaths pathWatching {};
     LinuxWorkspace workspace { linkedFiles };
     FilePreferences preferences { linkedFiles };
     FileMovies movies { linkedFiles };
@@ -50,9 +52,9 @@ LinuxPlatform::~LinuxPlatform() = default;
 
 Platform LinuxPlatform::platform()
 {
-    return { _roles->linkedFiles, _roles->volumes, _roles->workspace, _roles->preferences, _roles->metadataIndex,
-        _roles->movies, _roles->notifications, _roles->workspaceNotifications, _roles->clock, _roles->calendar,
-        _roles->threads, _roles->mainRunLoop, _roles->console, _roles->bundles, _roles->languages };
+    return { _roles->linkedFiles, _roles->pathWatching, _roles->volumes, _roles->workspace, _roles->preferences,
+        _roles->metadataIndex, _roles->movies, _roles->notifications, _roles->workspaceNotifications, _roles->clock,
+        _roles->calendar, _roles->threads, _roles->mainRunLoop, _roles->console, _roles->bundles, _roles->languages };
 }
 
 } // namespace platform

@@ -152,6 +152,7 @@ platform::Platform HostMachine::platform()
     const platform::Platform base = bare.platform();
     return {
         .fileSystem = files,
+        .pathWatching = base.pathWatching,
         .volumes = base.volumes,
         .workspace = base.workspace,
         .preferences = preferences,

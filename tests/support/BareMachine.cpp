@@ -71,6 +71,7 @@ platform::Platform BareMachine::platform()
 {
     return {
         .fileSystem = _files,
+        .pathWatching = pathWatching,
         .volumes = volumes,
         .workspace = workspace,
         .preferences = _preferences,

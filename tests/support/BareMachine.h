@@ -13,6 +13,7 @@
 #include "platform/common/LocalNotificationCenter.h"
 #include "platform/linux/LinuxCalendar.h"
 #include "tests/support/RecordingConsole.h"
+#include "tests/support/ScriptedPathWatching.h"
 #include "tests/support/VirtualClock.h"
 
 #include <optional>
@@ -64,6 +65,7 @@ public:
     ListedVolumes volumes {};
     ListedWorkspace workspace {};
     VirtualClock clock {};
+    ScriptedPathWatching pathWatching {};
     RecordingConsole console {};
     platform::LocalNotificationCenter notifications {};
     platform::LocalNotificationCenter workspaceNotifications {};

@@ -63,8 +63,8 @@ SourceMachine::~SourceMachine()
 
 platform::Platform SourceMachine::platform()
 {
-    return { files, volumes, workspace, preferences, metadataIndex, movies, notifications, workspaceNotifications,
-        clock, calendar, threads, mainRunLoop, console, bundles, languages };
+    return { files, pathWatching, volumes, workspace, preferences, metadataIndex, movies, notifications,
+        workspaceNotifications, clock, calendar, threads, mainRunLoop, console, bundles, languages };
 }
 
 LibraryBuilder SourceMachine::volumeProjects(const std::string& name) const

@@ -17,6 +17,7 @@
 #include "tests/plugin/support/Stop.h"
 #include "tests/support/LibraryBuilder.h"
 #include "tests/support/RecordingConsole.h"
+#include "tests/support/ScriptedPathWatching.h"
 #include "tests/support/TemporaryFolder.h"
 #include "tests/support/VirtualClock.h"
 
@@ -95,6 +96,7 @@ public:
     ScriptedVolumes volumes {};
     ScriptedFileSystem files { _linkedFiles };
     ScriptedWorkspace workspace { trace };
+    ScriptedPathWatching pathWatching {};
 
 private:
     platform::FilePreferences _filePreferences { files };

@@ -1,0 +1,81 @@
+#pragma once
+
+#include "platform/Value.h"
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace platform {
+
+class FileSystem;
+class Volumes;
+
+/// What was seen to happen at or below a watched path.
+struct PathChange {
+    enum class Kind : std::uint8_t {
+        appeared, ///< an entry is new in its folder: made there, moved there, or renamed to this
+        disappeared, ///< an entry is gone from its folder: deleted, moved away, or renamed from this
+        found, ///< an entry that was in a folder when that had just appeared; tells nothing to who lists that folder
+        contentChanged, ///< a file was written to, and closed or left alone for a while
+        arrivalEnded, ///< a file that was still being written when it appeared has been closed
+        attributesChanged, ///< permissions or times of a folder were set
+        folderChanged, ///< entries directly in a folder changed; which is not known
+        anythingChanged, ///< of all that is at or below `path` nothing is known any more
+    };
+
+    Kind kind = Kind::anythingChanged;
+    bool isFolder = false; ///< of an entry: whether it is a folder, links not followed
+    bool heldMore = false; ///< of a folder that disappeared: it left with what was in it
+    std::string path {}; ///< begins with the watched path as it was spelled
+};
+
+/// Why some folders are not followed by the kernel's own reports.
+struct WatchingProblem {
+    std::string path; ///< the first folder that it concerns
+    std::string cause; ///< half a sentence, as in "the kernel's limit of watches (8192) is used up"
+    std::string remedy; ///< the command that mends it; empty when none does
+};
+
+/// How much is followed, and how.
+struct WatchingState {
+    std::uint64_t watchedFolders = 0; ///< by the kernel's reports
+    std::uint64_t polledFolders = 0; ///< by looking at their change times
+};
+
+/// Who hears of one watched path. The calls come on the watcher's own threads, one at a time, and must return soon.
+struct PathWatchHandlers {
+    std::function<void(const PathChange&)> changed;
+    /// Everything at and below the path is followed from now on. Not called before `watch` has returned.
+    std::function<void()> stands {};
+    std::function<void(const WatchingProblem&)> failed {};
+};
+
+/// Follows what happens to folders and files. Any thread.
+///
+/// A folder is followed with everything below it, links not followed. A path is spelled as the file system takes it;
+/// links on the way to it are followed, and watched. It need not exist: it is awaited. No descriptor stays open below
+/// a mount point, and nothing is done while nothing changes, except to look at polled folders.
+class PathWatching {
+public:
+    virtual ~PathWatching() = default;
+
+    /// The time that a change made now would bear as the change time of its folder.
+    virtual Date timeOfChangesNow() const = 0;
+
+    /// Follows `path` until the answer is destroyed; no handler is called once that has returned, unless it is
+    /// destroyed inside a handler, and it must not be destroyed under a lock that a handler takes. Answers at once. A
+    /// folder at or below it that changed at `since` or later, before it was followed, counts as a change of anything.
+    virtual std::shared_ptr<void> watch(std::string_view path, Date since, PathWatchHandlers handlers) = 0;
+
+    virtual WatchingState state() const = 0;
+
+    /// The same machine watched by the paths of `files`, for a machine laid over this one. Both arguments outlive the
+    /// answer.
+    virtual std::unique_ptr<PathWatching> withPathsOf(const FileSystem& files, const Volumes& volumes) const = 0;
+};
+
+} // namespace platform

@@ -45,7 +45,7 @@ std::string remedyOfProblem(FileProblem problem, std::string_view folder)
 
 } // namespace
 
-OBScanDecision ScanFindings::searchedLibrary(
+OBScanDecision findings::searchedLibrary(
     std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome)
 {
     const std::string_view volume = platform::pathByRemovingLastComponent(path) == "/" ? "boot volume" : "volume";
@@ -56,7 +56,7 @@ OBScanDecision ScanFindings::searchedLibrary(
     return decision;
 }
 
-OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform::FolderListing& listing)
+OBScanDecision findings::listedFolder(std::string_view path, const platform::FolderListing& listing)
 {
     if (listing.problem() == FileProblem::none || !listing.empty())
         return finding("listing", path, "it holds " + entriesText(listing.size()));
@@ -67,26 +67,26 @@ OBScanDecision ScanFindings::listedFolder(std::string_view path, const platform:
     return decision;
 }
 
-OBScanDecision ScanFindings::noProject(std::string_view path, std::string_view reason)
+OBScanDecision findings::noProject(std::string_view path, std::string_view reason)
 {
     return finding("project", path, std::string(reason) + "; it is taken for no project");
 }
 
-OBScanDecision ScanFindings::moviesFolder(std::string_view path, std::size_t entries)
+OBScanDecision findings::moviesFolder(std::string_view path, std::size_t entries)
 {
     OBScanDecision decision = finding("movies folder", path, "it holds " + entriesText(entries));
     decision.itself = "a folder of movies is shown as its project";
     return decision;
 }
 
-OBScanDecision ScanFindings::clipsFolder(std::string_view path, std::size_t entries)
+OBScanDecision findings::clipsFolder(std::string_view path, std::size_t entries)
 {
     OBScanDecision decision = finding("clips folder", path, "it holds " + entriesText(entries));
     decision.itself = "a folder of clips is shown as its event";
     return decision;
 }
 
-OBScanDecision ScanFindings::eventWithoutClipsFolder(std::string_view path, FileProblem problem)
+OBScanDecision findings::eventWithoutClipsFolder(std::string_view path, FileProblem problem)
 {
     const bool isMissing = problem == FileProblem::missing || problem == FileProblem::notAFolder;
     OBScanDecision decision = finding("clips folder", path,
@@ -101,7 +101,7 @@ OBScanDecision ScanFindings::eventWithoutClipsFolder(std::string_view path, File
     return decision;
 }
 
-OBScanDecision ScanFindings::eventWithoutClips(std::string_view path)
+OBScanDecision findings::eventWithoutClips(std::string_view path)
 {
     OBScanDecision decision = finding("clips", path, "nothing in its folder \"Original Media\" is a clip");
     decision.passed = false;
@@ -109,12 +109,12 @@ OBScanDecision ScanFindings::eventWithoutClips(std::string_view path)
     return decision;
 }
 
-OBScanDecision ScanFindings::linkedClip(std::string_view path, std::string_view target, bool exists)
+OBScanDecision findings::linkedClip(std::string_view path, std::string_view target, bool exists)
 {
     return finding("link", path, "it leads to " + std::string(target) + (exists ? "" : ", where nothing is"));
 }
 
-OBScanDecision ScanFindings::yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded)
+OBScanDecision findings::yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded)
 {
     const std::string_view origin = isRecorded ? ", when it was recorded" : ", the earlier of birth and modification";
     return finding("year", path,

@@ -7,7 +7,7 @@
 #include <string_view>
 
 /// What a scan finds at a path beyond the rules for single items, in the words of an explanation.
-namespace ScanFindings {
+namespace findings {
 
 /// A library is searched; it is one of `count` for `what` ("projects" or "events"), and the home folder's when
 /// `isInHome`.
@@ -35,4 +35,4 @@ OBScanDecision linkedClip(std::string_view path, std::string_view target, bool e
 /// is -1.
 OBScanDecision yearOfClip(std::string_view path, int year, std::string_view date, bool isRecorded);
 
-} // namespace ScanFindings
+} // namespace findings

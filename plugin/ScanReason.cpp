@@ -36,8 +36,8 @@ ScanReason scanReason(
             return { "it is a symbolic link that leads nowhere", rule.remedyOfDeadLink };
     }
     ScanReason reason = rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
-    if (const std::string name = ScanRules::nameWithLowerCaseExtension(item.name);
-        &rule == &ScanRules::hasMovieExtension && !name.empty()
+    if (const std::string name = rules::nameWithLowerCaseExtension(item.name); &rule == &rules::hasMovieExtension
+        && !name.empty()
         && fileSystem.linkStatus(platform::pathJoined(platform::pathByRemovingLastComponent(path), name)))
         reason.remedy
             = "give it another name, one that is free and ends in ." + std::string(platform::extensionOfName(name));
@@ -58,7 +58,7 @@ ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, co
     return rule.failure;
 }
 
-ScanReason ScanRules::reasonOfExtension(std::string_view name)
+ScanReason rules::reasonOfExtension(std::string_view name)
 {
     const std::string_view extension = platform::extensionOfName(name);
     if (extension.empty())
@@ -69,7 +69,7 @@ ScanReason ScanRules::reasonOfExtension(std::string_view name)
         renamed.empty() ? std::string(hasMovieExtension.failure.remedy) : "rename it to " + renamed };
 }
 
-std::string ScanRules::nameWithLowerCaseExtension(std::string_view name)
+std::string rules::nameWithLowerCaseExtension(std::string_view name)
 {
     const std::string lower = lowerCase(platform::extensionOfName(name));
     const bool isOnlyCase = std::find(movieExtensions.begin(), movieExtensions.end(), lower) != movieExtensions.end();

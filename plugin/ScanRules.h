@@ -47,7 +47,7 @@ struct ScanRule {
     ScanReason (*failureOf)(const platform::FolderItem& item) = nullptr;
 };
 
-namespace ScanRules {
+namespace rules {
 
 /// The extensions of movies that a project was shared as. Case matters.
 inline constexpr std::array<std::string_view, 4> movieExtensions { "mov", "m4v", "mp4", "3gp" };
@@ -146,4 +146,4 @@ inline constexpr ScanRule isContainer { .name = "folder",
         return isContainer.failure;
     } };
 
-} // namespace ScanRules
+} // namespace rules

@@ -116,12 +116,12 @@ EventClips OBMontaroPlugin::ClipReader::read()
 {
     if (!_result.hasEntries)
         return std::move(_result);
-    _scan.report.found([&] { return ScanFindings::clipsFolder(_result.folder, _listing.size()); });
+    _scan.report.found([&] { return findings::clipsFolder(_result.folder, _listing.size()); });
     _realFolder = realFolder();
     _plainClips.reserve(_listing.size());
     std::string path(_realFolder);
     for (const FolderItem item : _listing) {
-        if (!_scan.report.passes(ScanRules::nameIsNotHidden, item, _result.folder))
+        if (!_scan.report.passes(rules::nameIsNotHidden, item, _result.folder))
             continue;
         if (item.kind == ItemKind::symbolicLink) {
             takeLink(item);
@@ -131,8 +131,8 @@ EventClips OBMontaroPlugin::ClipReader::read()
         path.append(1, '/').append(item.name);
         if (_realFolder != _result.folder)
             _scan.report.linkFollowed([&] { return entryPath(item.name); }, path);
-        if (_scan.report.passes(ScanRules::isVisible, item, _result.folder)
-            && _scan.report.passes(ScanRules::isNoFolder, item, _result.folder))
+        if (_scan.report.passes(rules::isVisible, item, _result.folder)
+            && _scan.report.passes(rules::isNoFolder, item, _result.folder))
             take({ item.name, path, item.facts, false, item.kind == ItemKind::file });
     }
     addPlainClips();
@@ -155,13 +155,13 @@ void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
     const platform::FileSystem& files = _plugin.platform().fileSystem;
     const std::string path = files.resolvedPath(entryPath(link.name));
     _scan.report.linkFollowed([&] { return entryPath(link.name); }, path);
-    _scan.report.found([&] { return ScanFindings::linkedClip(entryPath(link.name), path, files.exists(path)); });
+    _scan.report.found([&] { return findings::linkedClip(entryPath(link.name), path, files.exists(path)); });
     FolderItem target;
     target.name = link.name;
     target.kind = link.kind;
     target.flags = files.itemFlags(path);
-    if (!_scan.report.passes(ScanRules::targetIsVisible, target, _result.folder)
-        || !_scan.report.passes(ScanRules::targetIsNoFolder, target, _result.folder))
+    if (!_scan.report.passes(rules::targetIsVisible, target, _result.folder)
+        || !_scan.report.passes(rules::targetIsNoFolder, target, _result.folder))
         return;
     std::optional<platform::FileFacts> facts;
     if (const auto status = files.status(path))
@@ -184,7 +184,7 @@ void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
     _scan.report.foundRecord(path, [&] {
         const platform::Calendar& calendar = _plugin.platform().calendar;
         const std::string date = year.date ? calendar.textOfDate(*year.date, dateFormat) : std::string();
-        return ScanFindings::yearOfClip(path(), year.year, date, year.isRecorded);
+        return findings::yearOfClip(path(), year.year, date, year.isRecorded);
     });
 }
 

@@ -44,9 +44,8 @@ std::vector<FoundFolder> foldersInLibrary(const ScanReport& report, const Text& 
 {
     std::vector<FoundFolder> folders;
     for (const FolderItem item : listing) {
-        if (report.passes(ScanRules::nameIsNotHidden, item, library)
-            && report.passes(ScanRules::isVisible, item, library)
-            && report.passes(ScanRules::isEventFolder, item, library))
+        if (report.passes(rules::nameIsNotHidden, item, library) && report.passes(rules::isVisible, item, library)
+            && report.passes(rules::isEventFolder, item, library))
             folders.push_back({ item.name, Text::joined(library, "/", item.name) });
     }
     return folders;
@@ -108,8 +107,7 @@ void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& sca
         const Text& path = (*paths)[index];
         scan.report.libraryBegan(path);
         scan.report.found([&] {
-            return ScanFindings::searchedLibrary(
-                path, "events", index, count, path == _MontaroDefaultEventsFolderPath());
+            return findings::searchedLibrary(path, "events", index, count, path == _MontaroDefaultEventsFolderPath());
         });
         if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
             carrier->setParentID(OBMontaro);
@@ -133,7 +131,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     if (!path)
         return nullptr;
     const FolderListing listing = listFolder(path, libraryListing);
-    scan.report.found([&] { return ScanFindings::listedFolder(path, listing); });
+    scan.report.found([&] { return findings::listedFolder(path, listing); });
     if (listing.empty())
         return nullptr;
     const OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
@@ -169,7 +167,7 @@ ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& fol
     item.kind = platform::ItemKind::folder;
     item.flags.container = true;
     item.marker = _isMTEvent(folder.path) ? platform::MarkerAnswer::present : platform::MarkerAnswer::absent;
-    if (!scan.report.passes(ScanRules::hasEventMarker, item, library))
+    if (!scan.report.passes(rules::hasEventMarker, item, library))
         return {};
     return { true, OBMediaGroup::modDateForFile(folder.path), clipsOfEvent(folder.path, scan) };
 }
@@ -184,7 +182,7 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
     const EventClips& clips = read.clips;
     noteFolderRead(clips.folder, clips.problem);
     if (!clips.hasEntries) {
-        scan.report.keptOut([&] { return ScanFindings::eventWithoutClipsFolder(found.path, clips.problem); });
+        scan.report.keptOut([&] { return findings::eventWithoutClipsFolder(found.path, clips.problem); });
         return nullptr;
     }
     const OBMediaGroupRef event
@@ -196,7 +194,7 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
     event->setMediaObjects(clips.clips);
     noteItemsFound(clips.clips.size());
     if (clips.clips.empty()) {
-        scan.report.keptOut([&] { return ScanFindings::eventWithoutClips(found.path); });
+        scan.report.keptOut([&] { return findings::eventWithoutClips(found.path); });
         return nullptr;
     }
     setAttributesOfClips(*event, clips.dates, _mostRecentEventFirst);

@@ -39,12 +39,12 @@ std::shared_ptr<const OBMediaObjectKind> movieKind(const OBMontaroPlugin& plugin
 /// What is no project is not left out for that.
 bool isProject(const OBMontaroPlugin& plugin, const ScanReport& report, const FolderItem& item, const Text& folder)
 {
-    if (ScanRules::hasProjectMarker.passes(item))
-        return report.passes(ScanRules::hasProjectMarker, item, folder);
+    if (rules::hasProjectMarker.passes(item))
+        return report.passes(rules::hasProjectMarker, item, folder);
     report.found([&] {
         const std::string path = platform::pathJoined(folder, item.name);
-        return ScanFindings::noProject(
-            path, reasonOfMarker(plugin.platform().fileSystem, ScanRules::hasProjectMarker, path).text);
+        return findings::noProject(
+            path, reasonOfMarker(plugin.platform().fileSystem, rules::hasProjectMarker, path).text);
     });
     return false;
 }
@@ -69,7 +69,7 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
             const Text& path = (*paths)[index];
             scan.report.libraryBegan(path);
             scan.report.found([&] {
-                return ScanFindings::searchedLibrary(path, "projects", index, count, path == _MontaroDefaultPath());
+                return findings::searchedLibrary(path, "projects", index, count, path == _MontaroDefaultPath());
             });
             if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
                 library->setName(localizedString("MontaroProjectLibrary"));
@@ -118,21 +118,21 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
         listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                : OBMediaGroup::modDateForFile(path) });
     if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
-        scan.report.found([&] { return ScanFindings::listedFolder(path, listing); });
+        scan.report.found([&] { return findings::listedFolder(path, listing); });
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
     }
 
     noteFoldersFound(listing.size());
-    scan.report.found([&] { return ScanFindings::listedFolder(listed, listing); });
+    scan.report.found([&] { return findings::listedFolder(listed, listing); });
     for (const FolderItem item : listing) {
-        if (!scan.report.passes(ScanRules::nameIsNotHidden, item, listed)
-            || !scan.report.passes(ScanRules::isVisible, item, listed))
+        if (!scan.report.passes(rules::nameIsNotHidden, item, listed)
+            || !scan.report.passes(rules::isVisible, item, listed))
             continue;
         if (isProject(*this, scan.report, item, listed)) {
             folder->addChildGroup(projectGroup(listed, listing, item, scan));
-        } else if (scan.report.passes(ScanRules::isContainer, item, listed)
-            && scan.report.passes(ScanRules::isNotPackage, item, listed)) {
+        } else if (scan.report.passes(rules::isContainer, item, listed)
+            && scan.report.passes(rules::isNotPackage, item, listed)) {
             const OBMediaGroupRef subfolder
                 = _createMontaroProjectsFolderForPath(Text::joined(listed, "/", item.name), scan);
             subfolder->setParentID(folder->ID());

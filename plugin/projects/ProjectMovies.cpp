@@ -55,7 +55,7 @@ SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& re
     movies.listing = manager.listFolder(movies.folder(), {});
     movies.project.pathIsReal = movies.listing.pathIsReal();
     if (movies.listing.empty())
-        report.found([&] { return ScanFindings::listedFolder(movies.folder(), movies.listing); });
+        report.found([&] { return findings::listedFolder(movies.folder(), movies.listing); });
     movies.take(report, movies.listing);
     return movies;
 }

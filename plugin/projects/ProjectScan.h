@@ -52,11 +52,11 @@ struct SharedMovies {
     {
         const std::string place = report.isObserved() ? folder() : std::string();
         if (items.size() != 0)
-            report.found([&] { return ScanFindings::moviesFolder(place, items.size()); });
+            report.found([&] { return findings::moviesFolder(place, items.size()); });
         files.reserve(items.size());
         for (std::size_t index = 0; index < items.size(); ++index) {
             const platform::FolderItem item = items[index];
-            if (report.passes(ScanRules::hasMovieExtension, item, place))
+            if (report.passes(rules::hasMovieExtension, item, place))
                 files.push_back({ item.name, item.kind == platform::ItemKind::file });
         }
     }

@@ -1,6 +1,7 @@
 #pragma once
 
-#include <chrono>
+#include "tests/support/Turns.h"
+
 #include <condition_variable>
 #include <cstddef>
 #include <functional>
@@ -9,9 +10,6 @@
 #include <vector>
 
 namespace tests {
-
-/// How long a test waits for what never comes; nothing that works gets near it.
-inline constexpr std::chrono::seconds longestWait { 60 };
 
 /// Something that happens once. Any thread.
 class Event {

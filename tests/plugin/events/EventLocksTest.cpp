@@ -4,7 +4,6 @@
 #include <doctest/doctest.h>
 
 #include <algorithm>
-#include <chrono>
 #include <memory>
 #include <set>
 #include <thread>
@@ -19,24 +18,6 @@ constexpr int manyEvents = 20;
 std::string nameOfEvent(int number)
 {
     return std::string(1, static_cast<char>('A' + number));
-}
-
-/// Waits until `isSo`, for as long as a test may.
-template <class Condition> bool waitUntil(const Condition& isSo)
-{
-    const auto end = std::chrono::steady_clock::now() + longestWait;
-    while (!isSo()) {
-        if (std::chrono::steady_clock::now() > end)
-            return false;
-        std::this_thread::yield();
-    }
-    return true;
-}
-
-void giveOthersTheirTurn()
-{
-    for (int turn = 0; turn < 1000; ++turn)
-        std::this_thread::yield();
 }
 
 /// Stops whoever lists the folder whose path ends so, and notes what is listed.

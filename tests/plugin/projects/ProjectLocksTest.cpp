@@ -2,7 +2,6 @@
 
 #include <doctest/doctest.h>
 
-#include <chrono>
 #include <thread>
 
 using namespace tests;
@@ -25,12 +24,8 @@ void traceListings(SourceMachine& machine, Trace& listed)
 /// chance to go on where it should not.
 void waitForEmptyList(OBMontaroPlugin& source)
 {
-    const auto end = std::chrono::steady_clock::now() + longestWait;
-    while (!source.mediaGroups().empty() && std::chrono::steady_clock::now() < end)
-        std::this_thread::yield();
-    CHECK(source.mediaGroups().empty());
-    for (int turn = 0; turn < 1000; ++turn)
-        std::this_thread::yield();
+    CHECK(waitUntil([&] { return source.mediaGroups().empty(); }));
+    giveOthersTheirTurn();
 }
 
 /// All that takes one of the locks other than the one of the project search paths.

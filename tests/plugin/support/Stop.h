@@ -1,13 +1,11 @@
 #pragma once
 
-#include <chrono>
+#include "tests/support/Turns.h"
+
 #include <condition_variable>
 #include <mutex>
 
 namespace tests {
-
-/// How long a test waits for what has to happen; only a failure waits that long.
-inline constexpr std::chrono::minutes longestWait { 1 };
 
 /// A place at which the first thread that comes by stops until the test lets it go on. Later ones pass.
 class Stop {

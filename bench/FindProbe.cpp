@@ -82,6 +82,7 @@ void addClips(Library& library, OBMediaGroup& event, const std::shared_ptr<const
         fileNames.push_back(name + ".mov");
     }
     std::vector<OBFileOfFolder> files;
+    files.reserve(fileNames.size());
     for (const std::string& name : fileNames)
         files.push_back({ name, true });
     const std::string folder = "/Events/" + event.name().string() + "/Original Media";

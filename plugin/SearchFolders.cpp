@@ -48,6 +48,7 @@ Text folderInMovies(const platform::Platform& platform, std::string_view folderN
 std::vector<std::string> stringsOf(const std::vector<Text>& texts)
 {
     std::vector<std::string> result;
+    result.reserve(texts.size());
     for (const Text& text : texts)
         result.push_back(text.string());
     return result;

@@ -55,7 +55,7 @@ std::string Style::name(std::string_view bytes) const
 
 std::string Style::bold(std::string_view laidOut, std::string_view path) const
 {
-    const std::string text = drawn(laidOut, "\x1b[1m");
+    std::string text = drawn(laidOut, "\x1b[1m");
     if (!_hasLinks || path.empty())
         return text;
     static const std::string host = hostName();

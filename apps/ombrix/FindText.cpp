@@ -41,7 +41,7 @@ namespace {
         std::size_t around = hit.object ? hit.group : found.groups[hit.group].parent;
         std::string place = shownName(*found.groups[around].group, style);
         for (around = found.groups[around].parent; around != 0; around = found.groups[around].parent)
-            place = shownName(*found.groups[around].group, style) + std::string(below) + place;
+            place.insert(0, below).insert(0, shownName(*found.groups[around].group, style));
         return place;
     }
 
@@ -58,7 +58,7 @@ namespace {
     /// The path as far as there is room behind `column`; empty where that is too little to be of use.
     std::string pathBehind(int column, const Row& row, const Program& program)
     {
-        const std::string path = program.style().name(row.path);
+        std::string path = program.style().name(row.path);
         if (!program.columns())
             return path;
         const int room = *program.columns() - column;

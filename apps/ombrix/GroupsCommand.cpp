@@ -20,7 +20,7 @@ namespace {
         std::string name;
         std::string kind;
         std::string count;
-        std::string ID;
+        std::string identifier;
     };
 
     Row rowOf(const OBMediaGroup& group, const apps::Style& style)
@@ -52,7 +52,7 @@ namespace {
             line.add(name + gap, row.kind, TextLine::Look::dim);
             line.add(countEnd - apps::displayWidth(row.count), row.count, TextLine::Look::dim);
             // It is there to be typed again, so it is longer than the line rather than cut.
-            program.printLine(line.text() + std::string(gap, ' ') + program.style().plain(row.ID));
+            program.printLine(line.text() + std::string(gap, ' ') + program.style().plain(row.identifier));
         }
     }
 

@@ -157,8 +157,7 @@ std::string Program::unreadFoldersText()
     const std::vector<OBLoadProblem> problems = manager()->loadProblems();
     if (problems.empty())
         return {};
-    const std::string first
-        = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
+    std::string first = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
     if (problems.size() == 1)
         return first;
     return std::to_string(problems.size()) + " folders could not be read, the first: " + first;

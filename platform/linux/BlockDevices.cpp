@@ -119,7 +119,7 @@ std::string BlockDevices::label(const Mount& mount) const
     const std::string folder = _folders.dev + "/disk/by-label";
     const std::string source = pathOfSource(mount.source);
     for (const std::string& name : namesInFolder(folder)) {
-        const std::string target = realPath(folder + '/' + name);
+        const std::string target = realPath(pathJoined(folder, name));
         if (target.empty())
             continue;
         if (target == source || (mount.device.major != 0 && isDevice(target, mount.device)))
@@ -142,8 +142,7 @@ std::string BlockDevices::pathOfSource(std::string_view source) const
 std::string BlockDevices::systemFolderOf(const Mount& mount) const
 {
     const std::string number = std::to_string(mount.device.major) + ':' + std::to_string(mount.device.minor);
-    const std::string folder
-        = mount.device.major == 0 ? std::string() : realPath(_folders.sys + "/dev/block/" + number);
+    std::string folder = mount.device.major == 0 ? std::string() : realPath(_folders.sys + "/dev/block/" + number);
     if (!folder.empty())
         return folder;
     const std::string device = pathOfSource(mount.source);

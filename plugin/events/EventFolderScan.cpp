@@ -81,8 +81,7 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
     if (isCancelLoadRequestPending())
         return nullptr;
 
-    const OBMediaGroupRef library
-        = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
+    OBMediaGroupRef library = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
     groupEventsByYear(*library, collected->childGroups(), scan);
     sortEventsWithinYears(*library);
     if (!isCancelLoadRequestPending() && updateRoot) {
@@ -134,7 +133,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     scan.report.found([&] { return findings::listedFolder(path, listing); });
     if (listing.empty())
         return nullptr;
-    const OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
+    OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
         localizedString("MontaroEventLibrary"), path, path, scan.calendarIcon);
     carrier->setPath(path);
     carrier->setModificationDate(listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
@@ -185,7 +184,7 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
         scan.report.keptOut([&] { return findings::eventWithoutClipsFolder(found.path, clips.problem); });
         return nullptr;
     }
-    const OBMediaGroupRef event
+    OBMediaGroupRef event
         = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
     event->setPath(found.path);
     event->setModificationDate(read.modificationDate);

@@ -113,7 +113,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
     // A folder may be known to people by a name with an extension that it does not have on disk.
     Text listed = path;
     FolderListing listing = listFolder(path, projectListing);
-    const OBMediaGroupRef folder = OBMediaGroup::withFields({ OBMontaroFolderGroupTypeIdentifier, name, path,
+    OBMediaGroupRef folder = OBMediaGroup::withFields({ OBMontaroFolderGroupTypeIdentifier, name, path,
         platform::pathByRemovingLastComponent(path), path, scan.projectIcon,
         listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                : OBMediaGroup::modDateForFile(path) });
@@ -157,7 +157,7 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
     const Text& listedFolder, const FolderListing& listing, const FolderItem& item, ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
-    const OBMediaGroupRef project = OBMediaGroup::withFields(
+    OBMediaGroupRef project = OBMediaGroup::withFields(
         { OBMontaroProjectGroupTypeIdentifier, platform::nameWithoutExtension(item.name), path, listedFolder, path,
             scan.projectIcon, item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path) });
     scan.addToFlatGroups(project);

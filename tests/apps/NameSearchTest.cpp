@@ -14,7 +14,7 @@ namespace {
 
 OBMediaGroupRef makeGroup(const std::string& name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(OBMontaroFolderGroupTypeIdentifier);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(OBMontaroFolderGroupTypeIdentifier);
     group->setName(name);
     group->setID(name);
     return group;
@@ -28,6 +28,7 @@ OBMediaObjectRef makeObject(const std::string& name)
 OBMediaObjectList makeBatch(const std::vector<std::string>& fileNames)
 {
     std::vector<OBFileOfFolder> files;
+    files.reserve(fileNames.size());
     for (const std::string& name : fileNames)
         files.push_back({ name, true });
     return OBMediaObjectBatch::objects(std::make_shared<OBMediaObjectKind>(), { "/folder", true }, files);

@@ -17,7 +17,7 @@ namespace {
 
 OBMediaGroupRef makeGroup(OBTypeIdentifierRef type, const std::string& name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
     group->setName(name);
     group->setID(name);
     return group;
@@ -26,7 +26,7 @@ OBMediaGroupRef makeGroup(OBTypeIdentifierRef type, const std::string& name)
 /// A root with `folders` folders of `projects` projects each, and an empty events library.
 OBMediaGroupRef makeTree(int folders, int projects)
 {
-    const OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
+    OBMediaGroupRef root = makeGroup(OBMontaroRootGroupTypeIdentifier, "Montaro");
     for (int folder = 0; folder < folders; ++folder) {
         const OBMediaGroupRef group = makeGroup(OBMontaroFolderGroupTypeIdentifier, "Folder " + std::to_string(folder));
         for (int project = 0; project < projects; ++project)
@@ -201,7 +201,7 @@ TEST_CASE("a command that unfolds is never cut, and the lines of the terminal th
         const apps::Style style { apps::StyleWishes() };
         TreeTextWishes wishes { style, columns };
         wishes.emptyMessage = [](const OBMediaGroupRef&) { return platform::Text(); };
-        wishes.unfoldingCommand = [&](const OBMediaGroupRef&) { return command; };
+        wishes.unfoldingCommand = [&](const OBMediaGroupRef&) { return std::string(command); };
         std::string text;
         std::size_t height = 0;
         const std::size_t told = printTreeText(nodes, lines, wishes, [&](std::string_view line) {

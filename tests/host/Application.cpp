@@ -88,10 +88,10 @@ struct Request::State {
     std::thread::id thread;
 };
 
-Request::Request(OBMediaManager& manager, OBExecutor executor)
+Request::Request(OBMediaManager& manager, const OBExecutor& executor)
     : _state(std::make_shared<State>())
 {
-    manager.requestRootMediaGroup(std::move(executor), [state = _state](OBLoadResult result) {
+    manager.requestRootMediaGroup(executor, [state = _state](OBLoadResult result) {
         state->result = std::move(result);
         state->thread = std::this_thread::get_id();
         CHECK_FALSE(state->answered.hasHappened());

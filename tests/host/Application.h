@@ -39,7 +39,7 @@ private:
 /// One request for a tree, and its answer.
 class Request {
 public:
-    explicit Request(OBMediaManager& manager, OBExecutor executor = inPlace());
+    explicit Request(OBMediaManager& manager, const OBExecutor& executor = inPlace());
 
     bool isAnswered() const;
     /// Waits for the answer. Where none comes within the longest wait, the test fails and a default one is answered.

@@ -161,6 +161,7 @@ TEST_CASE("requests and cancels from many threads at once are each answered")
     TestHost test;
     const auto manager = test.manager();
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int number = 0; number < 4; ++number) {
         threads.emplace_back([&manager, number] {
             for (int round = 0; round < 50; ++round) {

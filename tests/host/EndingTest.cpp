@@ -141,8 +141,7 @@ TEST_CASE("a manager may be dropped inside its own callback, on the application'
         const OBObservation listening
             = alive.observe(onLoadThread ? inPlace() : application.executor(), std::move(callbacks));
         const Request request(alive);
-        if (!onLoadThread)
-            CHECK(application.runUntil([&dropped] { return dropped.load(); }));
+        CHECK((onLoadThread || application.runUntil([&dropped] { return dropped.load(); })));
         request.answer();
         CHECK(test.host().waitForThreads(longestWait));
         CHECK(dropped);

@@ -180,6 +180,7 @@ TEST_CASE("loads of one manager run one at a time")
     };
     const auto manager = test.manager();
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int number = 0; number < 4; ++number) {
         threads.emplace_back([&manager] {
             for (int round = 0; round < 20; ++round) {

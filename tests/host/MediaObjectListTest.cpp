@@ -234,6 +234,7 @@ TEST_CASE("the object to which a byte of the file names belongs is found, howeve
     for (std::size_t index = 0; index < 200; ++index)
         names.emplace_back(index < 150 ? 1 : 60, 'n');
     std::vector<OBFileOfFolder> files;
+    files.reserve(names.size());
     for (const std::string& name : names)
         files.push_back({ name, true });
     const OBMediaObjectList list

@@ -168,6 +168,7 @@ TEST_CASE("many threads may register with the path watcher at once")
     OBPathWatcher watcher;
     Listener listener;
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int number = 0; number < 4; ++number) {
         threads.emplace_back([&watcher, &listener, number] {
             for (int index = 0; index < 100; ++index) {

@@ -149,6 +149,7 @@ TEST_CASE("many threads that ask at once are all answered by one load")
     const auto manager = test.manager();
     std::vector<std::thread> threads;
     std::vector<std::string> names(8);
+    threads.reserve(names.size());
     for (std::string& name : names)
         threads.emplace_back([&] { name = nameOf(Request(*manager).answer().rootMediaGroup); });
     for (std::thread& thread : threads)

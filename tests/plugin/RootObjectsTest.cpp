@@ -13,7 +13,7 @@ namespace {
 
 OBMediaGroupRef groupOfType(OBTypeIdentifierRef type, const char* name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
     group->setName(name);
     return group;
 }
@@ -21,6 +21,7 @@ OBMediaGroupRef groupOfType(OBTypeIdentifierRef type, const char* name)
 OBMediaObjectList objectsNamed(const std::vector<const char*>& names)
 {
     std::vector<OBMediaObjectRef> objects;
+    objects.reserve(names.size());
     for (const char* name : names)
         objects.push_back(OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, name));
     return OBMediaObjectList(objects);

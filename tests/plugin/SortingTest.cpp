@@ -13,7 +13,7 @@ namespace {
 
 OBMediaGroupRef groupOfType(OBTypeIdentifierRef type, const platform::Text& name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
     group->setName(name);
     return group;
 }

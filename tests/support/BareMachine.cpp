@@ -12,6 +12,7 @@ namespace {
     std::vector<std::string> pathsOf(const std::vector<ListedVolumes::Volume>& volumes)
     {
         std::vector<std::string> paths;
+        paths.reserve(volumes.size());
         for (const ListedVolumes::Volume& volume : volumes)
             paths.push_back(volume.path);
         return paths;

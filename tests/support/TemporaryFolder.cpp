@@ -109,7 +109,7 @@ std::string TemporaryFolder::link(std::string_view relativePath, const std::stri
 
 std::string TemporaryFolder::pipe(std::string_view relativePath) const
 {
-    const std::string pipePath = path(relativePath);
+    std::string pipePath = path(relativePath);
     makeFolder(std::string(platform::pathByRemovingLastComponent(pipePath)));
     if (mkfifo(pipePath.c_str(), S_IRUSR | S_IWUSR) != 0)
         cannotArrange("made", pipePath);

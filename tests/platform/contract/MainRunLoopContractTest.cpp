@@ -59,9 +59,10 @@ TEST_CASE_TEMPLATE("on the main thread a call that is waited for runs at once", 
 {
     Loop loop;
     std::string order;
+    const auto atOnce = [&order] { order += "at once "; };
     loop.post([&] {
         loop.post([&order] { order += "posted "; });
-        CHECK(loop.performAndWait([&order] { order += "at once "; }));
+        CHECK(loop.performAndWait(atOnce));
         loop.post([&loop] { loop.quit(); });
     });
     loop.run();
@@ -164,18 +165,19 @@ TEST_CASE_TEMPLATE("many threads post and wait at once", Loop, platform::LinuxMa
     Loop loop;
     int count = 0;
     std::atomic<int> performed { 0 };
-    std::vector<std::thread> threads;
+    std::vector<std::thread> threads(8);
     std::atomic<int> left { 8 };
-    for (int thread = 0; thread < 8; ++thread) {
-        threads.emplace_back([&] {
-            for (int round = 0; round < 200; ++round) {
-                loop.post([&count] { ++count; });
-                performed += loop.performAndWait([&count] { ++count; }) ? 1 : 0;
-            }
-            if (--left == 0)
-                loop.quit();
-        });
-    }
+    const auto counting = [&count] { ++count; };
+    const auto work = [&] {
+        for (int round = 0; round < 200; ++round) {
+            loop.post(counting);
+            performed += loop.performAndWait(counting) ? 1 : 0;
+        }
+        if (--left == 0)
+            loop.quit();
+    };
+    for (std::thread& thread : threads)
+        thread = std::thread(work);
     loop.run();
     for (std::thread& thread : threads)
         thread.join();

@@ -128,6 +128,7 @@ TEST_CASE_TEMPLATE(
     Center center;
     std::atomic<bool> isOver { false };
     std::vector<std::thread> posters;
+    posters.reserve(3);
     for (int thread = 0; thread < 3; ++thread) {
         posters.emplace_back([&] {
             while (!isOver)

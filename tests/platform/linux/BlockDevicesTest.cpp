@@ -24,14 +24,14 @@ public:
     /// A disk with its place below sys/devices; answers that place.
     std::string disk(const std::string& place, const std::string& number, const std::string& removable = "0") const
     {
-        const std::string folder = "sys/devices/" + place;
+        std::string folder = "sys/devices/" + place;
         temporary.file(folder + "/removable", removable + "\n");
         publish(folder, number);
         return folder;
     }
     std::string partition(const std::string& disk, const std::string& name, const std::string& number) const
     {
-        const std::string folder = disk + "/" + name;
+        std::string folder = disk + "/" + name;
         temporary.file(folder + "/partition", "1\n");
         publish(folder, number);
         return folder;

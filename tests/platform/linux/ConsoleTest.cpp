@@ -38,6 +38,7 @@ TEST_CASE("lines of several threads do not mix, also through a pipe that is full
     {
         StandardErrorConsole console(ends[1]);
         std::vector<std::thread> writers;
+        writers.reserve(threadCount);
         for (int number = 0; number < threadCount; ++number) {
             writers.emplace_back([&, number] {
                 for (int line = 0; line < lineCount; ++line)

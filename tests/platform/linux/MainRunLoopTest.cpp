@@ -35,28 +35,36 @@ private:
 TEST_CASE("who waits before the loop has begun waits for it")
 {
     LinuxMainRunLoop loop;
+    bool wasPerformed = false;
+    bool wasOnMainThread = false;
     std::promise<void> begins;
     std::thread waiter([&] {
         begins.set_value();
-        CHECK(loop.performAndWait([&] { CHECK(loop.isMainThread()); }));
+        wasPerformed = loop.performAndWait([&] { wasOnMainThread = loop.isMainThread(); });
         loop.quit();
     });
     begins.get_future().wait();
     loop.run();
     waiter.join();
+    CHECK(wasPerformed);
+    CHECK(wasOnMainThread);
 }
 
 TEST_CASE("who waits for a loop that is ended before it begins is told so")
 {
     LinuxMainRunLoop loop;
+    bool wasPerformed = true;
+    bool hasRun = false;
     std::promise<void> begins;
     std::thread waiter([&] {
         begins.set_value();
-        CHECK(!loop.performAndWait([] { CHECK(false); }));
+        wasPerformed = loop.performAndWait([&hasRun] { hasRun = true; });
     });
     begins.get_future().wait();
     loop.quit();
     waiter.join();
+    CHECK_FALSE(wasPerformed);
+    CHECK_FALSE(hasRun);
     loop.run();
     CHECK(!loop.isMainThread());
 }
@@ -68,6 +76,7 @@ TEST_CASE("each call that is waited for runs once or not at all, and its thread 
     std::atomic<int> runs { 0 };
     std::atomic<int> answers { 0 };
     std::vector<std::thread> threads;
+    threads.reserve(threadCount);
     for (int number = 0; number < threadCount; ++number) {
         threads.emplace_back([&] {
             while (loop.performAndWait([&] {

@@ -36,7 +36,7 @@ struct Desktop {
     }
     std::string program(const std::string& path) const
     {
-        const std::string file = temporary.file(path);
+        std::string file = temporary.file(path);
         chmod(file.c_str(), 0755);
         return file;
     }

@@ -73,7 +73,7 @@ OBMediaGroupRef reloadCancelledAfterItsWalk(EventMachine& machine, OBMontaroPlug
         walk.release();
         source._prepareMontaroEventsSearchPaths();
     });
-    const OBMediaGroupRef library = source._reloadMontaroEvents();
+    OBMediaGroupRef library = source._reloadMontaroEvents();
     canceller.join();
     machine.files.whenListing = nullptr;
     machine.volumes.whenListed = nullptr;

@@ -23,7 +23,7 @@ std::string nameOfEvent(int number)
 /// Stops whoever lists the folder whose path ends so, and notes what is listed.
 void stopWhenListing(EventMachine& machine, const std::string& end, Stop& stop, Trace& listed)
 {
-    machine.files.whenListing = [&machine, &stop, &listed, end](std::string_view folder) {
+    machine.files.whenListing = [&stop, &listed, end](std::string_view folder) {
         listed.add(std::string(folder));
         if (folder.ends_with(end))
             stop.stopHere();

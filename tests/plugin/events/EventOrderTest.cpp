@@ -31,7 +31,7 @@ struct Given {
 
 OBMediaGroupRef eventOf(const Given& given)
 {
-    const OBMediaGroupRef event = OBMediaGroup::initWithTypeIdentifier(OBMontaroEventGroupTypeIdentifier);
+    OBMediaGroupRef event = OBMediaGroup::initWithTypeIdentifier(OBMontaroEventGroupTypeIdentifier);
     event->setName(given.name);
     Value::Dictionary attributes;
     if (given.year)
@@ -102,6 +102,7 @@ std::vector<OBMediaGroupRef> inYears(const std::vector<OBMediaGroupRef>& events,
 std::string sorted(const std::vector<Given>& events, bool isNewestFirst)
 {
     std::vector<OBMediaGroupRef> groups;
+    groups.reserve(events.size());
     for (const Given& event : events)
         groups.push_back(eventOf(event));
     const OBMediaGroupRef all = OBMediaGroup::initWithTypeIdentifier(OBMontaroRootGroupTypeIdentifier);

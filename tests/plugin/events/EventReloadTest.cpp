@@ -11,7 +11,7 @@ namespace {
 
 OBMediaGroupRef groupOfType(OBTypeIdentifierRef type, const char* name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
     group->setName(name);
     return group;
 }
@@ -33,7 +33,7 @@ OBMediaGroupRef eventsWithClip(const char* name)
     event->setMediaObjects(OBMediaObjectList({ OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "clip") }));
     const OBMediaGroupRef year = groupOfType(OBMontaroEventCalendarGroupTypeIdentifier, "2011");
     year->addChildGroup(event);
-    const OBMediaGroupRef library = events(name);
+    OBMediaGroupRef library = events(name);
     library->addChildGroup(year);
     return library;
 }

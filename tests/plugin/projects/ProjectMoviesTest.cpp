@@ -178,7 +178,7 @@ TEST_CASE("a folder's objects are appended to those it has, and project librarie
         return object;
     };
     const auto groupWith = [&](OBTypeIdentifierRef type, const char* name) {
-        const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+        OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
         group->setName(name);
         group->setMediaObjects(OBMediaObjectList({ movie("1"), movie("2") }));
         return group;

@@ -13,7 +13,7 @@ constexpr const char* editorNotFound = "OBMBMontaroPlugin -- getAppPath -- could
 
 OBMediaGroupRef groupOfType(OBTypeIdentifierRef type, const char* name)
 {
-    const OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
+    OBMediaGroupRef group = OBMediaGroup::initWithTypeIdentifier(type);
     group->setName(name);
     return group;
 }

@@ -156,12 +156,12 @@ TEST_CASE("a folder of projects that may be neither searched nor listed says so 
         == std::vector<std::string> {
             "hidden name | its name does not begin with a full stop",
             "hidden file | no file .hidden names it",
-            "project | it may not be searched, so whether it holds CurrentVersion.mtrproject is not known; it is "
-            "taken for no project",
+            ("project | it may not be searched, so whether it holds CurrentVersion.mtrproject is not known; it is "
+             "taken for no project"),
             "folder | it is a folder",
             "package | it is a plain folder",
-            "listing | what it holds is not listed: permission denied | the folder that holds it cannot be listed: "
-            "permission denied | permit reading the folder that holds it (chmod u+rx)",
+            ("listing | what it holds is not listed: permission denied | the folder that holds it cannot be listed: "
+             "permission denied | permit reading the folder that holds it (chmod u+rx)"),
         });
 }
 

@@ -14,6 +14,7 @@ namespace {
     std::vector<std::string> pathsOf(const std::vector<ScriptedVolumes::Volume>& volumes)
     {
         std::vector<std::string> paths;
+        paths.reserve(volumes.size());
         for (const ScriptedVolumes::Volume& volume : volumes)
             paths.push_back(volume.path);
         return paths;

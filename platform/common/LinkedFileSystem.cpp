@@ -5,12 +5,11 @@
 // path that the kernel follows to its end is right, for what is really on disk wins over a volume's link.
 
 #include "platform/PathText.h"
-#include "platform/common/HiddenList.h"
+#include "platform/common/HiddenNames.h"
 #include "platform/common/LexicalPath.h"
 
 #include <algorithm>
 #include <cstddef>
-#include <unordered_set>
 #include <utility>
 #include <vector>
 
@@ -205,7 +204,8 @@ void LinkedFileSystem::lookThroughLinks(
         = folder.real == folder.spelled ? AddedNames {} : addedNames(_table, folder.real, request.marker);
     if (asSpelled.isEmpty() && onDisk.isEmpty() && !listing.hasLinks())
         return;
-    bool hiddenNamesAreLinked = contains(asSpelled.links, hiddenNamesFile) || contains(onDisk.links, hiddenNamesFile);
+    bool hiddenNamesAreLinked
+        = contains(asSpelled.links, HiddenNames::fileName) || contains(onDisk.links, HiddenNames::fileName);
     for (std::size_t index = 0; index < listing.size(); ++index) {
         FolderItem item = listing[index];
         const bool isAddedAsSpelled = contains(asSpelled.links, item.name);
@@ -216,7 +216,7 @@ void LinkedFileSystem::lookThroughLinks(
         }
         const bool holdsAsSpelled = contains(asSpelled.holders, item.name);
         if (item.kind == ItemKind::symbolicLink)
-            hiddenNamesAreLinked = hiddenNamesAreLinked || item.name == hiddenNamesFile;
+            hiddenNamesAreLinked = hiddenNamesAreLinked || item.name == HiddenNames::fileName;
         else if (item.marker != MarkerAnswer::link && !holdsAsSpelled && !contains(onDisk.holders, item.name))
             continue;
         const bool useSpelling = isAddedAsSpelled || holdsAsSpelled;
@@ -225,7 +225,7 @@ void LinkedFileSystem::lookThroughLinks(
         listing.setItem(index, item);
     }
     if (hiddenNamesAreLinked)
-        applyHiddenNames(listing, contains(asSpelled.links, hiddenNamesFile) ? folder.spelled : folder.real);
+        applyHiddenNames(listing, contains(asSpelled.links, HiddenNames::fileName) ? folder.spelled : folder.real);
 }
 
 /// Answers anew for the item at `path` what `request` asks of its inside.
@@ -243,14 +243,8 @@ void LinkedFileSystem::lookInside(FolderItem& item, const std::string& path, con
 /// Tells visibility anew in a folder whose list of hidden names is a link.
 void LinkedFileSystem::applyHiddenNames(FolderListing& listing, std::string_view folder) const
 {
-    const OpenResult list = openPlainFile(pathJoined(folder, hiddenNamesFile));
-    const std::unordered_set<std::string> names
-        = list.file ? readHiddenNames(*list.file) : std::unordered_set<std::string>();
-    for (std::size_t index = 0; index < listing.size(); ++index) {
-        FolderItem item = listing[index];
-        item.flags.invisible = isInvisibleName(item.name, names);
-        listing.setItem(index, item);
-    }
+    const OpenResult list = openPlainFile(pathJoined(folder, HiddenNames::fileName));
+    (list.file ? HiddenNames(*list.file) : HiddenNames()).applyTo(listing);
 }
 
 std::optional<ItemStatus> LinkedFileSystem::status(std::string_view path) const
@@ -298,12 +292,11 @@ ItemFlags LinkedFileSystem::itemFlags(std::string_view path) const
 /// Whether the item at `place` is hidden by its name, or by a list that only an added link leads to.
 bool LinkedFileSystem::isHidden(const LinkedPlace& place) const
 {
-    const std::string list = pathJoined(pathByRemovingLastComponent(place.path), hiddenNamesFile);
+    const std::string list = pathJoined(pathByRemovingLastComponent(place.path), HiddenNames::fileName);
     const std::optional<ItemStatus> listStatus = linkStatus(list);
     const bool isListTold = listStatus && (place.link || listStatus->kind == ItemKind::symbolicLink);
     const OpenResult opened = isListTold ? openPlainFile(list) : OpenResult {};
-    return isInvisibleName(
-        lastPathComponent(place.path), opened.file ? readHiddenNames(*opened.file) : std::unordered_set<std::string>());
+    return (opened.file ? HiddenNames(*opened.file) : HiddenNames()).hide(lastPathComponent(place.path));
 }
 
 std::string LinkedFileSystem::resolvedPath(std::string_view path) const

@@ -2,11 +2,10 @@
 
 #include "platform/linux/Descriptor.h"
 #include "platform/linux/FolderOpening.h"
-#include "platform/linux/HiddenNames.h"
+#include "platform/linux/HiddenNamesReading.h"
 #include "platform/linux/ItemReading.h"
 
 #include <string>
-#include <unordered_map>
 
 #include <dirent.h>
 #include <fcntl.h>
@@ -35,7 +34,6 @@ namespace {
         MarkerAnswer markerInside(const char* name, ItemKind kind);
         std::optional<SubfolderItems> itemsOfSubfolder(const char* holder);
         bool readSubfolder(int folder);
-        void hideNamed();
 
         int _folder;
         const ListingRequest& _request;
@@ -62,8 +60,10 @@ namespace {
         } while (length > 0 && _listing.size() < itemsAtMost);
         if (length != 0)
             _listing.setProblem(FileProblem::readError);
-        if (_sawHiddenNames)
-            hideNamed();
+        if (_sawHiddenNames) {
+            if (const HiddenNames names = readHiddenNames(_folder); !names.empty())
+                names.applyTo(_listing);
+        }
         return std::move(_listing);
     }
 
@@ -186,26 +186,6 @@ namespace {
             }
         }
         return false;
-    }
-
-    // Looks up each line among the items, not each item among the lines: the folder bounds the memory, not the file.
-    void FolderReader::hideNamed()
-    {
-        const HiddenNames hiddenNames = HiddenNames::readIn(_folder);
-        if (hiddenNames.empty())
-            return;
-        std::unordered_map<std::string_view, bool> isHidden(_listing.size());
-        for (const FolderItem item : _listing)
-            isHidden.emplace(item.name, false);
-        hiddenNames.forEach([&](std::string_view line) {
-            if (const auto found = isHidden.find(line); found != isHidden.end())
-                found->second = true;
-        });
-        for (std::size_t index = 0; index < _listing.size(); ++index) {
-            FolderItem item = _listing[index];
-            item.flags.invisible = item.flags.invisible || isHidden.find(item.name)->second;
-            _listing.setItem(index, item);
-        }
     }
 
 } // namespace

@@ -5,7 +5,7 @@
 #include "platform/linux/Descriptor.h"
 #include "platform/linux/FolderOpening.h"
 #include "platform/linux/FolderReading.h"
-#include "platform/linux/HiddenNames.h"
+#include "platform/linux/HiddenNamesReading.h"
 #include "platform/linux/ItemReading.h"
 #include "platform/linux/PathResolution.h"
 #include "platform/linux/PlainFile.h"
@@ -145,7 +145,7 @@ ItemFlags LinuxFileSystem::itemFlags(std::string_view path) const
     if (name == "..")
         flags.invisible = flags.package = false;
     else if (!flags.invisible && name != "/")
-        flags.invisible = HiddenNames::readIn(folder.number()).contains(name);
+        flags.invisible = readHiddenNames(folder.number()).hide(name);
     return flags;
 }
 

@@ -16,7 +16,7 @@ struct OBMediaObject::OwnFields {
     platform::Text path {};
     platform::Text sourcePluginIdentifier {};
     OBImageRef icon {};
-    OBImageRef thumbnail {}; // set by somebody, in place of the produced one
+    std::optional<OBImageRef> thumbnail {}; // set by somebody, in place of the produced one, be it null
     OBMarvexPropertiesRef marvexProperties {};
     platform::Value::Dictionary attributes {};
     std::optional<platform::FileFacts> facts {};

@@ -10,6 +10,7 @@
 #include "platform/MainRunLoop.h"
 #include "platform/Platform.h"
 
+#include <optional>
 #include <utility>
 
 using platform::Locked;
@@ -39,21 +40,21 @@ OBImageRef OBMediaObject::thumbnailImage()
     return thumbnailIfProduced();
 }
 
-void OBMediaObject::setThumbnailImage(OBImageRef image)
+void OBMediaObject::setThumbnailImage(const OBImageRef& image)
 {
-    image = withoutCycle(std::move(image));
+    std::optional<OBImageRef> set = withoutCycle(image);
     Locked guard(_lock);
     _thumbnailProduced = true;
-    if (image.get() == _movie.get())
-        image = nullptr; // its own shows where none was set
-    if (image || _own)
-        std::swap(own().thumbnail, image);
+    if (*set == imageOfMovie())
+        set.reset(); // its own shows where none was set
+    if (set || _own)
+        std::swap(own().thumbnail, set);
 }
 
 OBImageRef OBMediaObject::thumbnailIfProduced() const
 {
     Locked guard(_lock);
-    return _own && _own->thumbnail ? handedOut(_own->thumbnail) : imageOfMovie();
+    return _own && _own->thumbnail ? handedOut(*_own->thumbnail) : imageOfMovie();
 }
 
 bool OBMediaObject::hasProducedThumbnail() const
@@ -97,7 +98,7 @@ OBImageRef OBMediaObject::imageOfMovie() const
 }
 
 /// `image` as this object may keep it: without a share in it where it lies in the same block.
-OBImageRef OBMediaObject::withoutCycle(OBImageRef image) const
+OBImageRef OBMediaObject::withoutCycle(const OBImageRef& image) const
 {
     const std::shared_ptr<const void> block = _origin.block();
     const bool isOfBlock = image && !image.owner_before(block) && !block.owner_before(image);

@@ -194,7 +194,9 @@ OBMarvexPropertiesRef OBMediaObject::marvexProperties() const
         Locked guard(_lock);
         if (_own && _own->marvexProperties)
             return _own->marvexProperties;
-        path = pathLocked();
+        path = _origin.pathOfObject(*this);
+        if (!path)
+            path = pathLocked();
     }
     return marvexProperties(std::move(path));
 }
@@ -223,7 +225,7 @@ Value OBMediaObject::attributeBesideOwn(std::string_view key) const
     const OBMediaObjectKind& kind = _origin.kind();
     for (const Text& name : kind.ownPathKeys) {
         if (name == key)
-            return pathLocked();
+            return _origin.pathOfObject(*this);
     }
     if (kind.groupPathKey == key)
         return _origin.groupPath();
@@ -256,10 +258,10 @@ void OBMediaObject::setAttribute_forKey(Value value, Text key)
 Value::Dictionary OBMediaObject::attributes() const
 {
     Locked guard(_lock);
-    return attributesLocked(pathLocked());
+    return attributesLocked(_origin.pathOfObject(*this));
 }
 
-Value::Dictionary OBMediaObject::attributesLocked(const Text& path) const
+Value::Dictionary OBMediaObject::attributesLocked(const Text& firstPath) const
 {
     static platform::Immortal<HeaderKeys> keys;
     const OBMediaObjectKind& kind = _origin.kind();
@@ -274,7 +276,7 @@ Value::Dictionary OBMediaObject::attributesLocked(const Text& path) const
             result.emplace_back(key, std::move(value));
     };
     for (const Text& key : kind.ownPathKeys)
-        addMissing(key, path);
+        addMissing(key, firstPath);
     if (kind.groupPathKey)
         addMissing(kind.groupPathKey, _origin.groupPath());
     addMissing(keys->resolution, attributeBesideOwn(OBMediaObjectResolutionKey));
@@ -296,7 +298,7 @@ OBMediaObjectRecord OBMediaObject::record() const
     record.path = pathLocked();
     record.pathIsReal = _pathIsReal;
     record.icon = _own ? handedOut(_own->icon) : _origin.icon();
-    record.attributes = attributesLocked(record.path);
+    record.attributes = attributesLocked(_own ? _origin.pathOfObject(*this) : record.path);
     return record;
 }
 
@@ -308,7 +310,7 @@ OBImageRef OBMediaObject::icon() const
 
 void OBMediaObject::setIcon(OBImageRef icon)
 {
-    icon = withoutCycle(std::move(icon));
+    icon = withoutCycle(icon);
     Locked guard(_lock);
     std::swap(own().icon, icon);
 }

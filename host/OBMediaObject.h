@@ -30,7 +30,7 @@ struct OBMediaObjectKind {
     int mediaSourceType = 0;
     platform::Text sourcePluginIdentifier {};
     OBImageRef icon {};
-    /// Attributes whose value is the object's own path.
+    /// Attributes whose value is the path that the object was made with.
     std::vector<platform::Text> ownPathKeys {};
     /// What stands between the path of the folder that the objects of files are made for, and a file's name: "/", or
     /// where the files lie below that folder, "/Below/".
@@ -114,7 +114,7 @@ public:
 
     /// The properties of the file at `path`, read when first asked for.
     static OBMarvexPropertiesRef marvexProperties(platform::Text path);
-    /// Those that were set; else those of the object's own file.
+    /// Those that were set; else those of the file that the object was made for, or of the one it was given.
     OBMarvexPropertiesRef marvexProperties() const;
     void setMarvexProperties(OBMarvexPropertiesRef properties);
 
@@ -134,7 +134,8 @@ public:
     /// Evaluated on the main thread only: on any other thread the call asks the main thread and waits. Once produced,
     /// every thread gets the same image at once. Null, with nothing set, when the main loop has ended.
     OBImageRef thumbnailImage();
-    void setThumbnailImage(OBImageRef image);
+    /// Takes the place of a produced one, and none is produced any more; null clears it. Attributes stay.
+    void setThumbnailImage(const OBImageRef& image);
     /// What `thumbnailImage` would answer without producing anything.
     OBImageRef thumbnailIfProduced() const;
     /// Whether the thumbnail has been produced, be it null.
@@ -154,10 +155,10 @@ private:
     OwnFields& own() REQUIRES(_lock);
     platform::Text pathLocked() const REQUIRES(_lock);
     std::optional<platform::FileFacts> factsLocked() const REQUIRES(_lock);
-    platform::Value::Dictionary attributesLocked(const platform::Text& path) const REQUIRES(_lock);
+    platform::Value::Dictionary attributesLocked(const platform::Text& firstPath) const REQUIRES(_lock);
     platform::Value attributeBesideOwn(std::string_view key) const REQUIRES(_lock);
     platform::Value attributeOfMovie(std::string_view key) const REQUIRES(_lock);
-    OBImageRef withoutCycle(OBImageRef image) const;
+    OBImageRef withoutCycle(const OBImageRef& image) const;
     OBImageRef handedOut(const OBImageRef& kept) const;
     OBImageRef imageOfMovie() const REQUIRES(_lock);
     void produceThumbnail(const platform::Platform& platform);

@@ -133,9 +133,20 @@ TEST_CASE("changing one object of a folder leaves its neighbours as they are")
     list[0]->setSourcePluginIdentifier("other");
     CHECK(list[0]->path() == "/elsewhere/z.mov");
     CHECK(list[0]->name() == "a");
-    CHECK(list[0]->attributeForKey("Own Path") == Value("/elsewhere/z.mov"));
     CHECK(list[1]->path() == "/movies/b.mov");
     CHECK(list[1]->sourcePluginIdentifier() == "org.test.Source");
+}
+
+TEST_CASE("a path that is set later changes neither attributes nor properties that came with the first one")
+{
+    const auto object = fileOfFolder("/movies", "trip.mov");
+    const Value::Dictionary attributes = object->attributes();
+    object->setPath("/elsewhere/z.mov");
+    CHECK(object->attributeForKey("Own Path") == Value("/movies/trip.mov"));
+    CHECK(object->attributes() == attributes);
+    CHECK(object->record().attributes == attributes);
+    CHECK(object->record().path == "/elsewhere/z.mov");
+    CHECK(object->marvexProperties()->path() == "/movies/trip.mov");
 }
 
 TEST_CASE("an attribute that is set hides the folder's under the same key, and keeps its place when it is set again")

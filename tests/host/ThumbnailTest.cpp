@@ -48,6 +48,7 @@ TEST_CASE("a thumbnail is produced once, on the main thread, and is the same ima
     const auto object = objectAt(writeMovie(test, "movie.mov"));
     std::vector<OBImageRef> images(8);
     std::vector<std::thread> threads;
+    threads.reserve(images.size());
     for (OBImageRef& image : images)
         threads.emplace_back([&object, &image] { image = object->thumbnailImage(); });
     for (std::thread& thread : threads)
@@ -162,6 +163,29 @@ TEST_CASE("a thumbnail that is set stands in place of the produced one")
     CHECK(object->attributeForKey(OBMediaObjectDurationKey) == Value(2.5));
     object->setThumbnailImage(produced);
     CHECK(object->thumbnailImage() == produced);
+}
+
+TEST_CASE("a thumbnail that is set to null is cleared, be it produced, set or not there yet")
+{
+    TestHost test;
+    test.host();
+    const std::string file = writeMovie(test, "movie.mov");
+    const auto other = OBImage::pictureNamed("other", Size { 1, 1 }, "/other.svg");
+    for (int which = 0; which < 8; ++which) {
+        CAPTURE(which);
+        const auto object = which < 4 ? objectAt(file) : objectOfFolder(test.machine.folder.path(), "movie.mov");
+        const bool isProduced = which % 2 == 0;
+        const OBImageRef produced = isProduced ? object->thumbnailImage() : nullptr;
+        if (which / 2 % 2 == 0)
+            object->setThumbnailImage(other);
+        object->setThumbnailImage(nullptr);
+        CHECK(object->hasProducedThumbnail());
+        CHECK(object->thumbnailIfProduced() == nullptr);
+        CHECK(object->thumbnailImage() == nullptr);
+        CHECK(object->attributeForKey(OBMediaObjectDurationKey).isNull() == !isProduced);
+        object->setThumbnailImage(produced);
+        CHECK(object->thumbnailImage() == produced);
+    }
 }
 
 TEST_CASE("setting an object's own thumbnail again changes nothing")

@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <string_view>
 
 #include <fcntl.h>
 #include <poll.h>
@@ -21,22 +22,32 @@ namespace {
         int errors = -1;
     };
 
+    std::string assignment(std::string_view name, std::string_view value)
+    {
+        std::string text(name);
+        return text.append("=").append(value);
+    }
+
+    /// Of two values for one variable the first holds.
     std::vector<std::string> environmentOf(const RunWishes& wishes, const std::string& term)
     {
-        std::vector<std::string> variables { "LC_ALL=C", "TZ=UTC", "HOME=/nonexistent", "PATH=/usr/bin:/bin",
-            "TERM=" + term };
+        std::vector<std::string> variables;
+        for (const auto& [name, value] : wishes.environment)
+            variables.push_back(assignment(name, value));
+        for (const char* always : { "LC_ALL=C", "TZ=UTC", "HOME=/nonexistent", "PATH=/usr/bin:/bin" })
+            variables.emplace_back(always);
+        variables.push_back(assignment("TERM", term));
         for (const char* name : { "ASAN_OPTIONS", "UBSAN_OPTIONS", "TSAN_OPTIONS" }) {
             if (const char* value = std::getenv(name))
-                variables.push_back(std::string(name) + "=" + value);
+                variables.push_back(assignment(name, value));
         }
-        for (const auto& [name, value] : wishes.environment)
-            variables.push_back(name + "=" + value);
         return variables;
     }
 
     std::vector<char*> pointersTo(std::vector<std::string>& texts)
     {
         std::vector<char*> pointers;
+        pointers.reserve(texts.size() + 1);
         for (std::string& text : texts)
             pointers.push_back(text.data());
         pointers.push_back(nullptr);
@@ -45,7 +56,7 @@ namespace {
 
     pid_t start(const RunWishes& wishes, const std::string& term, Descriptors descriptors)
     {
-        std::vector<std::string> words { OMBRIX_PROGRAM };
+        std::vector<std::string> words { wishes.program.empty() ? OMBRIX_PROGRAM : wishes.program };
         words.insert(words.end(), wishes.arguments.begin(), wishes.arguments.end());
         std::vector<std::string> variables = environmentOf(wishes, term);
         const std::vector<char*> arguments = pointersTo(words);
@@ -57,7 +68,7 @@ namespace {
             ::dup2(descriptors.output, 1);
             ::dup2(descriptors.errors, 2);
             ::close_range(3, ~0U, 0);
-            ::execve(OMBRIX_PROGRAM, arguments.data(), environment.data());
+            ::execve(arguments.front(), arguments.data(), environment.data());
             ::_exit(127);
         }
         return child;

@@ -16,9 +16,10 @@ struct ProgramRun {
 /// A run of the program that is to be made.
 struct RunWishes {
     std::vector<std::string> arguments {};
-    std::vector<std::pair<std::string, std::string>> environment {}; ///< beside the few variables every run gets
+    std::vector<std::pair<std::string, std::string>> environment {}; ///< beside, or in place of, what every run gets
     std::string outputFile {}; ///< where standard output goes instead of into the answer
     std::string inputFile {}; ///< what standard input holds; nothing without one
+    std::string program {}; ///< in place of ombrix
 };
 
 /// Runs the program with pipes and waits for its end.

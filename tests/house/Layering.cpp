@@ -51,6 +51,8 @@ namespace {
                 "the window knows host/, roles, apps/common and its toolkit" },
             { "apps", { "host", "platform", "apps/common" }, {}, false,
                 "a program knows host/, roles and apps/common; machines and the system lie behind them" },
+            { "examples", { "host", "platform", "platform/linux" }, {}, true,
+                "an example knows what an application from outside does: host/, roles and the machine" },
             { "tests", { "platform/", "host", "plugin", orderings, "apps/", "tests/support", "tests/plugin/support" },
                 { "doctest/" }, true, "a test knows public headers and tests/support" },
             { "bench", { "platform/", "host", "plugin", "apps/common" }, {}, true, "a benchmark knows public headers" },

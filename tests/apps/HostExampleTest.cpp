@@ -1,0 +1,76 @@
+#include "tests/apps/ProgramRun.h"
+#include "tests/support/LibraryBuilder.h"
+#include "tests/support/TemporaryFolder.h"
+
+#include <doctest/doctest.h>
+
+#include <algorithm>
+#include <csignal>
+#include <fstream>
+#include <iterator>
+#include <string>
+
+using namespace tests;
+
+namespace {
+
+/// A file of this tree.
+std::string sourceText(const std::string& path)
+{
+    std::ifstream stream(OMBRIX_SOURCE_FOLDER "/" + path, std::ios::binary);
+    REQUIRE(stream.good());
+    return { std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>() };
+}
+
+/// A run of the example for a user whose home and data folders lie in `folder`.
+RunWishes exampleRun(const TemporaryFolder& folder)
+{
+    RunWishes wishes;
+    wishes.program = OMBRIX_HOST_EXAMPLE;
+    wishes.environment = { { "HOME", folder.path("home") }, { "XDG_DATA_HOME", folder.path("data") },
+        { "XDG_DATA_DIRS", "/nonexistent" } };
+    return wishes;
+}
+
+} // namespace
+
+TEST_CASE("the example of an application prints the tree when it is published, and Ctrl-C ends it")
+{
+    const TemporaryFolder folder;
+    const std::string editor = folder.file("editor");
+    folder.file("data/applications/org.ombrix.Montaro.desktop",
+        "[Desktop Entry]\nType=Application\nName=Montaro\nExec=" + editor + "\n");
+    LibraryBuilder projects(folder.folder("home/Movies/Montaro Projects"));
+    projects.project("Clients/Meyer").movie("a.mov");
+    TerminalWishes terminal;
+    terminal.sendSignalAfter = "  Events\n";
+    terminal.signal = SIGINT;
+    const ProgramRun run = runWithErrorsOnTerminal(exampleRun(folder), terminal);
+    CHECK(run.status == 0);
+    CHECK(run.errors.empty());
+    CHECK(run.output == "Montaro\n  Clients\n    Meyer\n  Events\n");
+}
+
+TEST_CASE("the example of an application says so when there is nothing to load")
+{
+    const TemporaryFolder folder;
+    TerminalWishes terminal;
+    terminal.sendSignalAfter = "installed";
+    terminal.signal = SIGINT;
+    const ProgramRun run = runWithErrorsOnTerminal(exampleRun(folder), terminal);
+    CHECK(run.status == 0);
+    CHECK(run.output.empty());
+    CHECK(run.errors == "nothing to load: the editor is not installed\n");
+}
+
+TEST_CASE("what README shows of an application is a part of the example, which has at most fifty lines")
+{
+    const std::string example = sourceText("examples/host/HostExample.cpp");
+    CHECK(std::count(example.begin(), example.end(), '\n') <= 50);
+    const std::string readme = sourceText("README.md");
+    const std::string fence = "```cpp\n";
+    const std::size_t start = readme.find(fence, readme.find("## Embed")) + fence.size();
+    const std::string shown = readme.substr(start, readme.find("```\n", start) - start);
+    CHECK(shown.starts_with("int browse("));
+    CHECK(example.find("\n" + shown) != std::string::npos);
+}

@@ -40,7 +40,6 @@ void ManagerState::Progress::restart()
 {
     isLoading = true;
     foldersDone = 0;
-    foldersKnown = 0;
     itemsFound = 0;
     itemsSkipped = 0;
     pathAtWork.store({});
@@ -49,7 +48,7 @@ void ManagerState::Progress::restart()
 OBLoadProgress ManagerState::Progress::now() const
 {
     const auto [path, since] = pathAtWork.load();
-    return { isLoading, foldersDone, foldersKnown, itemsFound, itemsSkipped, path, since };
+    return { isLoading, foldersDone, itemsFound, itemsSkipped, path, since };
 }
 
 void ManagerState::requestTree(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)

@@ -42,7 +42,6 @@ struct ManagerState {
     struct Progress {
         std::atomic<bool> isLoading { false };
         std::atomic<std::uint64_t> foldersDone { 0 };
-        std::atomic<std::uint64_t> foldersKnown { 0 };
         std::atomic<std::uint64_t> itemsFound { 0 };
         std::atomic<std::uint64_t> itemsSkipped { 0 };
         platform::Snapshot<std::pair<platform::Text, std::chrono::nanoseconds>> pathAtWork;

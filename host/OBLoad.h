@@ -26,8 +26,7 @@ struct OBLoadResult {
 /// How far the load at work, or the last one, has come.
 struct OBLoadProgress {
     bool isLoading = false;
-    std::uint64_t foldersDone = 0; ///< listed
-    std::uint64_t foldersKnown = 0; ///< listed or found and waiting
+    std::uint64_t foldersDone = 0; ///< listed; how many there will be, nobody knows before the end
     std::uint64_t itemsFound = 0; ///< media objects
     std::uint64_t itemsSkipped = 0; ///< files and folders that a rule kept out
     platform::Text pathAtWork {}; ///< the folder or file being read

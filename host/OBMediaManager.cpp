@@ -189,7 +189,7 @@ platform::FolderListing OBMediaManager::readFolder(const Text& path, const platf
 {
     _state->beginPath(path);
     platform::FolderListing listing = platform().fileSystem.itemsInFolder(path, request);
-    _state->progress.foldersDone.fetch_add(1, std::memory_order_relaxed);
+    noteFoldersDone(1);
     return listing;
 }
 
@@ -209,9 +209,9 @@ void OBMediaManager::noteFolderRead(const Text& path, platform::FileProblem prob
     }
 }
 
-void OBMediaManager::noteFoldersFound(std::uint64_t count)
+void OBMediaManager::noteFoldersDone(std::uint64_t count)
 {
-    _state->progress.foldersKnown.fetch_add(count, std::memory_order_relaxed);
+    _state->progress.foldersDone.fetch_add(count, std::memory_order_relaxed);
 }
 
 void OBMediaManager::noteItemsFound(std::uint64_t count)

@@ -136,8 +136,8 @@ public:
     /// The two halves of that, for whoever lists on several threads and notes in order.
     platform::FolderListing readFolder(const platform::Text& path, const platform::ListingRequest& request);
     void noteFolderRead(const platform::Text& path, platform::FileProblem problem);
-    /// For the progress: folders that will be listed, media objects made, items that a rule kept out.
-    void noteFoldersFound(std::uint64_t count);
+    /// For the progress: folders that were listed together with another, media objects made, items that a rule kept out.
+    void noteFoldersDone(std::uint64_t count);
     void noteItemsFound(std::uint64_t count);
     void noteItemsSkipped(std::uint64_t count);
     /// For the progress: what is being read now.

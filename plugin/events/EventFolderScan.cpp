@@ -140,7 +140,6 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
                                                         : OBMediaGroup::modDateForFile(path));
 
     const std::vector<FoundFolder> folders = foldersInLibrary(scan.report, path, listing);
-    noteFoldersFound(folders.size());
     std::vector<ReadEvent> events(folders.size());
     const auto read = [&](std::size_t index) { events[index] = readEvent(path, folders[index], scan); };
     const auto take = [&](std::size_t index) {

@@ -123,7 +123,6 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
         listing = listFolder(listed, projectListing);
     }
 
-    noteFoldersFound(listing.size());
     scan.report.found([&] { return findings::listedFolder(listed, listing); });
     for (const FolderItem item : listing) {
         if (!scan.report.passes(rules::nameIsNotHidden, item, listed)
@@ -162,6 +161,8 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
             scan.projectIcon, item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path) });
     scan.addToFlatGroups(project);
 
+    if (item.subfolder)
+        noteFoldersDone(1);
     const SharedMovies movies = item.subfolder ? sharedMoviesOfListedProject(scan.report, path, listing, item)
                                                : sharedMoviesOfProject(*this, scan.report, path);
     project->setMediaObjects(OBMediaObjectBatch::objects(scan.movieKind, movies.project, movies.files));

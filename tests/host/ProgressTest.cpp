@@ -45,7 +45,6 @@ TEST_CASE("before the first load there is no progress")
     const OBLoadProgress progress = manager->loadProgress();
     CHECK_FALSE(progress.isLoading);
     CHECK(progress.foldersDone == 0);
-    CHECK(progress.foldersKnown == 0);
     CHECK(progress.pathAtWork.isAbsent());
 }
 
@@ -56,10 +55,9 @@ TEST_CASE("progress counts what a scan notes, and names the path at work since w
     const std::string folder = test.machine.folder.folder("library");
     test.script->gate.close();
     test.script->whenPerforming = [&](ScriptedManager& manager) {
-        manager.noteFoldersFound(3);
         manager.listFolder(platform::Text(folder), {});
         manager.listFolder("/nothing at all", {});
-        manager.noteFoldersFound(2);
+        manager.noteFoldersDone(3);
         manager.noteItemsFound(7);
         manager.noteItemsSkipped(4);
         test.machine.bare.clock.advance(1s);
@@ -71,8 +69,7 @@ TEST_CASE("progress counts what a scan notes, and names the path at work since w
     CHECK(test.script->gate.waitForArrivals(1));
     const OBLoadProgress progress = manager->loadProgress();
     CHECK(progress.isLoading);
-    CHECK(progress.foldersDone == 2);
-    CHECK(progress.foldersKnown == 5);
+    CHECK(progress.foldersDone == 5);
     CHECK(progress.itemsFound == 7);
     CHECK(progress.itemsSkipped == 4);
     CHECK(progress.pathAtWork == "/at/work");
@@ -82,7 +79,7 @@ TEST_CASE("progress counts what a scan notes, and names the path at work since w
     const OBLoadProgress after = manager->loadProgress();
     CHECK_FALSE(after.isLoading);
     CHECK(after.pathAtWork.isAbsent());
-    CHECK(after.foldersDone == 2);
+    CHECK(after.foldersDone == 5);
     CHECK(after.itemsFound == 7);
 }
 
@@ -90,7 +87,6 @@ TEST_CASE("each load counts from nothing")
 {
     TestHost test;
     test.script->whenPerforming = [](ScriptedManager& manager) {
-        manager.noteFoldersFound(3);
         manager.noteItemsFound(1);
         manager.noteItemsSkipped(2);
         manager.listFolder("/nothing at all", {});
@@ -99,7 +95,6 @@ TEST_CASE("each load counts from nothing")
     for (int load = 0; load < 2; ++load) {
         manager->setNeedsReload(true);
         Request(*manager).answer();
-        CHECK(manager->loadProgress().foldersKnown == 3);
         CHECK(manager->loadProgress().foldersDone == 1);
         CHECK(manager->loadProgress().itemsFound == 1);
         CHECK(manager->loadProgress().itemsSkipped == 2);

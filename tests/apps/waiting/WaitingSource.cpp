@@ -23,7 +23,7 @@ public:
     OBMediaGroupRef performLoadData() override
     {
         using namespace std::chrono_literals;
-        noteFoldersFound(1204);
+        noteFoldersDone(1204);
         noteItemsFound(38110);
         notePathAtWork("/Volumes/Stick/Montaro Projects");
         platform::WakeSignal never;

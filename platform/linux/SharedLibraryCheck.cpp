@@ -19,6 +19,7 @@ namespace {
     using Segment = ElfW(Phdr);
 
     // This program's own header, as the loader mapped it, tells what this machine's libraries are like.
+    // NOLINTNEXTLINE(bugprone-reserved-identifier, readability-identifier-naming): the linker gives it this name
     extern "C" const Header __ehdr_start __attribute__((weak, visibility("hidden")));
 
     bool isForThisMachine(const Header& header)

@@ -141,7 +141,8 @@ TEST_CASE("a manager may be dropped inside its own callback, on the application'
         const OBObservation listening
             = alive.observe(onLoadThread ? inPlace() : application.executor(), std::move(callbacks));
         const Request request(alive);
-        CHECK((onLoadThread || application.runUntil([&dropped] { return dropped.load(); })));
+        const bool isDropped = onLoadThread || application.runUntil([&dropped] { return dropped.load(); });
+        CHECK(isDropped);
         request.answer();
         CHECK(test.host().waitForThreads(longestWait));
         CHECK(dropped);

@@ -36,16 +36,19 @@ void NameBlock::addName(const Owner& owner, std::string_view name)
 {
     const std::size_t start = _folded.size();
     platform::appendFolded(_folded, name);
-    endPiece({ start, _folded.size(), owner, {}, 0 });
+    endPiece({ start, _folded.size(), owner, {}, 0, _others.size() });
 }
 
 void NameBlock::addRun(const Owner& owner, std::size_t count, NameBlock& strays)
 {
     const std::string_view names = owner.batch->fileNames(count);
     const std::size_t start = _folded.size();
-    if (!platform::appendFoldedAscii(_folded, names))
+    const std::size_t firstOther = _others.size();
+    if (!platform::appendFoldedOneByOne(_folded, names, _others)) {
+        platform::appendFoldedAscii(_folded, names);
         moveStrays(owner, names, start, strays);
-    endPiece({ start, _folded.size(), owner, names, count });
+    }
+    endPiece({ start, _folded.size(), owner, names, count, firstOther });
 }
 
 std::vector<NameHit> NameBlock::takeHits()
@@ -94,6 +97,7 @@ void NameBlock::search()
     }
     _folded.clear();
     _pieces.clear();
+    _others.clear();
 }
 
 std::optional<std::size_t> NameBlock::nextNeedle(std::size_t start) const
@@ -104,16 +108,39 @@ std::optional<std::size_t> NameBlock::nextNeedle(std::size_t start) const
     return static_cast<std::size_t>(static_cast<const char*>(at) - _folded.data());
 }
 
+/// The last character of the run that is not ASCII and ends, at `place`, not behind `position`; the beginning of the run
+/// where there is none.
+platform::FoldedCharacter NameBlock::otherBefore(
+    const Piece& run, std::size_t platform::FoldedCharacter::*place, std::size_t position) const
+{
+    const auto first = _others.begin() + static_cast<std::ptrdiff_t>(run.firstOther);
+    const auto next = (&run == &_pieces.back()) ? _others.end()
+                                                : _others.begin() + static_cast<std::ptrdiff_t>((&run + 1)->firstOther);
+    const auto behind = std::upper_bound(first, next, position,
+        [place](std::size_t wanted, const platform::FoldedCharacter& other) { return wanted < other.*place; });
+    return behind == first ? platform::FoldedCharacter { 0, run.start } : behind[-1];
+}
+
 /// Looks at the name of the run that holds the byte at `at`; answers where it ends.
 std::size_t NameBlock::takeOfRun(const Piece& run, std::size_t at)
 {
+    using platform::FoldedCharacter;
+    // Of a character that is not ASCII, `at` is the first byte, as a needle begins with a whole one.
+    const FoldedCharacter before = otherBefore(run, &FoldedCharacter::foldedEnd, at);
     Owner owner = run.owner;
-    owner.index = owner.batch->indexOfFileNameAt(at - run.start);
+    owner.index = owner.batch->indexOfFileNameAt(before.end + (at - before.foldedEnd));
     owner.position += static_cast<std::uint32_t>(owner.index);
     const std::string_view fileName = owner.batch->fileNameAtIndex(owner.index);
-    const std::size_t start = run.start + static_cast<std::size_t>(fileName.data() - run.fileNames.data());
-    take(owner, platform::nameWithoutExtension(std::string_view(_folded).substr(start, fileName.size())));
-    return start + fileName.size();
+    const std::size_t nameStart = static_cast<std::size_t>(fileName.data() - run.fileNames.data());
+    const std::size_t nameEnd = nameStart + fileName.size();
+    const FoldedCharacter beforeEnd = otherBefore(run, &FoldedCharacter::end, nameEnd);
+    const std::size_t end = beforeEnd.foldedEnd + (nameEnd - beforeEnd.end);
+    if (beforeEnd.end > nameStart)
+        take(owner, platform::foldedText(platform::nameWithoutExtension(fileName)));
+    else
+        take(owner,
+            platform::nameWithoutExtension(std::string_view(_folded).substr(end - fileName.size(), fileName.size())));
+    return end;
 }
 
 void NameBlock::take(const Owner& owner, std::string_view folded)

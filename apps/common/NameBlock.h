@@ -2,6 +2,7 @@
 
 #include "apps/common/NameSearch.h"
 #include "host/OBMediaObjectList.h"
+#include "platform/formats/FoldedText.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -32,8 +33,8 @@ public:
     explicit NameBlock(const NameQuery& query);
 
     void addName(const Owner& owner, std::string_view name);
-    /// Adds the names of the first `count` objects of a batch. Those that are not ASCII go to `strays`, for they change
-    /// their length when they are folded.
+    /// Adds the names of the first `count` objects of a batch. Where they cannot be folded all at once, those that are
+    /// not ASCII go to `strays`.
     void addRun(const Owner& owner, std::size_t count, NameBlock& strays);
 
     /// The hits among the names added so far, in the order in which they were added.
@@ -49,6 +50,7 @@ private:
         Owner owner;
         std::string_view fileNames; // of a run, unfolded
         std::size_t count; // of a run; 0 for one name
+        std::size_t firstOther; // of a run: where its characters that are not ASCII begin among those of all
     };
 
     void moveStrays(const Owner& owner, std::string_view names, std::size_t start, NameBlock& strays);
@@ -56,12 +58,15 @@ private:
     void search();
     std::optional<std::size_t> nextNeedle(std::size_t start) const;
     std::size_t takeOfRun(const Piece& run, std::size_t at);
+    platform::FoldedCharacter otherBefore(
+        const Piece& run, std::size_t platform::FoldedCharacter::*place, std::size_t position) const;
     void take(const Owner& owner, std::string_view folded);
 
     const NameQuery& _query;
     const std::string_view _needle;
     std::string _folded;
     std::vector<Piece> _pieces;
+    std::vector<platform::FoldedCharacter> _others; // of all runs; their `end` counts within the file names of the run
     std::vector<NameHit> _hits;
     bool _mayRepeat = false;
 };

@@ -150,6 +150,15 @@ namespace {
         return known;
     }
 
+    /// Appends what becomes of a character that is not ASCII; answers false where it does not become one by itself.
+    bool appendSingle(std::string& text, const DecodedCharacter& character)
+    {
+        const char32_t folded = character.isValid ? remembered(character.codePoint) : dependsOnOthers;
+        if (folded > dependsOnOthers)
+            appendCharacter(text, folded);
+        return folded != dependsOnOthers;
+    }
+
     /// Appends characters of which each becomes one by itself; answers false, and appends nothing, where one does not.
     bool appendOneByOne(std::string& text, std::string_view characters)
     {
@@ -161,13 +170,10 @@ namespace {
                 text += asciiFolded(static_cast<unsigned char>(next.codePoint));
                 continue;
             }
-            const char32_t folded = remembered(next.codePoint);
-            if (folded == dependsOnOthers) {
+            if (!appendSingle(text, next)) {
                 text.resize(start);
                 return false;
             }
-            if (folded != nothing)
-                appendCharacter(text, folded);
         }
         return true;
     }
@@ -220,6 +226,40 @@ void appendFolded(std::string& folded, std::string_view text)
             text.remove_prefix(1);
         }
     }
+}
+
+/// What is ASCII is folded where it stands, and moved up for what became shorter before it.
+bool appendFoldedOneByOne(std::string& folded, std::string_view text, std::vector<FoldedCharacter>& others)
+{
+    const std::size_t start = folded.size();
+    if (appendFoldedAscii(folded, text))
+        return true;
+    const std::size_t othersBefore = others.size();
+    char* const bytes = folded.data() + start;
+    std::string letter;
+    std::size_t written = 0;
+    for (std::size_t next = 0; next < text.size();) {
+        const std::size_t ascii = lengthOfAsciiPrefix(text.substr(next));
+        if (written != next)
+            std::copy(bytes + next, bytes + next + ascii, bytes + written);
+        next += ascii;
+        written += ascii;
+        if (next == text.size())
+            break;
+        const DecodedCharacter character = decodeCharacter(text.substr(next));
+        next += character.length;
+        letter.clear();
+        if (!appendSingle(letter, character) || written + letter.size() > next) {
+            folded.resize(start);
+            others.resize(othersBefore);
+            return false;
+        }
+        std::copy(letter.begin(), letter.end(), bytes + written);
+        written += letter.size();
+        others.push_back({ next, start + written });
+    }
+    folded.resize(start + written);
+    return true;
 }
 
 std::string foldedText(std::string_view text)

@@ -1,5 +1,6 @@
 #include "platform/formats/Unicode.h"
 
+#include <array>
 #include <cstdint>
 #include <cstring>
 
@@ -83,6 +84,11 @@ DecodedCharacter decodeCharacter(std::string_view bytes) noexcept
 std::size_t lengthOfAsciiPrefix(std::string_view bytes) noexcept
 {
     std::size_t end = 0;
+    for (std::array<std::uint64_t, 4> many {}; bytes.size() - end >= sizeof many; end += sizeof many) {
+        std::memcpy(&many, bytes.data() + end, sizeof many);
+        if (((many[0] | many[1] | many[2] | many[3]) & highBits) != 0)
+            break;
+    }
     for (std::uint64_t eight = 0; bytes.size() - end >= sizeof eight; end += sizeof eight) {
         std::memcpy(&eight, bytes.data() + end, sizeof eight);
         if ((eight & highBits) != 0)

@@ -116,6 +116,33 @@ TEST_CASE("neither extensions nor what stands across two names is found")
     CHECK(find(root, "").empty());
 }
 
+TEST_CASE("files made together are found as objects made by themselves are, whatever letters their names have")
+{
+    const Texts names { "IMG_1", "é", "ñ", "Fête à Nice", "ñandú é", "Cafe\u0301 sunset", "x\u0301", "\u0301",
+        "東京の夜", "sunset é", "Ωmega", "İé", "plain" };
+    const Texts queries { "e", "n", "en", "ne", "x", "fete", "cafe sunset", "sunset", "é", "à nice", "夜", "の", "ⱥb",
+        "b", "img", "mov", "i", "ωmega", "plain", "in" };
+    // The further ones make that not all names can be folded at once.
+    for (const Texts& further : { Texts {}, Texts { "Straße e" }, Texts { "ȺB sunset" }, Texts { "Z\xfcrich n" } }) {
+        Texts fileNames;
+        OBMediaObjectList single;
+        Texts all = names;
+        all.insert(all.end(), further.begin(), further.end());
+        for (const std::string& name : all) {
+            fileNames.push_back(name + ".mov");
+            single = single.appending(makeObject(name));
+        }
+        const OBMediaGroupRef together = makeGroup("-");
+        together->setMediaObjects(makeBatch(fileNames));
+        const OBMediaGroupRef apart = makeGroup("-");
+        apart->setMediaObjects(single);
+        for (const std::string& query : queries) {
+            CAPTURE(query);
+            CHECK(find(together, query) == find(apart, query));
+        }
+    }
+}
+
 TEST_CASE("an object that several groups show is found once, in the innermost of them")
 {
     const OBMediaGroupRef root = makeGroup("root");

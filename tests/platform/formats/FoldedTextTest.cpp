@@ -1,4 +1,5 @@
 #include "platform/formats/FoldedText.h"
+#include "platform/formats/Unicode.h"
 
 #include <doctest/doctest.h>
 
@@ -99,4 +100,45 @@ TEST_CASE("bytes are folded one for one where only those that are ASCII are aske
     folded.clear();
     CHECK_FALSE(appendFoldedAscii(folded, many));
     CHECK(folded.substr(30, 10) == std::string("ddddddd\xc3") + "dd");
+}
+
+TEST_CASE("every character that folds by itself folds as it does among others")
+{
+    constexpr char32_t afterLast = 0x110000;
+    constexpr std::size_t surely = 60'000; // ideographs alone are more
+    std::size_t count = 0;
+    std::string different;
+    for (char32_t character = 0x80; character < afterLast; ++character) {
+        std::string text = "aE";
+        appendCharacter(text, character);
+        const std::size_t end = text.size();
+        text += "B";
+        std::string folded = "before";
+        std::vector<FoldedCharacter> others;
+        if (!appendFoldedOneByOne(folded, text, others)) {
+            if (folded != "before" || !others.empty())
+                appendCharacter(different, character);
+            continue;
+        }
+        ++count;
+        // A letter that becomes two has the text folded as a whole.
+        if (folded + "ss" != "before" + foldedText(text + "ß") || others.size() != 1 || others[0].end != end
+            || others[0].foldedEnd != folded.size() - 1)
+            appendCharacter(different, character);
+    }
+    CHECK(different == "");
+    CHECK(count > surely);
+}
+
+TEST_CASE("a text is not folded one by one where a character becomes several, joins another or is no UTF-8")
+{
+    std::string folded;
+    std::vector<FoldedCharacter> others;
+    for (const char* text : { "Fête Straße", "か\u3099", "Z\xfcrich" })
+        CHECK_FALSE(appendFoldedOneByOne(folded, text, others));
+    CHECK(folded == "");
+    CHECK(others.empty());
+    CHECK(appendFoldedOneByOne(folded, "Fête À", others));
+    CHECK(folded == "fete a");
+    CHECK(others.size() == 2);
 }

@@ -56,26 +56,37 @@ void OrderedWork::help()
 void OrderedWork::runClaimed(std::unique_lock<std::mutex>& guard)
 {
     const std::size_t index = _next++;
+    const bool isTimed = _untimedLeft == 0;
+    _untimedLeft = isTimed ? _untimedBetween : _untimedLeft - 1;
     guard.unlock();
+    const std::optional<Times> times = isTimed ? std::optional(runTimed(index)) : std::nullopt;
+    if (!isTimed)
+        _job(index);
+    guard.lock();
+    _done[index] = true;
+    if (times)
+        noteTimes(*times);
+    _changed.notify_all();
+}
+
+OrderedWork::Times OrderedWork::runTimed(std::size_t index)
+{
     const std::chrono::nanoseconds began = _platform.clock.monotonic();
     const std::chrono::nanoseconds beganOnProcessor = _platform.threads.processorTimeOfCurrentThread();
     _job(index);
     const std::chrono::nanoseconds onProcessor = _platform.threads.processorTimeOfCurrentThread() - beganOnProcessor;
-    const std::chrono::nanoseconds passed = _platform.clock.monotonic() - began;
-    guard.lock();
-    _done[index] = true;
-    noteTimes(passed, onProcessor);
-    _changed.notify_all();
+    return { _platform.clock.monotonic() - began, onProcessor };
 }
 
-void OrderedWork::noteTimes(std::chrono::nanoseconds passed, std::chrono::nanoseconds onProcessor)
+void OrderedWork::noteTimes(const Times& times)
 {
-    _passed += passed;
-    _onProcessor += onProcessor;
+    _passed += times.passed;
+    _onProcessor += times.onProcessor;
     if (++_timedJobs < jobsBetweenLooks)
         return;
     const bool mostlyWaits = _onProcessor * 2 < _passed;
     _threadsWanted = mostlyWaits ? std::min(_threadsWanted * 2, threadsThatWait) : threadsAtWork;
+    _untimedBetween = mostlyWaits ? 0 : untimedBetweenAtWork;
     _timedJobs = 0;
     _passed = _onProcessor = {};
 }

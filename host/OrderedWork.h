@@ -8,6 +8,7 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <vector>
 
 /// Jobs that several threads run and the calling thread takes the results of, in the order of the jobs.
@@ -33,11 +34,19 @@ private:
     static constexpr std::size_t jobsAhead = 64;
     static constexpr std::size_t jobsForAThread = 8; // fewer are done before a thread has started
     static constexpr std::size_t jobsBetweenLooks = 4;
+    static constexpr std::size_t untimedBetweenAtWork = 3; // asking for a thread's time is a call to the system
+
+    /// How long a job took, and how much of that on a processor.
+    struct Times {
+        std::chrono::nanoseconds passed {};
+        std::chrono::nanoseconds onProcessor {};
+    };
 
     bool canClaim() const; // under _lock
     void help();
     void runClaimed(std::unique_lock<std::mutex>& guard);
-    void noteTimes(std::chrono::nanoseconds passed, std::chrono::nanoseconds onProcessor); // under _lock
+    Times runTimed(std::size_t index);
+    void noteTimes(const Times& times); // under _lock
     void startThreads(std::unique_lock<std::mutex>& guard);
 
     const platform::Platform& _platform;
@@ -53,6 +62,8 @@ private:
     std::size_t _helpers = 0;
     std::size_t _threadsWanted = threadsAtWork;
     std::size_t _timedJobs = 0;
+    std::size_t _untimedLeft = 0; // before the next job that is timed
+    std::size_t _untimedBetween = 0;
     std::chrono::nanoseconds _passed {};
     std::chrono::nanoseconds _onProcessor {};
 };

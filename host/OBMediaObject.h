@@ -170,7 +170,8 @@ private:
 
     mutable platform::SmallLock _lock;
     bool _pathIsReal : 1 GUARDED_BY(_lock); // the path was seen to hold no symbolic link: it is its own real path
-    bool _thumbnailProduced : 1 GUARDED_BY(_lock);
+    bool _thumbnailProduced : 7 GUARDED_BY(
+        _lock); // all of the byte: making an object reads no memory, and so fetches none
     std::unique_ptr<OwnFields> _own GUARDED_BY(_lock); // in place of what the origin tells
     std::unique_ptr<MovieThumbnail> _movie GUARDED_BY(_lock); // what the header told; null for a file that is no movie
 };

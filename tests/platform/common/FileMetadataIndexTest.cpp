@@ -1,4 +1,5 @@
 #include "platform/common/FileMetadataIndex.h"
+#include "platform/ContentTypes.h"
 #include "platform/common/FileMovies.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "tests/support/FaultyFileSystem.h"

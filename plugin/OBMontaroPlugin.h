@@ -40,7 +40,7 @@ using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList
 ///                            ProjectReload.cpp
 ///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventClips.cpp, EventYears.cpp,
 ///                            EventOrder.cpp, EventPreference.cpp, EventReload.cpp
-///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp
+///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp, DiskFormats.cpp
 ///   user interaction         ui/Icons.cpp
 ///   operators' questions     Inspection.cpp
 class OBMontaroPlugin : public OBMediaManager, public OBMediaManagerPlugin_MustImplement, private OBSourceInspection {
@@ -126,6 +126,9 @@ public:
     /// A volume was mounted: a thread of its own adds its event folder to those that are searched.
     void _fileSystemMounted(const platform::Notification& notification);
     void _fileSystemMountedThreaded(const platform::Notification& notification);
+    /// Whether the volume that holds `path` is of a type that is fit to hold the editor's libraries; false where nothing
+    /// exists.
+    static bool validDiskFormat(std::string_view path);
 
     // User interaction
 

@@ -15,6 +15,7 @@ public:
     {
         return std::make_unique<OBMontaroPlugin>(context);
     }
+    bool validDiskFormat(std::string_view path) const override { return OBMontaroPlugin::validDiskFormat(path); }
 };
 
 } // namespace

@@ -54,7 +54,20 @@ TEST_CASE("class operations may be asked without a manager")
     CHECK(source->isManagedMediaSource());
     REQUIRE(source->supportedPasteboardTypes().list() != nullptr);
     CHECK(source->supportedPasteboardTypes().list()->empty());
+    CHECK(source->validDiskFormat(test.machine.folder.path()));
+    CHECK_FALSE(source->validDiskFormat(test.machine.folder.path("none")));
     CHECK(test.script->journal.lines().empty());
+}
+
+TEST_CASE("class operations ask the machine of the host that there is")
+{
+    CHECK(OBSharedPlatform() == nullptr);
+    TestHost test;
+    test.host();
+    REQUIRE(OBSharedPlatform() != nullptr);
+    CHECK(&OBSharedPlatform()->fileSystem == &test.machine.files);
+    test.endHost();
+    CHECK(OBSharedPlatform() == nullptr);
 }
 
 TEST_CASE("a plug-in that is not there has neither class nor manager, and that is told")

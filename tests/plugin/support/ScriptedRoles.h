@@ -75,11 +75,15 @@ public:
     platform::Snapshot<std::vector<Volume>> local {};
     platform::Snapshot<std::vector<Volume>> removable {};
     std::function<void()> whenListed {};
+    std::function<std::optional<std::string>(std::string_view path)> typeOfPath {};
 
     std::vector<std::string> localVolumes() const override;
     std::vector<std::string> removableMedia() const override;
     std::string displayName(std::string_view path) const override;
-    std::optional<std::string> fileSystemType(std::string_view) const override { return "ext4"; }
+    std::optional<std::string> fileSystemType(std::string_view path) const override
+    {
+        return typeOfPath ? typeOfPath(path) : "ext4";
+    }
 };
 
 /// Knows the editor, or nothing.

@@ -37,9 +37,9 @@ namespace {
 } // namespace
 
 struct LoadWatch::Watching {
-    explicit Watching(std::shared_ptr<OBMediaManager> watched)
-        : manager(std::move(watched))
-        , platform(manager->platform())
+    explicit Watching(WatchedWork watched)
+        : work(std::move(watched))
+        , platform(work.platform)
         , isTerminal(apps::isTerminal(STDERR_FILENO))
         , started(platform.clock.monotonic())
     {
@@ -49,7 +49,7 @@ struct LoadWatch::Watching {
     {
         auto delay = std::chrono::nanoseconds(untilFirstLine);
         while (platform.clock.sleep(delay, ended)) {
-            tell(manager->loadProgress());
+            tell(work.progress());
             delay = betweenLines;
         }
     }
@@ -70,7 +70,7 @@ struct LoadWatch::Watching {
             return;
         const int columns = std::min(longestProgress, sizeOfTerminal(STDERR_FILENO).columns - 1);
         showProgress(isStuck ? waitingProgress(progress, place, now - progress.pathAtWorkSince, columns)
-                             : progressLine(progress, place, now - started, columns));
+                             : progressLine(progress, place, now - started, columns, work.item));
     }
 
     void end()
@@ -80,7 +80,7 @@ struct LoadWatch::Watching {
         eraseProgress();
     }
 
-    const std::shared_ptr<OBMediaManager> manager;
+    const WatchedWork work;
     const platform::Platform& platform;
     const bool isTerminal;
     const std::chrono::nanoseconds started;
@@ -89,8 +89,13 @@ struct LoadWatch::Watching {
     std::set<std::string> placesNamed GUARDED_BY(telling);
 };
 
-LoadWatch::LoadWatch(std::shared_ptr<OBMediaManager> manager)
-    : _watching(std::make_shared<Watching>(std::move(manager)))
+LoadWatch::LoadWatch(const std::shared_ptr<OBMediaManager>& manager)
+    : LoadWatch(WatchedWork { manager->platform(), [manager] { return manager->loadProgress(); } })
+{
+}
+
+LoadWatch::LoadWatch(WatchedWork work)
+    : _watching(std::make_shared<Watching>(std::move(work)))
 {
     _watching->platform.threads.startDetached("load watch", [watching = _watching] { watching->run(); });
 }
@@ -114,11 +119,11 @@ std::string nameOfPlace(const platform::Platform& platform, std::string_view pat
     return std::string(platform::lastPathComponent(longest == "/" ? path : longest));
 }
 
-std::string progressLine(
-    const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds elapsed, int columns)
+std::string progressLine(const OBLoadProgress& progress, std::string_view place, std::chrono::nanoseconds elapsed,
+    int columns, std::string_view item)
 {
     const std::string facts = "  " + quantityText(progress.foldersDone, "folder") + "  "
-        + quantityText(progress.itemsFound, "clip") + "  " + durationText(elapsed) + "  Ctrl-C cancels";
+        + quantityText(progress.itemsFound, item) + "  " + durationText(elapsed) + "  Ctrl-C cancels";
     const std::string start = "scanning ";
     const int room = columns - displayWidth(facts) - displayWidth(start);
     return withoutMarks(cutAtEnd(start + cutInMiddle(escapedName(place), room > 8 ? room : 8) + facts, columns));

@@ -3,6 +3,8 @@
 #include "apps/common/HostileNames.h"
 #include "apps/common/Terminal.h"
 
+#include <utility>
+
 namespace apps {
 namespace {
 
@@ -55,16 +57,12 @@ std::string Style::name(std::string_view bytes) const
 
 std::string Style::bold(std::string_view laidOut, std::string_view path) const
 {
-    std::string text = drawn(laidOut, "\x1b[1m");
-    if (!_hasLinks || path.empty())
-        return text;
-    static const std::string host = hostName();
-    return "\x1b]8;;" + fileLink(host, path) + "\x1b\\" + text + "\x1b]8;;\x1b\\";
+    return linked(drawn(laidOut, "\x1b[1m"), path);
 }
 
-std::string Style::plain(std::string_view laidOut) const
+std::string Style::plain(std::string_view laidOut, std::string_view path) const
 {
-    return drawn(laidOut, {});
+    return linked(drawn(laidOut, {}), path);
 }
 
 std::string Style::dim(std::string_view laidOut) const
@@ -80,6 +78,15 @@ std::string Style::warning(std::string_view laidOut) const
 std::string Style::failure(std::string_view laidOut) const
 {
     return drawn(laidOut, "\x1b[31m");
+}
+
+/// `text` as a link to `path`, where links are wanted and `path` is not empty.
+std::string Style::linked(std::string text, std::string_view path) const
+{
+    if (!_hasLinks || path.empty())
+        return text;
+    static const std::string host = hostName();
+    return "\x1b]8;;" + fileLink(host, path) + "\x1b\\" + text + "\x1b]8;;\x1b\\";
 }
 
 std::string Style::drawn(std::string_view laidOut, std::string_view sequence) const

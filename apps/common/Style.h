@@ -34,14 +34,15 @@ public:
     std::string name(std::string_view bytes) const;
     /// A name that was laid out, bold; a link to `path` where links are wanted and `path` is not empty.
     std::string bold(std::string_view laidOut, std::string_view path = {}) const;
-    /// A text that was laid out, as it is: marks of escapes drawn or dropped.
-    std::string plain(std::string_view laidOut) const;
+    /// A text that was laid out, as it is: marks of escapes drawn or dropped. A link likewise.
+    std::string plain(std::string_view laidOut, std::string_view path = {}) const;
     std::string dim(std::string_view laidOut) const;
     std::string warning(std::string_view laidOut) const;
     std::string failure(std::string_view laidOut) const;
 
 private:
     std::string drawn(std::string_view laidOut, std::string_view sequence) const;
+    std::string linked(std::string text, std::string_view path) const;
 
     const bool _isTerminal;
     const bool _isColored;

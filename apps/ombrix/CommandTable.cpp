@@ -82,6 +82,17 @@ namespace {
         { "ombrix message --group \"$HOME/Movies/Montaro Projects/Trip\"", "why a project is" },
     };
 
+    constexpr OptionInfo queryOptions[] { zero, json };
+    constexpr Example queryExamples[] {
+        { "ombrix query \"kMDItemFSName = '*trip*'cd\" ~/Movies", "names with \"trip\", or \"Tríp\"" },
+        { "ombrix query 'kMDItemPixelWidth >= 3840' ~ -0 | xargs -0 ls -l", "wide movies" },
+    };
+
+    constexpr Example diskFormatExamples[] {
+        { "ombrix disk-format /media/stick", "whether libraries may lie on a stick" },
+        { "ombrix disk-format ~/Movies", "false for a folder that does not exist, too" },
+    };
+
     constexpr OptionInfo pluginsOptions[] { json };
     constexpr Example pluginsExamples[] {
         { "ombrix plugins", "what was found, and what was refused and why" },
@@ -126,6 +137,22 @@ namespace {
             "Loads once and prints the text that is shown for the group while it is empty;\n"
             "nothing when there is none.",
             messageOptions, true, messageExamples, runMessage },
+        { "query", Intent::ask, "EXPRESSION SCOPE...", anyNumber, "find files by their attributes",
+            "Prints every plain file at or below a SCOPE that EXPRESSION matches, hidden ones\n"
+            "too; links below it are not followed. EXPRESSION is made of comparisons with\n"
+            "&& || ! and parentheses. A comparison is an attribute, then = == != < > <= or\n"
+            ">=, then a value.\n\n"
+            "Texts       kMDItemFSName kMDItemPath kMDItemContentType, only = == !=\n"
+            "            '...' or \"...\": * any characters, ? one, \\ before either for itself;\n"
+            "            behind it c case aside, d accents aside, w as whole words\n"
+            "Numbers     kMDItemFSSize kMDItemDurationSeconds kMDItemPixelWidth\n"
+            "            kMDItemPixelHeight\n"
+            "Dates       kMDItemFSCreationDate kMDItemFSContentChangeDate, with\n"
+            "            $time.iso(\"2011-03-03T10:00:00Z\") or $time.iso(\"2011-03-03\")",
+            queryOptions, false, queryExamples, runQuery },
+        { "disk-format", Intent::ask, "PATH", 1, "say whether a disk is fit to hold libraries",
+            "Prints \"true\" or \"false\", by the file system of the disk that PATH lies on.", {}, true,
+            diskFormatExamples, runDiskFormat },
         { "plugins", Intent::ask, "", 0, "list the plug-ins, and why one is refused",
             "Loads every bundle that is found to see whether it works.", pluginsOptions, false, pluginsExamples,
             runPlugins },

@@ -15,6 +15,8 @@ int runInfo(Program& program);
 int runExplain(Program& program);
 int runMessage(Program& program);
 int runPlugins(Program& program);
+int runQuery(Program& program);
+int runDiskFormat(Program& program);
 int runHelp(Program& program);
 
 } // namespace ombrix

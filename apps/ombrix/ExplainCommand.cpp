@@ -2,16 +2,15 @@
 // and that alone is the answer.
 
 #include "apps/common/RecordJson.h"
+#include "apps/ombrix/AbsolutePath.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Explanation.h"
 #include "apps/ombrix/ExplanationText.h"
 #include "apps/ombrix/Program.h"
 #include "host/OBSourceInspection.h"
-#include "platform/PathText.h"
 
 #include <algorithm>
 #include <cstdio>
-#include <filesystem>
 #include <optional>
 #include <utility>
 
@@ -37,20 +36,6 @@ namespace {
         if (!path.empty())
             paths.push_back(path);
         return std::ferror(stdin) ? std::nullopt : std::optional(std::move(paths));
-    }
-
-    /// Absolute, "." and ".." taken out as text; no link is looked at. The empty path stays empty, and is explained as
-    /// what lies nowhere; absent where there is no current folder.
-    std::optional<std::string> absolutePath(const std::string& path)
-    {
-        std::error_code error;
-        const std::filesystem::path current = std::filesystem::current_path(error);
-        if (path.empty())
-            return path;
-        if (error && path.front() != '/')
-            return std::nullopt;
-        const std::string normal = (current / path).lexically_normal().string();
-        return std::string(platform::pathWithoutTrailingSlashes(normal));
     }
 
     Value jsonOf(const Explanation& explanation)
@@ -171,7 +156,7 @@ int runExplain(Program& program)
     for (const std::string& path : asked) {
         const std::optional<std::string> absolute = absolutePath(path);
         if (!absolute)
-            return program.fail(path, "it is relative, and there is no current folder");
+            return program.fail(path, noCurrentFolder);
         paths.push_back(*absolute);
     }
     const std::shared_ptr<OBMediaManager> manager = program.manager();

@@ -25,6 +25,16 @@ namespace {
         return { source, "the editor is not installed: nothing exists at " + apps::escapedText(path) };
     }
 
+    std::string textOfUnreadFolders(const std::vector<OBLoadProblem>& problems)
+    {
+        if (problems.empty())
+            return {};
+        std::string first = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
+        if (problems.size() == 1)
+            return first;
+        return std::to_string(problems.size()) + " folders could not be read, the first: " + first;
+    }
+
 } // namespace
 
 Program::Program(Arguments arguments)
@@ -116,6 +126,15 @@ std::shared_ptr<OBMediaManager> Program::manager()
     return manager;
 }
 
+const OBMediaManagerClass* Program::managerClass()
+{
+    apps::Session* open = session();
+    const OBMediaManagerClass* managerClass = open ? open->host().managerClass(open->source()) : nullptr;
+    if (open && !managerClass)
+        manager(); // says why there is none
+    return managerClass;
+}
+
 OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
 {
     const std::shared_ptr<OBMediaManager> source = manager();
@@ -154,18 +173,17 @@ Program::GroupAnswer Program::loadGroupOfOption()
 
 std::string Program::unreadFoldersText()
 {
-    const std::vector<OBLoadProblem> problems = manager()->loadProblems();
-    if (problems.empty())
-        return {};
-    std::string first = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
-    if (problems.size() == 1)
-        return first;
-    return std::to_string(problems.size()) + " folders could not be read, the first: " + first;
+    return textOfUnreadFolders(manager()->loadProblems());
 }
 
 void Program::warnOfUnreadFolders()
 {
-    if (const std::string text = unreadFoldersText(); !text.empty())
+    warnOfUnreadFolders(manager()->loadProblems());
+}
+
+void Program::warnOfUnreadFolders(const std::vector<OBLoadProblem>& folders) const
+{
+    if (const std::string text = textOfUnreadFolders(folders); !text.empty())
         warn(text);
 }
 

@@ -51,6 +51,8 @@ public:
     apps::Session* session();
     /// The source's manager; null after having said why.
     std::shared_ptr<OBMediaManager> manager();
+    /// The source's class, without a manager; null after having said why.
+    const OBMediaManagerClass* managerClass();
     /// Loads the tree once, with `observer` told what the scan decides; null after having said why there is none.
     OBMediaGroupRef load(const std::shared_ptr<OBScanObserver>& observer = nullptr);
     /// Where `load` has been: how long it took.
@@ -66,6 +68,8 @@ public:
     std::string unreadFoldersText();
     /// Warns in one line of the folders that the load could not read.
     void warnOfUnreadFolders();
+    /// Warns likewise of these folders.
+    void warnOfUnreadFolders(const std::vector<OBLoadProblem>& folders) const;
 
     /// Hands out what was printed; answers `status`, or that of a failed write, having said so.
     int finish(int status);

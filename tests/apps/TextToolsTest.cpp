@@ -148,6 +148,14 @@ TEST_CASE("a line of progress that is cut holds whole escapes")
     }
 }
 
+TEST_CASE("a line of progress counts what the work finds by its name")
+{
+    OBLoadProgress progress;
+    progress.itemsFound = 1'204;
+    CHECK(progressLine(progress, "Stick", {}, 100).find("  1,204 clips  ") != std::string::npos);
+    CHECK(progressLine(progress, "Stick", {}, 100, "hit").find("  1,204 hits  ") != std::string::npos);
+}
+
 TEST_CASE("an escaped name marks what was escaped in no column")
 {
     const std::string escaped = escapedName("a\x1b");

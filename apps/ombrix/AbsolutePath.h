@@ -1,0 +1,16 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace ombrix {
+
+/// Absolute, "." and ".." taken out as text; no link is looked at. The empty path stays empty; absent where there is no
+/// current folder.
+std::optional<std::string> absolutePath(const std::string& path);
+
+/// Why there is none.
+inline constexpr std::string_view noCurrentFolder = "it is relative, and there is no current folder";
+
+} // namespace ombrix

@@ -1,6 +1,7 @@
 #include "host/FrameworkCore.h"
 
 #include "host/OBLog.h"
+#include "host/WorkCause.h"
 #include "platform/Immortal.h"
 #include "platform/Snapshot.h"
 #include "platform/Threads.h"
@@ -57,15 +58,38 @@ bool FrameworkCore::startThread(const std::string& name, std::function<void()> b
         std::lock_guard guard(_threadsLock);
         ++_threads;
     }
-    const bool started
-        = _platform.threads.startDetached(name, [core = shared_from_this(), work = std::move(body)]() mutable {
-              work();
-              work = nullptr; // what the body held is released before the thread counts as ended
-              core->threadEnded();
-          });
+    const auto run = [core = shared_from_this(), cause = WorkCause::current(), work = std::move(body)]() mutable {
+        {
+            const WorkCause inherited(std::move(cause));
+            work();
+        }
+        work = nullptr; // what the body held is released before the thread counts as ended
+        core->threadEnded();
+    };
+    const bool started = _platform.threads.startDetached(name, run);
     if (!started)
         threadEnded();
     return started;
+}
+
+void FrameworkCore::beginFollowing(const OBFollowOptions& options)
+{
+    platform::Locked guard(_followersLock);
+    if (_followers++ != 0)
+        return;
+    _deliveryThreads.setReused(true);
+    _pathWatcher.follow(options);
+    _volumeNotices.start();
+}
+
+void FrameworkCore::endFollowing()
+{
+    platform::Locked guard(_followersLock);
+    if (--_followers != 0)
+        return;
+    _volumeNotices.stop();
+    _pathWatcher.stopFollowing();
+    _deliveryThreads.setReused(false);
 }
 
 void FrameworkCore::threadEnded()

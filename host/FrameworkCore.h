@@ -1,8 +1,10 @@
 #pragma once
 
+#include "host/DeliveryThreads.h"
 #include "host/OBLog.h"
 #include "host/OBMediaBrowserImageManager.h"
 #include "host/OBPathWatcher.h"
+#include "host/VolumeNotices.h"
 #include "platform/Platform.h"
 #include "platform/Snapshot.h"
 #include "platform/ThreadSafety.h"
@@ -32,6 +34,12 @@ public:
 
     const platform::Platform& platform() const { return _platform; }
     OBPathWatcher& pathWatcher() { return _pathWatcher; }
+    DeliveryThreads& deliveryThreads() { return _deliveryThreads; }
+
+    /// Applications that follow changes come and go; the first of them starts it.
+    void beginFollowing(const OBFollowOptions& options);
+    void endFollowing();
+
     OBMediaBrowserImageManager& imageManager() { return _imageManager; }
 
     void log(std::string_view message, int level, const OBMediaManager* sender) const;
@@ -51,8 +59,13 @@ private:
 
     const platform::Platform _platform;
     platform::Snapshot<std::shared_ptr<const OBLogSink>> _logSink;
-    OBPathWatcher _pathWatcher;
+    OBPathWatcher _pathWatcher { this };
+    DeliveryThreads _deliveryThreads { *this };
+    VolumeNotices _volumeNotices { *this };
     OBMediaBrowserImageManager _imageManager;
+
+    platform::Mutex _followersLock;
+    std::size_t _followers GUARDED_BY(_followersLock) = 0;
 
     platform::Mutex _loggedLock;
     std::set<std::string, std::less<>> _logged GUARDED_BY(_loggedLock);

@@ -6,6 +6,7 @@
 
 #include "host/ManagerState.h"
 
+#include "host/CurrentWork.h"
 #include "platform/Notifications.h"
 #include "platform/Threads.h"
 
@@ -160,12 +161,13 @@ void ManagerState::runLoads()
 /// Takes the next load from the queue; false, and the thread is to end, when there is none.
 bool ManagerState::beginLoad(Job& job)
 {
-    const bool open = gate.begin();
-    std::lock_guard guard(_lock);
+    const bool open = gate.begin(changeTime());
+    std::unique_lock guard(_lock);
     if (!open || _ended || !_loadQueued) {
-        if (open)
-            gate.end();
         _threadRuns = false;
+        guard.unlock();
+        if (open)
+            endWork();
         return false;
     }
     job = _queuedJob;
@@ -199,10 +201,10 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
     progress.pathAtWork.store({});
     std::vector<Waiter> answered;
     Observers listening;
+    bool wasActive = false;
     {
         std::lock_guard guard(_lock);
-        if (std::exchange(_loadActive, false))
-            gate.end();
+        wasActive = std::exchange(_loadActive, false);
         // Asked again, a load that gave no whole tree starts over; by itself it does not, or a cancel would never be
         // one.
         _needsReload = _needsReload || outcome != OBLoadOutcome::loaded;
@@ -212,6 +214,9 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
         _waiters.erase(_waiters.begin(), later);
         listening = _observers;
     }
+    if (wasActive)
+        endWork();
+    core->pathWatcher().resumeReports(&_manager);
     const OBLoadResult result { outcome, root.load() };
     deliver(std::move(answered), result);
     for (const auto& observer : listening) {
@@ -250,8 +255,11 @@ void ManagerState::performLoad()
 {
     // A source that asks for a load while it loads gets one afterwards.
     loadingOnThisThread = nullptr;
-    if (const OBMediaGroupRef group = _manager.performLoadData())
+    const CurrentWork work(core->platform(), {});
+    if (const OBMediaGroupRef group = _manager.performLoadData()) {
         _manager.setRootMediaGroup(group);
+        _manager.rootMediaGroupInstalled(group);
+    }
 }
 
 /// Nothing here waits: what is at work sees the cancel, what sleeps wakes, and each keeps the manager alive until it
@@ -261,6 +269,7 @@ void ManagerState::end()
     std::vector<Waiter> waiting;
     Observers listening;
     decltype(_notifications) notifications;
+    decltype(_postponed) postponed; // they hold the manager
     {
         std::lock_guard guard(_lock);
         if (std::exchange(_ended, true))
@@ -268,6 +277,7 @@ void ManagerState::end()
         waiting = std::exchange(_waiters, {});
         listening = std::exchange(_observers, {});
         notifications = std::exchange(_notifications, {});
+        postponed = std::exchange(_postponed, {});
     }
     gate.close();
     ended.raise();
@@ -310,17 +320,30 @@ ManagerState::Observers ManagerState::observers() const
     return _observers;
 }
 
-void ManagerState::publishRoot(const OBMediaGroupRef& group)
+bool ManagerState::publishRoot(const OBMediaGroupRef& group)
 {
-    root.store(group);
-    for (const auto& observer : observers()) {
-        if (observer->callbacks.rootPublished) {
-            observer->executor([observer, group] {
-                if (!observer->takenBack)
-                    observer->callbacks.rootPublished(group);
-            });
-        }
+    Observers listening;
+    {
+        std::lock_guard guard(_lock);
+        std::erase_if(_formerRoots, [](const std::weak_ptr<OBMediaGroup>& former) { return former.expired(); });
+        const auto isGroup = [&](const std::weak_ptr<OBMediaGroup>& former) { return former.lock() == group; };
+        if (std::any_of(_formerRoots.begin(), _formerRoots.end(), isGroup))
+            return false;
+        if (const OBMediaGroupRef before = root.exchange(group); before && before != group)
+            _formerRoots.push_back(before);
+        listening = _observers;
     }
+    for (const auto& observer : listening) {
+        if (!observer->callbacks.rootPublished && !observer->callbacks.published)
+            continue;
+        observer->executor([observer, publication = CurrentWork::publicationOf(core->platform(), group)] {
+            if (!observer->takenBack && observer->callbacks.rootPublished)
+                observer->callbacks.rootPublished(publication.rootMediaGroup);
+            if (!observer->takenBack && observer->callbacks.published)
+                observer->callbacks.published(publication);
+        });
+    }
+    return true;
 }
 
 void ManagerState::beginPath(const platform::Text& path)

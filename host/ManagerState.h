@@ -73,7 +73,13 @@ struct ManagerState {
 
     std::shared_ptr<ManagerObserver> addObserver(OBExecutor executor, OBManagerCallbacks callbacks);
     void removeObserver(const std::shared_ptr<ManagerObserver>& observer);
-    void publishRoot(const OBMediaGroupRef& group);
+    /// False for a tree that was installed before and has been replaced.
+    bool publishRoot(const OBMediaGroupRef& group);
+
+    // Reloads, and calls of the path watcher.
+    void performReload(std::string_view part, const std::function<void()>& reload);
+    bool performAlone(const std::function<void()>& call);
+    bool holdsReports() const;
     /// Notes what is being read from now on, and tells observers how far the load is, not too often.
     void beginPath(const platform::Text& path);
 
@@ -98,6 +104,9 @@ private:
     bool beginLoad(Job& job);
     void finishLoad(OBLoadOutcome outcome);
     void performLoad();
+    void runReload(std::string_view part, const std::function<void()>& reload);
+    void endWork();
+    platform::Date changeTime() const;
     Observers observers() const;
     static void deliver(std::vector<Waiter> waiters, const OBLoadResult& result);
 
@@ -118,4 +127,6 @@ private:
     Observers _observers;
     std::vector<std::pair<platform::NotificationCenter*, platform::NotificationCenter::Token>> _notifications;
     std::vector<OBLoadProblem> _problems;
+    std::vector<std::weak_ptr<OBMediaGroup>> _formerRoots; // those that somebody still holds
+    std::vector<std::function<void()>> _postponed; // for the main thread, once nothing is at work
 };

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "host/OBMediaGroup.h"
+#include "host/OBPublication.h"
 #include "platform/FileSystem.h"
 #include "platform/Value.h"
 
@@ -43,6 +44,8 @@ struct OBLoadProblem {
 struct OBManagerCallbacks {
     /// A tree was installed, or the installed one was changed and published again.
     std::function<void(OBMediaGroupRef)> rootPublished {};
+    /// The same, with what is known of it.
+    std::function<void(OBPublication)> published {};
     /// At most ten times a second.
     std::function<void(OBLoadProgress)> progressed {};
     std::function<void(OBLoadResult)> loadEnded {};

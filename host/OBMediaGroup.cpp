@@ -209,6 +209,15 @@ void OBMediaGroup::setChildGroups(OBMediaGroupList groups)
     std::swap(_fields.childGroups, groups);
 }
 
+bool OBMediaGroup::replaceChildGroups(const OBMediaGroupList& before, OBMediaGroupList groups)
+{
+    Locked guard(_lock);
+    if (!_fields.childGroups.isSameAs(before))
+        return false;
+    std::swap(_fields.childGroups, groups);
+    return true;
+}
+
 void OBMediaGroup::addChildGroup(OBMediaGroupRef group)
 {
     if (!group)

@@ -1,6 +1,7 @@
 #include "host/OBMediaHost.h"
 
 #include "host/FrameworkCore.h"
+#include "host/LiveQueryTable.h"
 #include "host/PluginLibrary.h"
 
 #include <set>
@@ -43,6 +44,20 @@ const OBMediaManagerClass* OBMediaHost::managerClass(std::string_view identifier
 OBManagerResult OBMediaHost::createManager(std::string_view identifier)
 {
     return _plugins->createManager(_core, identifier);
+}
+
+OBObservation OBMediaHost::followChanges(const OBFollowOptions& options)
+{
+    _core->beginFollowing(options);
+    return OBObservation(std::shared_ptr<void>(nullptr, [core = _core](void*) { core->endFollowing(); }));
+}
+
+OBObservation OBMediaHost::followQuery(const std::shared_ptr<const OBMetadataQuery>& query,
+    const std::vector<std::string>& scope, OBLiveQueryHandlers handlers)
+{
+    const platform::Date now = _core->platform().pathWatching.timeOfChangesNow();
+    const auto following = LiveQueryTable::follow(*_core, query, scope, now, std::move(handlers));
+    return OBObservation(std::shared_ptr<void>(nullptr, [core = _core, following](void*) {}));
 }
 
 OBPathWatcher& OBMediaHost::pathWatcher()

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "host/OBExport.h"
+#include "host/OBLiveQuery.h"
 #include "host/OBLog.h"
 #include "host/OBMediaManager.h"
 #include "host/OBMediaManagerClass.h"
@@ -13,6 +14,7 @@
 #include <string_view>
 #include <vector>
 
+class OBMetadataQuery;
 class PluginLibrary;
 
 /// How an application wants its host.
@@ -58,6 +60,14 @@ public:
     const OBMediaManagerClass* managerClass(std::string_view identifier);
     /// A new manager of the plug-in called `identifier`.
     OBManagerResult createManager(std::string_view identifier);
+
+    /// Follows what managers have registered, and volumes that are mounted, until the answer is dropped. The options
+    /// of whoever follows first count while anybody does.
+    [[nodiscard]] OBObservation followChanges(const OBFollowOptions& options = {});
+    /// Follows the files at and below the folders of `scope` that match `query`, whether or not changes are followed
+    /// otherwise.
+    [[nodiscard]] OBObservation followQuery(const std::shared_ptr<const OBMetadataQuery>& query,
+        const std::vector<std::string>& scope, OBLiveQueryHandlers handlers);
 
     /// The framework's watcher, to see what is registered.
     OBPathWatcher& pathWatcher();

@@ -2,6 +2,7 @@
 
 #include "host/ManagerState.h"
 #include "host/OrderedWork.h"
+#include "host/WorkCause.h"
 #include "platform/Clock.h"
 #include "platform/FileSystem.h"
 #include "platform/MainRunLoop.h"
@@ -39,6 +40,8 @@ OBMediaGroupRef OBMediaManager::performLoadData()
 {
     return nullptr;
 }
+
+void OBMediaManager::rootMediaGroupInstalled(const OBMediaGroupRef&) { }
 
 bool OBMediaManager::canLoadData()
 {
@@ -115,9 +118,9 @@ OBMediaGroupRef OBMediaManager::rootMediaGroup() const
     return _state->root.load();
 }
 
-void OBMediaManager::setRootMediaGroup(const OBMediaGroupRef& group)
+bool OBMediaManager::setRootMediaGroup(const OBMediaGroupRef& group)
 {
-    _state->publishRoot(group);
+    return _state->publishRoot(group);
 }
 
 bool OBMediaManager::isCancelLoadRequestPending() const noexcept
@@ -260,6 +263,49 @@ void OBMediaManager::observeNotification(
             work(posted);
     };
     _state->addNotification(center, center.addObserver(name, nullptr, call));
+}
+
+bool OBMediaManager::sleep(std::chrono::nanoseconds duration)
+{
+    return platform().clock.sleep(duration, _state->ended);
+}
+
+void OBMediaManager::performAfterDelay(
+    std::chrono::nanoseconds delay, platform::RunLoopModes modes, std::function<void()> call)
+{
+    const auto later = [manager = weak_from_this(), cause = WorkCause::current(), work = std::move(call)] {
+        const auto alive = manager.lock();
+        if (!alive || alive->_state->ended.isRaised())
+            return;
+        const WorkCause kept(cause);
+        work();
+    };
+    platform().mainRunLoop.performAfterDelay(delay, modes, later);
+}
+
+void OBMediaManager::performReload(std::string_view part, const std::function<void()>& reload)
+{
+    _state->performReload(part, reload);
+}
+
+std::shared_ptr<void> OBMediaManager::lifeDuringCalls()
+{
+    return weak_from_this().lock();
+}
+
+bool OBMediaManager::holdsReports() const
+{
+    return _state->holdsReports();
+}
+
+bool OBMediaManager::performAlone(const std::function<void()>& call)
+{
+    return _state->performAlone(call);
+}
+
+std::optional<platform::Date> OBMediaManager::changesMatterSince() const
+{
+    return _state->gate.beganAt();
 }
 
 void OBMediaManager::requestRootMediaGroup(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)

@@ -8,9 +8,11 @@
 #include "host/OBPathWatcher.h"
 #include "host/OBScanObserver.h"
 #include "platform/FileSystem.h"
+#include "platform/MainRunLoop.h"
 #include "platform/Notifications.h"
 #include "platform/Platform.h"
 
+#include <chrono>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -83,6 +85,9 @@ public:
     virtual void loadData();
     /// Builds a new tree, on the load thread; the framework installs it. Null leaves what is installed.
     virtual OBMediaGroupRef performLoadData();
+    /// The framework has installed what `performLoadData` answered. On the load thread, before the load ends: what
+    /// reloads put into the tree before this one can be put into this one now.
+    virtual void rootMediaGroupInstalled(const OBMediaGroupRef& root);
     /// Whether a load can produce anything now.
     virtual bool canLoadData();
 
@@ -112,8 +117,9 @@ public:
 
     /// The installed tree, at once; null before the first load.
     OBMediaGroupRef rootMediaGroup() const;
-    /// Publishes a tree, new or changed in place.
-    void setRootMediaGroup(const OBMediaGroupRef& group);
+    /// Publishes a tree, new or changed in place. False, with nothing done, for a tree that another has replaced since it
+    /// was installed: what was changed in it has to be changed in that one.
+    bool setRootMediaGroup(const OBMediaGroupRef& group);
     /// Whether whoever scans is to stop.
     bool isCancelLoadRequestPending() const noexcept;
     /// True until the first `loadData` has returned.
@@ -156,6 +162,23 @@ public:
     /// Calls `handler` for notifications called `name` until the manager ends.
     void observeNotification(
         platform::NotificationCenter& center, std::string_view name, platform::NotificationCenter::Handler handler);
+
+    /// Blocks the calling thread for `duration`; false, at once, when the manager ends. Not counted as work.
+    bool sleep(std::chrono::nanoseconds duration);
+    /// Runs `call` on the main thread once `delay` has passed and the main loop is in one of `modes`, unless the
+    /// manager has ended.
+    void performAfterDelay(std::chrono::nanoseconds delay, platform::RunLoopModes modes, std::function<void()> call);
+    /// Runs `reload` on this thread as a piece of work that can be cancelled, after a pending cancel has ended; `part`
+    /// is the source's word for what it scans. On the main thread it runs while nothing else is at work, later on that
+    /// thread if need be. Not at all once the manager has ended.
+    void performReload(std::string_view part, const std::function<void()>& reload);
+
+    // What the path watcher asks.
+
+    std::shared_ptr<void> lifeDuringCalls() override;
+    bool holdsReports() const override;
+    bool performAlone(const std::function<void()>& call) override;
+    std::optional<platform::Date> changesMatterSince() const override;
 
     // What an application calls. Any thread.
 

@@ -1,20 +1,90 @@
+// Who watches what, and since when; who is told is the lanes' matter.
+
 #include "host/OBPathWatcher.h"
 
 #include "host/FrameworkCore.h"
+#include "host/OBMetadataQuery.h"
+#include "host/QueryFollowing.h"
+#include "host/ReportLane.h"
+#include "platform/Notifications.h"
+#include "platform/PathWatching.h"
 
 #include <algorithm>
 #include <utility>
 
 using platform::Locked;
+using platform::Notification;
+using platform::PathChange;
+
+namespace {
+
+/// The path that an observer is told of, for what was seen to happen.
+std::string pathToReport(const PathChange& change, std::string_view watched)
+{
+    const std::size_t name = change.path.rfind('/');
+    const bool isWatchedPath = change.path.size() <= watched.size();
+    const std::string folder(change.path, 0, std::max<std::size_t>(name, 1));
+    switch (change.kind) {
+    case PathChange::Kind::appeared:
+    case PathChange::Kind::disappeared:
+    case PathChange::Kind::arrivalEnded:
+        return isWatchedPath ? change.path : folder;
+    case PathChange::Kind::contentChanged:
+        // What a folder's list of hidden names says is about the folder.
+        return !isWatchedPath && change.path.ends_with("/.hidden") ? folder : change.path;
+    case PathChange::Kind::found:
+        return {};
+    default:
+        return change.path;
+    }
+}
+
+std::string textOf(const platform::WatchingProblem& problem)
+{
+    const std::string text = problem.path + ": looked at every 10 seconds: " + problem.cause;
+    return problem.remedy.empty() ? text : text + "; to mend it: " + problem.remedy;
+}
+
+} // namespace
 
 OBPathWatcherObserver::~OBPathWatcherObserver() = default;
 
 void OBPathWatcherObserver::watchedPathChanged_fileChangedEventFlags(std::string_view, std::uint64_t) { }
 
-void OBPathWatcherObserver::watchedQueryChanged_queryScope(
-    const platform::Notification&, const std::vector<std::string>&)
+void OBPathWatcherObserver::watchedQueryChanged_queryScope(const Notification&, const std::vector<std::string>&) { }
+
+std::shared_ptr<void> OBPathWatcherObserver::lifeDuringCalls()
+{
+    return nullptr;
+}
+
+bool OBPathWatcherObserver::holdsReports() const
+{
+    return false;
+}
+
+bool OBPathWatcherObserver::performAlone(const std::function<void()>& call)
+{
+    call();
+    return true;
+}
+
+std::optional<platform::Date> OBPathWatcherObserver::changesMatterSince() const
+{
+    return std::nullopt;
+}
+
+OBPathWatcher::OBPathWatcher()
+    : OBPathWatcher(nullptr)
 {
 }
+
+OBPathWatcher::OBPathWatcher(FrameworkCore* core)
+    : _core(core)
+{
+}
+
+OBPathWatcher::~OBPathWatcher() = default;
 
 std::shared_ptr<OBPathWatcher> OBPathWatcher::sharedPathWatcher()
 {
@@ -28,48 +98,182 @@ bool OBPathWatcher::watchPathIsUnique_observer(std::string_view path, const OBPa
     const auto known = _registrations.find(observer);
     if (known == _registrations.end())
         return true;
-    const std::vector<std::string>& paths = known->second.paths;
-    return std::find(paths.begin(), paths.end(), path) == paths.end();
+    const std::vector<WatchedPath>& paths = known->second.paths;
+    return std::none_of(paths.begin(), paths.end(), [&](const WatchedPath& other) { return other.path == path; });
 }
 
 void OBPathWatcher::watchPath_observer(std::string_view path, OBPathWatcherObserver* observer)
 {
+    const platform::Date since = changesMatterSince(*observer);
     Locked guard(_lock);
-    std::vector<std::string>& paths = _registrations[observer].paths;
-    if (std::find(paths.begin(), paths.end(), path) == paths.end())
-        paths.emplace_back(path);
+    std::vector<WatchedPath>& paths = registrationsOf(observer).paths;
+    if (std::any_of(paths.begin(), paths.end(), [&](const WatchedPath& other) { return other.path == path; }))
+        return;
+    WatchedPath& added = paths.emplace_back(WatchedPath { std::string(path), since });
+    if (_follows)
+        startPath(added, *observer);
 }
 
 void OBPathWatcher::watchQuery_observer_queryScope_queryRunMode(
     std::string_view query, OBPathWatcherObserver* observer, std::vector<std::string> scope, int runMode)
 {
-    Query registration { std::string(query), std::move(scope), runMode };
+    WatchedQuery registration { { std::string(query), std::move(scope), runMode }, changesMatterSince(*observer) };
+    Registrations replaced; // ended after the lock
     Locked guard(_lock);
-    std::vector<Query>& queries = _registrations[observer].queries;
-    const auto known
-        = std::find_if(queries.begin(), queries.end(), [&](const Query& other) { return other.text == query; });
-    if (known != queries.end())
-        *known = std::move(registration);
-    else
-        queries.push_back(std::move(registration));
+    std::vector<WatchedQuery>& queries = registrationsOf(observer).queries;
+    auto known = std::find_if(
+        queries.begin(), queries.end(), [&](const WatchedQuery& other) { return other.query.text == query; });
+    if (known == queries.end())
+        known = queries.insert(known, std::move(registration));
+    else if (known->query.scope != registration.query.scope || known->query.runMode != runMode)
+        replaced.queries.push_back(std::exchange(*known, std::move(registration)));
+    if (_follows && !known->watch)
+        startQuery(*known, *observer);
 }
 
 void OBPathWatcher::removeObserver(const OBPathWatcherObserver* observer)
 {
-    Locked guard(_lock);
-    _registrations.erase(observer);
+    Registrations removed;
+    {
+        Locked guard(_lock);
+        if (auto known = _registrations.extract(observer))
+            removed = std::move(known.mapped());
+    }
+    stop(removed);
+}
+
+void OBPathWatcher::resumeReports(const OBPathWatcherObserver* observer)
+{
+    std::vector<std::shared_ptr<ReportLane>> lanes;
+    {
+        Locked guard(_lock);
+        const auto known = _registrations.find(observer);
+        if (known == _registrations.end())
+            return;
+        for (const WatchedPath& path : known->second.paths)
+            lanes.push_back(path.lane);
+        for (const WatchedQuery& query : known->second.queries)
+            lanes.push_back(query.lane);
+    }
+    for (const auto& lane : lanes) {
+        if (lane)
+            lane->resume();
+    }
 }
 
 std::vector<std::string> OBPathWatcher::pathsWatchedBy(const OBPathWatcherObserver* observer) const
 {
     Locked guard(_lock);
-    const auto known = _registrations.find(observer);
-    return known != _registrations.end() ? known->second.paths : std::vector<std::string>();
+    std::vector<std::string> paths;
+    if (const auto known = _registrations.find(observer); known != _registrations.end()) {
+        for (const WatchedPath& path : known->second.paths)
+            paths.push_back(path.path);
+    }
+    return paths;
 }
 
 std::vector<OBPathWatcher::Query> OBPathWatcher::queriesWatchedBy(const OBPathWatcherObserver* observer) const
 {
     Locked guard(_lock);
-    const auto known = _registrations.find(observer);
-    return known != _registrations.end() ? known->second.queries : std::vector<Query>();
+    std::vector<Query> queries;
+    if (const auto known = _registrations.find(observer); known != _registrations.end()) {
+        for (const WatchedQuery& query : known->second.queries)
+            queries.push_back(query.query);
+    }
+    return queries;
+}
+
+void OBPathWatcher::follow(const OBFollowOptions& options)
+{
+    _callsOnMainThread = options.callsOnMainThread;
+    Locked guard(_lock);
+    if (std::exchange(_follows, true))
+        return;
+    for (auto& [observer, registered] : _registrations) {
+        for (WatchedPath& path : registered.paths)
+            startPath(path, *registered.observer);
+        for (WatchedQuery& query : registered.queries)
+            startQuery(query, *registered.observer);
+    }
+}
+
+void OBPathWatcher::stopFollowing()
+{
+    AllRegistrations before;
+    {
+        Locked guard(_lock);
+        _follows = false;
+        for (auto& [observer, registered] : _registrations) {
+            Registrations& stopped = before[observer];
+            for (WatchedPath& path : registered.paths)
+                stopped.paths.push_back(
+                    { {}, {}, std::exchange(path.lane, nullptr), std::exchange(path.watch, nullptr) });
+            for (WatchedQuery& query : registered.queries)
+                stopped.queries.push_back(
+                    { {}, {}, std::exchange(query.lane, nullptr), std::exchange(query.watch, nullptr) });
+        }
+    }
+    for (auto& [observer, stopped] : before)
+        stop(stopped);
+}
+
+OBPathWatcher::Registrations& OBPathWatcher::registrationsOf(OBPathWatcherObserver* observer)
+{
+    Registrations& registered = _registrations[observer];
+    registered.observer = observer;
+    return registered;
+}
+
+void OBPathWatcher::startPath(WatchedPath& path, OBPathWatcherObserver& observer)
+{
+    path.lane = std::make_shared<ReportLane>(*_core, observer, path.path, std::string(),
+        [&observer](const std::string& report) { observer.watchedPathChanged_fileChangedEventFlags(report, 0); });
+    const auto changed = [lane = path.lane, watched = path.path](const PathChange& change) {
+        if (const std::string report = pathToReport(change, watched); !report.empty())
+            lane->add(report);
+    };
+    const auto failed = [core = _core->weak_from_this()](const platform::WatchingProblem& problem) {
+        if (const auto alive = core.lock())
+            alive->logOnce(textOf(problem), nullptr);
+    };
+    path.watch = _core->platform().pathWatching.watch(path.path, path.since, { changed, nullptr, failed });
+}
+
+void OBPathWatcher::startQuery(WatchedQuery& query, OBPathWatcherObserver& observer)
+{
+    const OBMetadataQuery::ParseResult parsed = OBMetadataQuery::parse(query.query.text);
+    if (!parsed.query) {
+        _core->logOnce(query.query.text + ": " + parsed.problem, nullptr);
+        return;
+    }
+    query.lane = std::make_shared<ReportLane>(*_core, observer, std::string(platform::metadataQueryUpdatedNotification),
+        "files came or went: " + query.query.text, [&observer, scope = query.query.scope](const std::string& name) {
+            observer.watchedQueryChanged_queryScope({ platform::Text(name) }, scope);
+        });
+    const auto tell = [lane = query.lane](std::string_view name) { lane->add(std::string(name)); };
+    query.watch = followQuery(*_core, parsed.query, query.query.scope, query.since, tell);
+}
+
+platform::Date OBPathWatcher::changesMatterSince(const OBPathWatcherObserver& observer) const
+{
+    if (const std::optional<platform::Date> since = observer.changesMatterSince())
+        return *since;
+    return _core ? _core->platform().pathWatching.timeOfChangesNow() : platform::Date {};
+}
+
+/// The watches first: they feed the lanes.
+void OBPathWatcher::stop(Registrations& registrations)
+{
+    for (WatchedPath& path : registrations.paths)
+        path.watch = nullptr;
+    for (WatchedQuery& query : registrations.queries)
+        query.watch = nullptr;
+    for (const WatchedPath& path : registrations.paths) {
+        if (path.lane)
+            path.lane->close();
+    }
+    for (const WatchedQuery& query : registrations.queries) {
+        if (query.lane)
+            query.lane->close();
+    }
 }

@@ -2,19 +2,27 @@
 
 #include "host/OBExport.h"
 #include "platform/ThreadSafety.h"
+#include "platform/Value.h"
 
+#include <atomic>
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
+
+class FrameworkCore;
+class OBMetadataQuery;
+class ReportLane;
 
 namespace platform {
 struct Notification;
 }
 
-/// Hears of changes. The calls may come on any thread.
+/// Hears of changes. The calls may come on any thread, two at once for each path and query.
 class OB_EXPORT OBPathWatcherObserver {
 public:
     virtual ~OBPathWatcherObserver();
@@ -23,11 +31,31 @@ public:
     /// The result of a query changed, or it finished gathering: the notification's name tells which.
     virtual void watchedQueryChanged_queryScope(
         const platform::Notification& notification, const std::vector<std::string>& scope);
+
+    // What the watcher asks of an observer; most have no need to answer.
+
+    /// What keeps this object alive during a call. Null for an object that takes itself back before it ends.
+    virtual std::shared_ptr<void> lifeDuringCalls();
+    /// Whether reports have to wait, until `resumeReports`.
+    virtual bool holdsReports() const;
+    /// Makes a call on the main thread while nothing else of this object is at work; false, with nothing called, when
+    /// something is: then not before `resumeReports`.
+    virtual bool performAlone(const std::function<void()>& call);
+    /// Since when changes matter to what is registered now; absent for now.
+    virtual std::optional<platform::Date> changesMatterSince() const;
+};
+
+/// How an application wants to follow changes.
+struct OBFollowOptions {
+    /// Observers are called on the main thread, and then none while a load or reload of theirs is at work elsewhere,
+    /// which in turn waits for the call. Otherwise they are called on threads of the framework, free to sleep.
+    bool callsOnMainThread = false;
 };
 
 /// The framework's one watcher of paths and metadata queries. Any thread.
 ///
-/// Registering lists what is to be watched; it costs the same whether or not an application follows changes.
+/// Registering lists what is to be watched. Nothing is watched or gathered until an application follows changes
+/// (`OBMediaHost::followChanges`).
 class OB_EXPORT OBPathWatcher {
 public:
     struct Query {
@@ -35,6 +63,13 @@ public:
         std::vector<std::string> scope;
         int runMode = 0;
     };
+
+    OBPathWatcher();
+    /// For the framework.
+    explicit OBPathWatcher(FrameworkCore* core);
+    ~OBPathWatcher();
+    OBPathWatcher(const OBPathWatcher&) = delete;
+    OBPathWatcher& operator=(const OBPathWatcher&) = delete;
 
     /// The watcher of the host; null while there is no host.
     static std::shared_ptr<OBPathWatcher> sharedPathWatcher();
@@ -44,23 +79,54 @@ public:
     /// Starts watching a file or folder, which need not exist. Watching it again changes nothing.
     void watchPath_observer(std::string_view path, OBPathWatcherObserver* observer);
     /// Starts a live metadata query over `scope`, taken as it stands now. The same observer registering the same text
-    /// replaces its registration.
+    /// replaces its registration. A text that is no query is logged once and finds nothing.
     void watchQuery_observer_queryScope_queryRunMode(
         std::string_view query, OBPathWatcherObserver* observer, std::vector<std::string> scope, int runMode);
 
-    /// Takes back everything that `observer` registered.
+    /// Takes back everything that `observer` registered. No call begins any more, and calls under way on other threads
+    /// have returned, unless the observer keeps itself alive during calls.
     void removeObserver(const OBPathWatcherObserver* observer);
+    /// What made `observer` hold reports or refuse calls may have ended.
+    void resumeReports(const OBPathWatcherObserver* observer);
 
     /// What `observer` watches, in the order of registration.
     std::vector<std::string> pathsWatchedBy(const OBPathWatcherObserver* observer) const;
     std::vector<Query> queriesWatchedBy(const OBPathWatcherObserver* observer) const;
 
-private:
-    struct Registrations {
-        std::vector<std::string> paths;
-        std::vector<Query> queries;
-    };
+    /// For the framework: watches what is registered from now on, and ends that.
+    void follow(const OBFollowOptions& options);
+    void stopFollowing();
+    bool callsOnMainThread() const { return _callsOnMainThread; }
 
-    mutable platform::Mutex _lock;
-    std::map<const OBPathWatcherObserver*, Registrations> _registrations GUARDED_BY(_lock);
+private:
+    struct WatchedPath {
+        std::string path;
+        platform::Date since;
+        std::shared_ptr<ReportLane> lane {};
+        std::shared_ptr<void> watch {}; // taken back before the lane
+    };
+    struct WatchedQuery {
+        Query query;
+        platform::Date since;
+        std::shared_ptr<ReportLane> lane {};
+        std::shared_ptr<void> watch {};
+    };
+    struct Registrations {
+        OBPathWatcherObserver* observer = nullptr;
+        std::vector<WatchedPath> paths {};
+        std::vector<WatchedQuery> queries {};
+    };
+    using AllRegistrations = std::map<const OBPathWatcherObserver*, Registrations>;
+
+    Registrations& registrationsOf(OBPathWatcherObserver* observer) REQUIRES(_lock);
+    void startPath(WatchedPath& path, OBPathWatcherObserver& observer) REQUIRES(_lock);
+    void startQuery(WatchedQuery& query, OBPathWatcherObserver& observer) REQUIRES(_lock);
+    platform::Date changesMatterSince(const OBPathWatcherObserver& observer) const;
+    static void stop(Registrations& registrations);
+
+    FrameworkCore* const _core;
+    std::atomic<bool> _callsOnMainThread { false };
+    mutable platform::Mutex _lock; // never taken while a report is told or delivered
+    bool _follows GUARDED_BY(_lock) = false;
+    AllRegistrations _registrations GUARDED_BY(_lock);
 };

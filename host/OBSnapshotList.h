@@ -53,6 +53,12 @@ public:
         return result;
     }
 
+    /// Whether `other` is this very list, or a copy of it; lists made apart are not, whatever they hold.
+    bool isSameAs(const OBSnapshotList& other) const noexcept
+    {
+        return _count == other._count && (_count == 0 || _storage == other._storage);
+    }
+
     /// Whether nobody else holds this list, or one that shares its storage.
     bool isSoleOwner() const noexcept { return _storage && _storage.use_count() == 1; }
 

@@ -14,6 +14,11 @@ namespace platform {
 inline constexpr std::string_view volumeMountedNotification = "VolumeMounted";
 inline constexpr std::string_view mountedVolumePathKey = "DevicePath";
 
+/// The names under which the observer of a metadata query hears of it: that it has found what was there, and that files
+/// came into its result or left it.
+inline constexpr std::string_view metadataQueryFinishedGatheringNotification = "MetadataQueryDidFinishGathering";
+inline constexpr std::string_view metadataQueryUpdatedNotification = "MetadataQueryDidUpdate";
+
 /// One notification: a name, the object it is about (an identity, never dereferenced) and further facts.
 struct Notification {
     Text name;

@@ -88,6 +88,18 @@ OBMediaGroupRef ScriptedManager::performLoadData()
     return root;
 }
 
+void ScriptedManager::rootMediaGroupInstalled(const OBMediaGroupRef& root)
+{
+    if (_script->whenInstalled)
+        _script->whenInstalled(*this, root);
+}
+
+void ScriptedManager::watchedPathChanged_fileChangedEventFlags(std::string_view path, std::uint64_t)
+{
+    if (_script->whenPathChanged)
+        _script->whenPathChanged(*this, path);
+}
+
 bool ScriptedManager::canLoadData()
 {
     _script->journal.write("canLoadData");

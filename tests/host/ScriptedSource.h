@@ -8,6 +8,7 @@
 #include <functional>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <thread>
 
 namespace tests {
@@ -20,6 +21,9 @@ struct Script {
     std::function<void(ScriptedManager&)> whenLoadData {}; ///< before the base operation
     std::function<void(ScriptedManager&)> whenPerforming {}; ///< before the gate
     std::function<OBMediaGroupRef(ScriptedManager&)> whenReturning {}; ///< a new tree where it is not set
+
+    std::function<void(ScriptedManager&, std::string_view path)> whenPathChanged {};
+    std::function<void(ScriptedManager&, const OBMediaGroupRef& root)> whenInstalled {};
 
     std::atomic<bool> canLoad { true };
     std::atomic<int> loads { 0 }; ///< begun
@@ -42,6 +46,8 @@ public:
     void loadData() override;
     OBMediaGroupRef performLoadData() override;
     bool canLoadData() override;
+    void rootMediaGroupInstalled(const OBMediaGroupRef& root) override;
+    void watchedPathChanged_fileChangedEventFlags(std::string_view path, std::uint64_t flags) override;
 
 private:
     const std::shared_ptr<Script> _script;

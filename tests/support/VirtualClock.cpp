@@ -26,6 +26,7 @@ bool VirtualClock::sleep(std::chrono::nanoseconds duration, platform::WakeSignal
     std::unique_lock guard(_mutex);
     const std::chrono::nanoseconds end = _passed + duration;
     ++_sleepers;
+    const auto mine = _ends.insert(end);
     _changed.notify_all();
     bool isAwake = wake.isRaised();
     while (!isAwake && _passed < end) {
@@ -33,6 +34,7 @@ bool VirtualClock::sleep(std::chrono::nanoseconds duration, platform::WakeSignal
         isAwake = wake.isRaised();
     }
     --_sleepers;
+    _ends.erase(mine);
     _changed.notify_all();
     return !isAwake;
 }
@@ -49,6 +51,13 @@ bool VirtualClock::waitForSleepers(int count) const
     constexpr std::chrono::minutes longest { 1 };
     std::unique_lock guard(_mutex);
     return _changed.wait_for(guard, longest, [this, count] { return _sleepers >= count; });
+}
+
+bool VirtualClock::waitForSleep(std::chrono::nanoseconds left) const
+{
+    constexpr std::chrono::minutes longest { 1 };
+    std::unique_lock guard(_mutex);
+    return _changed.wait_for(guard, longest, [this, left] { return _ends.contains(_passed + left); });
 }
 
 int VirtualClock::sleepers() const

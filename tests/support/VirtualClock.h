@@ -4,6 +4,7 @@
 
 #include <condition_variable>
 #include <mutex>
+#include <set>
 
 namespace tests {
 
@@ -23,6 +24,8 @@ public:
     void advance(std::chrono::nanoseconds duration);
     /// Waits until at least `count` threads sleep. False when that has not happened within a minute of real time.
     bool waitForSleepers(int count) const;
+    /// Waits until a thread sleeps that has exactly `left` still to sleep. False as above.
+    bool waitForSleep(std::chrono::nanoseconds left) const;
     /// How many threads sleep now.
     int sleepers() const;
 
@@ -32,6 +35,7 @@ private:
     mutable std::condition_variable _changed;
     std::chrono::nanoseconds _passed {};
     mutable int _sleepers = 0;
+    mutable std::multiset<std::chrono::nanoseconds> _ends {}; // of those sleeps
 };
 
 } // namespace tests

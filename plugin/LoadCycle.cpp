@@ -81,11 +81,33 @@ void OBMontaroPlugin::registerQueries()
         movieQuery, this, stringsOf(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
 }
 
+/// A reload that began after this load's scan of its half, and ended before the load did, has changed the tree that this
+/// one replaces.
+void OBMontaroPlugin::rootMediaGroupInstalled(const OBMediaGroupRef&)
+{
+    const ScanHistory::Result projects = _projectScans.latest();
+    if (projects.number > _projectScans.loaded())
+        publish([&] { return replaceProjects(projects.library, projects.number); });
+    const ScanHistory::Result events = _eventScans.latest();
+    if (events.number > _eventScans.loaded())
+        publish([&] { return replaceEvents(events.library, events.number); });
+}
+
+/// The children may be replaced meanwhile, by a reload of the other half; the objects are made of the last.
 void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& root)
+{
+    OBMediaGroupList children;
+    do {
+        children = root->childGroups();
+        root->setMediaObjects(mediaObjectsOfRoot(children));
+    } while (!children.isSameAs(root->childGroups()));
+}
+
+OBMediaObjectList OBMontaroPlugin::mediaObjectsOfRoot(const OBMediaGroupList& children)
 {
     const std::shared_ptr<const OBMediaObjectKind> kind = representativeKind(*this, projectFormatVersion);
     OBMediaObjectList objects;
-    for (const OBMediaGroupRef& child : root->childGroups()) {
+    for (const OBMediaGroupRef& child : children) {
         const OBTypeIdentifierRef type = child->typeIdentifier();
         if (type == OBMontaroProjectLibraryGroupTypeIdentifier)
             continue;
@@ -97,7 +119,7 @@ void OBMontaroPlugin::_setMediaObjectsForRootMediaGroup(const OBMediaGroupRef& r
         if (chosen.movie)
             objects = objects.appending(makeRepresentative(kind, *child, chosen));
     }
-    root->setMediaObjects(std::move(objects));
+    return objects;
 }
 
 bool OBMontaroPlugin::canLoadData()
@@ -135,4 +157,18 @@ Text OBMontaroPlugin::defaultNoDataMessage(const OBMediaGroupRef& group)
         && group->mediaObjects().empty())
         return localizedString("MTProjectNotReady");
     return {};
+}
+
+/// Hands the installed tree to the framework again after `replace` has changed it. A load may install another tree
+/// meanwhile; then that one is changed. False from `replace`: the tree is another scan's matter.
+void OBMontaroPlugin::publish(const std::function<bool()>& replace)
+{
+    while (replace()) {
+        const OBMediaGroupRef root = rootMediaGroup();
+        if (!root)
+            return;
+        _setMediaObjectsForRootMediaGroup(root);
+        if (setRootMediaGroup(root))
+            return;
+    }
 }

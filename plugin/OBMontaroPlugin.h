@@ -2,6 +2,8 @@
 
 #include "host/OBMediaManager.h"
 #include "host/OBSourceInspection.h"
+#include "plugin/ScanHistory.h"
+
 #include "platform/Notifications.h"
 #include "platform/Snapshot.h"
 #include "platform/ThreadSafety.h"
@@ -63,6 +65,7 @@ public:
 
     void loadData() override;
     OBMediaGroupRef performLoadData() override;
+    void rootMediaGroupInstalled(const OBMediaGroupRef& root) override;
     bool canLoadData() override;
     OBMediaGroupList mediaGroups() override;
     OBMediaGroupList movieGroups() override;
@@ -123,6 +126,9 @@ public:
     // Watching
 
     void _watchPath(const platform::Text& path);
+    void watchedPathChanged_fileChangedEventFlags(std::string_view path, std::uint64_t flags) override;
+    void watchedQueryChanged_queryScope(
+        const platform::Notification& notification, const std::vector<std::string>& scope) override;
     /// A volume was mounted: a thread of its own adds its event folder to those that are searched.
     void _fileSystemMounted(const platform::Notification& notification);
     void _fileSystemMountedThreaded(const platform::Notification& notification);
@@ -147,6 +153,13 @@ private:
     std::optional<std::string> pluginVersionString() const override;
 
     void registerQueries();
+    OBMediaObjectList mediaObjectsOfRoot(const OBMediaGroupList& children);
+    void refreshThumbnailOfRootObject(std::string_view path);
+    void projectsChanged();
+    void eventsChanged();
+    bool replaceProjects(const OBMediaGroupRef& library, ScanHistory::Number scan);
+    bool replaceEvents(const OBMediaGroupRef& library, ScanHistory::Number scan);
+    void publish(const std::function<bool()>& replace);
     bool addEventsSearchPath(const platform::Text& path);
     /// An absolute path for one that begins with "~"; absent while no home folder is known.
     platform::Text expandingTilde(std::string_view path) const;
@@ -179,5 +192,7 @@ private:
     std::unique_ptr<platform::Mutex> _MontaroEventsSearchPathsLock; // held for a whole events folder walk
     std::atomic<bool> _poolingProjectsReload { false };
     std::atomic<bool> _poolingEventsReload { false };
+    ScanHistory _projectScans;
+    ScanHistory _eventScans;
     std::map<std::string, OBImageRef> cachedIcons; // images are shared by the class instead; this stays empty
 };

@@ -70,6 +70,9 @@ void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newe
 OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const Text& parentID, bool updateRoot)
 {
     _poolingEventsReload = false;
+    const ScanHistory::Number number = _eventScans.begin();
+    if (!updateRoot)
+        _eventScans.beganForLoad(number);
     EventScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), clipKind(),
         localizedString("MontaroClipNameDisplayFormat"), sharedValues().eventIcon.load(),
         sharedValues().calendarIcon.load() };
@@ -84,12 +87,10 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
     OBMediaGroupRef library = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
     groupEventsByYear(*library, collected->childGroups(), scan);
     sortEventsWithinYears(*library);
-    if (!isCancelLoadRequestPending() && updateRoot) {
-        finishReloadMontaroEvents(library);
-        if (const OBMediaGroupRef root = rootMediaGroup()) {
-            _setMediaObjectsForRootMediaGroup(root);
-            setRootMediaGroup(root);
-        }
+    if (!isCancelLoadRequestPending()) {
+        _eventScans.keep(number, library);
+        if (updateRoot)
+            publish([&] { return replaceEvents(library, number); });
     }
     return library;
 }

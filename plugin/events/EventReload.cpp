@@ -10,19 +10,12 @@
 
 #include <utility>
 
-OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents()
-{
-    const OBMediaGroupRef root = rootMediaGroup();
-    return _reloadMontaroEvents_updateRootMediaGroup(root ? root->ID() : platform::Text(), true);
-}
+namespace {
 
-void OBMontaroPlugin::finishReloadMontaroEvents(const OBMediaGroupRef& library)
+/// The new library in the place of each old one, or behind everything where there was none.
+std::vector<OBMediaGroupRef> childrenWithEvents(const OBMediaGroupList& before, const OBMediaGroupRef& library)
 {
-    const OBMediaGroupRef root = rootMediaGroup();
-    if (!root)
-        return;
     const bool hasClips = library && !library->mediaObjects().empty();
-    const OBMediaGroupList before = root->childGroups();
     std::vector<OBMediaGroupRef> children;
     bool isPlaced = false;
     for (std::size_t index = 0; index < before.size(); ++index) {
@@ -38,9 +31,32 @@ void OBMontaroPlugin::finishReloadMontaroEvents(const OBMediaGroupRef& library)
     }
     if (!isPlaced && hasClips)
         children.push_back(library);
+    return sortedGroups(std::move(children), MontaroSupport::_MontaroRootGroupComparison);
+}
 
-    std::vector<OBMediaGroupRef> sorted
-        = sortedGroups(std::move(children), MontaroSupport::_MontaroRootGroupComparison);
-    if (!isCancelLoadRequestPending())
-        root->setChildGroups(OBMediaGroupList(std::move(sorted)));
+} // namespace
+
+OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents()
+{
+    const OBMediaGroupRef root = rootMediaGroup();
+    return _reloadMontaroEvents_updateRootMediaGroup(root ? root->ID() : platform::Text(), true);
+}
+
+void OBMontaroPlugin::finishReloadMontaroEvents(const OBMediaGroupRef& library)
+{
+    replaceEvents(library, ScanHistory::latestScan);
+}
+
+/// False when a scan that began later has put, or will put, its own result into the tree.
+bool OBMontaroPlugin::replaceEvents(const OBMediaGroupRef& library, ScanHistory::Number scan)
+{
+    while (const OBMediaGroupRef root = rootMediaGroup()) {
+        const OBMediaGroupList before = root->childGroups();
+        if (_eventScans.isSuperseded(scan))
+            return false;
+        std::vector<OBMediaGroupRef> sorted = childrenWithEvents(before, library);
+        if (isCancelLoadRequestPending() || root->replaceChildGroups(before, OBMediaGroupList(std::move(sorted))))
+            break;
+    }
+    return true;
 }

@@ -49,11 +49,22 @@ bool isProject(const OBMontaroPlugin& plugin, const ScanReport& report, const Fo
     return false;
 }
 
+/// A library that holds `groups`.
+OBMediaGroupRef libraryOf(const OBMediaGroupList& groups)
+{
+    const OBMediaGroupRef library = OBMediaGroup::initWithTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
+    library->setChildGroups(groups);
+    return library;
+}
+
 } // namespace
 
 OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
 {
     _poolingProjectsReload = false;
+    const ScanHistory::Number number = _projectScans.begin();
+    if (!updateRoot)
+        _projectScans.beganForLoad(number);
     ProjectScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), movieKind(*this),
         sharedValues().projectIcon.load(), sharedValues().emptyProjectIcon.load() };
     _flatProjectGroupsList.store(scan.flatGroups);
@@ -83,19 +94,19 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
         }
     }
 
-    if (!libraries.empty() && !isCancelLoadRequestPending() && updateRoot) {
+    const bool isWhole = !libraries.empty() && !isCancelLoadRequestPending();
+    if (isWhole && updateRoot) {
         for (std::size_t index = 1; index < libraries.size(); ++index)
             libraries.front()->addChildGroups(libraries[index]->childGroups());
-        finishReloadMontaroProjects(libraries.front());
-        if (const OBMediaGroupRef root = rootMediaGroup()) {
-            _setMediaObjectsForRootMediaGroup(root);
-            setRootMediaGroup(root);
-        }
+        _projectScans.keep(number, libraries.front());
+        publish([&] { return replaceProjects(libraries.front(), number); });
     }
 
     OBMediaGroupList result;
     for (const OBMediaGroupRef& library : libraries)
         result = result.appending(library->childGroups());
+    if (isWhole && !updateRoot)
+        _projectScans.keep(number, libraryOf(result));
     return result;
 }
 

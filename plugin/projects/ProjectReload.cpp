@@ -8,6 +8,24 @@
 
 #include <utility>
 
+namespace {
+
+/// The old projects and folders leave, the new ones come, everything else stays.
+std::vector<OBMediaGroupRef> childrenWithProjects(const OBMediaGroupList& before, const OBMediaGroupRef& library)
+{
+    std::vector<OBMediaGroupRef> children;
+    for (const OBMediaGroupRef& child : before) {
+        const OBTypeIdentifierRef type = child->typeIdentifier();
+        if (type != OBMontaroProjectGroupTypeIdentifier && type != OBMontaroFolderGroupTypeIdentifier)
+            children.push_back(child);
+    }
+    const OBMediaGroupList found = library->childGroups();
+    children.insert(children.end(), found.begin(), found.end());
+    return sortedGroups(std::move(children), MontaroSupport::_MontaroRootGroupComparison);
+}
+
+} // namespace
+
 OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects()
 {
     return _reloadMontaroProjects(true);
@@ -15,22 +33,20 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects()
 
 void OBMontaroPlugin::finishReloadMontaroProjects(const OBMediaGroupRef& library)
 {
-    const OBMediaGroupRef root = rootMediaGroup();
-    if (!root)
-        return;
-    std::vector<OBMediaGroupRef> children;
-    for (const OBMediaGroupRef& child : root->childGroups()) {
-        const OBTypeIdentifierRef type = child->typeIdentifier();
-        if (type != OBMontaroProjectGroupTypeIdentifier && type != OBMontaroFolderGroupTypeIdentifier)
-            children.push_back(child);
-    }
-    const OBMediaGroupList found = library->childGroups();
-    children.insert(children.end(), found.begin(), found.end());
+    replaceProjects(library, ScanHistory::latestScan);
+}
 
-    std::vector<OBMediaGroupRef> sorted
-        = sortedGroups(std::move(children), MontaroSupport::_MontaroRootGroupComparison);
-    // With the editor gone, a library that vanished together with it keeps showing.
-    if (sorted.empty() && !canLoadData())
-        return;
-    root->setChildGroups(OBMediaGroupList(std::move(sorted)));
+/// False when a scan that began later has put, or will put, its own result into the tree.
+bool OBMontaroPlugin::replaceProjects(const OBMediaGroupRef& library, ScanHistory::Number scan)
+{
+    while (const OBMediaGroupRef root = rootMediaGroup()) {
+        const OBMediaGroupList before = root->childGroups();
+        if (_projectScans.isSuperseded(scan))
+            return false;
+        std::vector<OBMediaGroupRef> sorted = childrenWithProjects(before, library);
+        // With the editor gone, a library that vanished together with it keeps showing.
+        if ((sorted.empty() && !canLoadData()) || root->replaceChildGroups(before, OBMediaGroupList(std::move(sorted))))
+            break;
+    }
+    return true;
 }

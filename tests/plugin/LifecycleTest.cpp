@@ -204,9 +204,7 @@ TEST_CASE("nothing reaches a source that was torn down")
     machine.end(source);
     CHECK(machine.host->pathWatcher().pathsWatchedBy(observer).empty());
     CHECK(machine.host->pathWatcher().queriesWatchedBy(observer).empty());
-    machine.workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
-        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), "/Volumes/Stick" } } });
-    machine.waitForThreads();
+    machine.tellOfVolume("/Volumes/Stick");
     CHECK(machine.host->threadCount() == 0);
 }
 

@@ -30,13 +30,6 @@ void mountStick(SourceMachine& machine)
     machine.volumes.removable.store({ { "/Volumes/Stick", "Stick" } });
 }
 
-void tellOfVolume(SourceMachine& machine, const char* path)
-{
-    machine.workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
-        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), path } } });
-    machine.waitForThreads();
-}
-
 } // namespace
 
 TEST_CASE("the first load watches the editor's preferences file, the default folder and each search path, once each")
@@ -169,8 +162,8 @@ TEST_CASE(
     const auto source = machine.makeSource();
     machine.load(*source);
     machine.volumes.local.store({ { "/mnt/late", "Late" } });
-    tellOfVolume(machine, "/mnt/late");
-    tellOfVolume(machine, "/mnt/late");
+    machine.tellOfVolume("/mnt/late");
+    machine.tellOfVolume("/mnt/late");
     machine.load(*source);
     CHECK(textOfQueries(machine, *source) == R"(
 (kMDItemFSName = '*.mtrproject'c) mode 4

@@ -274,10 +274,8 @@ TEST_CASE("a library on a volume that was mounted later is read and watched from
     const auto watched
         = [&] { return machine.abbreviated(machine.host->pathWatcher().pathsWatchedBy(source.get())).back(); };
     machine.volumes.local.store({ { "/Volumes/Late", "Late" } });
-    machine.workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
-        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), "/Volumes/Late" } } });
-    machine.waitForThreads();
     CHECK(watched() == "/Montaro Events");
+    machine.tellOfVolume("/Volumes/Late");
     const OBMediaGroupRef library = source->_reloadMontaroEvents_updateRootMediaGroup("Montaro", false);
     CHECK(EventMachine::outline(library) == "2011: Trip(a)");
     CHECK(watched() == "/Volumes/Late/Montaro Events");

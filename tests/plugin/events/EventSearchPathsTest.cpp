@@ -83,9 +83,7 @@ TEST_CASE("event search paths grow by volumes that are mounted later, and keep t
     const auto source = machine.makeSource();
     machine.load(*source);
     machine.volumes.local.store({ { "/mnt/late", "Late" } });
-    machine.workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
-        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), "/mnt/late" } } });
-    machine.waitForThreads();
+    machine.tellOfVolume("/mnt/late");
     machine.load(*source);
     CHECK(machine.abbreviated(source->inspection()->eventSearchPaths())
         == Lines { "DISK/home/Movies/Montaro Events", "/Volumes/Gone/Montaro Events", "/Montaro Events",

@@ -127,4 +127,27 @@ platform::LibraryAnswer ScriptedBundles::loadLibrary(const std::string& path, co
     return _real.loadLibrary(path, symbol);
 }
 
+std::vector<std::string> HeldMainRunLoop::delayedCalls() const
+{
+    platform::Locked guard(_delayedLock);
+    std::vector<std::string> lines;
+    for (const Delayed& delayed : _delayed) {
+        const auto time = std::chrono::duration_cast<std::chrono::milliseconds>(delayed.delay);
+        lines.push_back(
+            std::to_string(time.count()) + " ms in modes " + std::to_string(static_cast<int>(delayed.modes)));
+    }
+    return lines;
+}
+
+void HeldMainRunLoop::letDelayedCallsFallDue()
+{
+    std::vector<Delayed> due;
+    {
+        platform::Locked guard(_delayedLock);
+        due = std::exchange(_delayed, {});
+    }
+    for (const Delayed& delayed : due)
+        performAndWait(delayed.call);
+}
+
 } // namespace tests

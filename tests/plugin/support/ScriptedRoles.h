@@ -10,8 +10,10 @@
 #include "platform/Volumes.h"
 #include "platform/Workspace.h"
 #include "platform/common/LocalNotificationCenter.h"
+#include "platform/linux/LinuxMainRunLoop.h"
 #include "tests/support/FaultyFileSystem.h"
 
+#include <chrono>
 #include <functional>
 #include <map>
 #include <optional>
@@ -195,6 +197,31 @@ public:
 
 private:
     platform::Threads& _real;
+};
+
+/// A main thread whose delayed calls wait until a test lets them fall due.
+class HeldMainRunLoop : public platform::LinuxMainRunLoop {
+public:
+    void performAfterDelay(
+        std::chrono::nanoseconds delay, platform::RunLoopModes modes, std::function<void()> call) override
+    {
+        platform::Locked guard(_delayedLock);
+        _delayed.push_back({ delay, modes, std::move(call) });
+    }
+    /// The calls that wait: "5000 ms in modes 3".
+    std::vector<std::string> delayedCalls() const;
+    /// Runs them on the main thread and waits.
+    void letDelayedCallsFallDue();
+
+private:
+    struct Delayed {
+        std::chrono::nanoseconds delay;
+        platform::RunLoopModes modes;
+        std::function<void()> call;
+    };
+
+    mutable platform::Mutex _delayedLock;
+    std::vector<Delayed> _delayed GUARDED_BY(_delayedLock);
 };
 
 /// Records who asks to be notified of what.

@@ -111,6 +111,17 @@ OBLoadResult SourceMachine::load(OBMediaManager& manager)
     return result.get();
 }
 
+void SourceMachine::tellOfVolume(const char* path)
+{
+    workspaceNotifications.post({ platform::volumeMountedNotification, nullptr,
+        platform::Value::Dictionary { { platform::Text(platform::mountedVolumePathKey), path } } });
+    // A worker sleeps before it reloads.
+    while (!host->waitForThreads(std::chrono::milliseconds(1))) {
+        if (clock.sleepers() != 0)
+            clock.advance(std::chrono::seconds(5));
+    }
+}
+
 void SourceMachine::onMainThread(const std::function<void()>& call)
 {
     if (!mainRunLoop.performAndWait(call))

@@ -63,6 +63,8 @@ public:
 
     /// Runs one load, also where a tree is installed already.
     OBLoadResult load(OBMediaManager& manager);
+    /// Tells observers that a volume was mounted at `path`, and lets time pass until what they do has ended.
+    void tellOfVolume(const char* path);
     /// Runs `call` on the main thread and waits.
     void onMainThread(const std::function<void()>& call);
 
@@ -113,7 +115,7 @@ public:
     VirtualClock clock {};
     platform::LinuxCalendar calendar {};
     RecordingThreads threads { _linuxThreads };
-    platform::LinuxMainRunLoop mainRunLoop {};
+    HeldMainRunLoop mainRunLoop {};
     RecordingConsole console {};
     ScriptedBundles bundles { _linuxBundles, trace };
     NoLanguages languages {};

@@ -20,6 +20,19 @@ namespace {
 
 } // namespace
 
+std::shared_ptr<void> ListedVolumes::watchMounts(const std::function<void()>& changed) const
+{
+    const auto watch = std::make_shared<const std::function<void()>>(changed);
+    _mountsChanged = watch;
+    return std::const_pointer_cast<std::function<void()>>(watch);
+}
+
+void ListedVolumes::tellMountsChanged() const
+{
+    if (const auto watch = _mountsChanged.lock())
+        (*watch)();
+}
+
 std::vector<std::string> ListedVolumes::localVolumes() const
 {
     ++timesListed;

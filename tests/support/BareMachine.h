@@ -42,6 +42,12 @@ public:
     std::string displayName(std::string_view path) const override;
     std::optional<std::string> fileSystemType(std::string_view path) const override;
     std::uint64_t generation() const override { return currentGeneration; }
+    std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const override;
+    /// Calls who watches mounts, on this thread.
+    void tellMountsChanged() const;
+
+private:
+    mutable std::weak_ptr<const std::function<void()>> _mountsChanged;
 };
 
 /// Knows the applications that a test lists.

@@ -6,7 +6,6 @@
 #include "platform/common/LinkTable.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/LocalNotificationCenter.h"
-#include "platform/common/StillPaths.h"
 #include "platform/linux/LinuxBundles.h"
 #include "platform/linux/LinuxCalendar.h"
 #include "platform/linux/LinuxClock.h"
@@ -17,6 +16,7 @@
 #include "platform/linux/LinuxVolumes.h"
 #include "platform/linux/LinuxWorkspace.h"
 #include "platform/linux/StandardErrorConsole.h"
+#include "platform/linux/watching/LinuxPathWatching.h"
 
 namespace platform {
 
@@ -27,7 +27,6 @@ struct LinuxPlatform::Roles {
     LinuxVolumes volumes { linkedFiles };
     LinkTable links { {}, volumes, realFiles };
     LinkedFileSystem linkedFiles { realFiles, links };
-    StillPaths pathWatching {};
     LinuxWorkspace workspace { linkedFiles };
     FilePreferences preferences { linkedFiles };
     FileMovies movies { linkedFiles };
@@ -41,6 +40,7 @@ struct LinuxPlatform::Roles {
     StandardErrorConsole console {};
     LinuxBundles bundles { linkedFiles };
     LinuxLanguages languages {};
+    LinuxPathWatching pathWatching { linkedFiles, volumes, clock, threads };
 };
 
 LinuxPlatform::LinuxPlatform()

@@ -3,6 +3,7 @@
 #include "platform/FileSystem.h"
 #include "platform/PathText.h"
 #include "platform/common/FileSystemTypeName.h"
+#include "platform/linux/MountWatch.h"
 #include "platform/linux/SystemPath.h"
 
 #include <algorithm>
@@ -161,6 +162,18 @@ std::uint64_t LinuxVolumes::generation() const
     if (MountTable::hasChanged(_openTable.number()))
         ++_generation;
     return _generation;
+}
+
+std::shared_ptr<void> LinuxVolumes::watchMounts(const std::function<void()>& changed) const
+{
+    Locked guard(_lock);
+    if (const std::shared_ptr<MountWatch> current = _mountWatch.lock()) {
+        if (auto taker = MountWatch::add(current, changed))
+            return taker;
+    }
+    const std::shared_ptr<MountWatch> fresh = MountWatch::open(_folders.proc);
+    _mountWatch = fresh;
+    return fresh ? MountWatch::add(fresh, changed) : nullptr;
 }
 
 } // namespace platform

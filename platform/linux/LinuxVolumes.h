@@ -9,6 +9,7 @@
 namespace platform {
 
 class FileSystem;
+class MountWatch;
 
 /// What the kernel has mounted, read afresh at every call. Any thread.
 class LinuxVolumes : public Volumes {
@@ -24,6 +25,8 @@ public:
     /// Counts the changes of the mount table. A label that is written anew while its volume stays mounted does not
     /// count.
     std::uint64_t generation() const override EXCLUDES(_lock);
+    /// What happens within a twentieth of a second is told once.
+    std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const override EXCLUDES(_lock);
 
 private:
     std::string labelOf(const Mount& mount) const;
@@ -34,6 +37,7 @@ private:
     mutable Mutex _lock;
     mutable Descriptor _openTable GUARDED_BY(_lock);
     mutable std::uint64_t _generation GUARDED_BY(_lock) = 0;
+    mutable std::weak_ptr<MountWatch> _mountWatch GUARDED_BY(_lock);
 };
 
 } // namespace platform

@@ -1,0 +1,52 @@
+#pragma once
+
+#include "platform/PathWatching.h"
+#include "platform/ThreadSafety.h"
+#include "platform/linux/watching/LinuxWatchingLimits.h"
+#include "platform/linux/watching/PathWatcher.h"
+
+#include <cstdint>
+#include <memory>
+#include <string_view>
+
+namespace platform {
+
+class Clock;
+class FileSystem;
+class Threads;
+class Volumes;
+
+/// Follows folders by inotify(7), and by looking in intervals where that cannot be.
+///
+/// Nothing exists before the first watch: one thread and one inotify instance come with it and end with the last, and a
+/// thread comes with each device that has to be polled. Nobody waits for them but the destructor, which waits until a
+/// look that is under way has come to its end.
+class LinuxPathWatching final : public PathWatching {
+public:
+    /// `files` tells where paths lead; it, `volumes` and the others outlive this object.
+    LinuxPathWatching(const FileSystem& files, const Volumes& volumes, const Clock& clock, Threads& threads,
+        LinuxWatchingLimits limits = {});
+    ~LinuxPathWatching() override;
+    LinuxPathWatching(const LinuxPathWatching&) = delete;
+    LinuxPathWatching& operator=(const LinuxPathWatching&) = delete;
+
+    /// The clock by which the kernel stamps files, which stands still between its ticks.
+    Date timeOfChangesNow() const override;
+    std::shared_ptr<void> watch(std::string_view path, Date since, PathWatchHandlers handlers) override;
+    WatchingState state() const override;
+    /// Mounts of this machine are noticed as well as those that the other volumes tell of.
+    std::unique_ptr<PathWatching> withPathsOf(const FileSystem& files, const Volumes& volumes) const override;
+
+private:
+    explicit LinuxPathWatching(WatcherRoles roles);
+
+    bool startThread() REQUIRES(_lock);
+
+    const WatcherRoles _roles;
+    const std::shared_ptr<WatchingCounts> _counts;
+    Mutex _lock; ///< taken before the queue's own
+    std::shared_ptr<WatchingQueue> _queue GUARDED_BY(_lock);
+    std::uint64_t _lastNumber GUARDED_BY(_lock) = 0;
+};
+
+} // namespace platform

@@ -1,0 +1,47 @@
+#pragma once
+
+#include "platform/Value.h"
+#include "platform/linux/watching/PolledMounts.h"
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace platform {
+
+class FileSystem;
+
+/// An entry that decides where a path leads: a change of `name` in `folder`, a real path, may lead it elsewhere.
+struct PlaceStep {
+    std::string folder;
+    std::string name;
+
+    friend bool operator==(const PlaceStep&, const PlaceStep&) = default;
+};
+
+/// Where a path leads on disk, and by what way.
+struct WatchedPlace {
+    enum class Kind : std::uint8_t { missing, folder, other };
+
+    std::string path {}; ///< the real path
+    Kind kind = Kind::missing;
+    std::uint64_t device = 0;
+    std::uint64_t inode = 0;
+    /// When what decides about the place last changed: the item, where it is no folder, and the links on the way; where
+    /// nothing is there, the folder that could hold the next step.
+    Date changed {};
+    std::vector<PlaceStep> steps {}; ///< those near "/" first, each once
+    bool isPolled = false; ///< the way leads over a file system that is polled, and has not been followed further
+
+    bool isSamePlace(const WatchedPlace& other) const
+    {
+        return path == other.path && kind == other.kind && device == other.device && inode == other.inode
+            && isPolled == other.isPolled;
+    }
+};
+
+/// Follows `path` as `files` does. Touches nothing on a mount of `polled`; an empty table follows everything.
+WatchedPlace placeOfPath(const FileSystem& files, std::string_view path, const PolledMounts& polled);
+
+} // namespace platform

@@ -1,0 +1,42 @@
+#pragma once
+
+#include "platform/linux/watching/FileArrivals.h"
+#include "platform/linux/watching/FolderPolling.h"
+#include "platform/linux/watching/InotifyInstance.h"
+#include "platform/linux/watching/LinuxWatchingLimits.h"
+#include "platform/linux/watching/PolledMounts.h"
+#include "platform/linux/watching/UntoldContents.h"
+#include "platform/linux/watching/WatchedFolders.h"
+#include "platform/linux/watching/WatchedRoots.h"
+
+#include <utility>
+
+namespace platform {
+
+class FileSystem;
+
+/// What the parts of the watcher share. The watcher's thread.
+struct WatchingContext {
+    WatchingContext(const FileSystem& fileSystem, const LinuxWatchingLimits& theLimits, WatchingQueue& queue,
+        FolderPolling::Parts parts)
+        : files(fileSystem)
+        , limits(theLimits)
+        , inotify(theLimits.mayUseInotify)
+        , roots(folders, queue)
+        , arrivals(theLimits.arrivalsAtMost)
+        , polling(std::move(parts))
+    {
+    }
+
+    const FileSystem& files;
+    const LinuxWatchingLimits& limits;
+    InotifyInstance inotify;
+    WatchedFolders folders {};
+    WatchedRoots roots;
+    FileArrivals arrivals;
+    UntoldContents contents {};
+    PolledMounts mounts {};
+    FolderPolling polling;
+};
+
+} // namespace platform

@@ -1,0 +1,191 @@
+#include "tests/platform/linux/Environment.h"
+#include "tests/platform/linux/watching/Listener.h"
+#include "tests/support/BareMachine.h"
+#include "tests/support/DescribedMachine.h"
+
+#include <doctest/doctest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <string>
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+using tests::Changes;
+using tests::changesSoFar;
+using tests::FollowedDisk;
+using tests::Listener;
+
+TEST_CASE("a path that does not exist is awaited")
+{
+    FollowedDisk machine;
+    Listener listener(machine.watching, machine.path("a/b/c"));
+    CHECK(listener.take().empty());
+    machine.disk.folder("a");
+    machine.disk.folder("a/other");
+    machine.disk.folder("a/b");
+    machine.disk.folder("a/b/c");
+    CHECK(listener.hears("anythingChanged ."));
+    machine.disk.file("a/b/c/file");
+    CHECK(listener.hears("appeared file"));
+}
+
+TEST_CASE("what happens beside an awaited path is told to nobody")
+{
+    FollowedDisk machine;
+    machine.disk.folder("a/x");
+    Listener witness(machine.watching, machine.path("a/x"));
+    Listener listener(machine.watching, machine.path("a/b"));
+    machine.disk.file("a/c/file");
+    machine.disk.folder("a/d");
+    changesSoFar(witness, machine.path("a/x"));
+    CHECK(listener.take().empty());
+}
+
+TEST_CASE("a watched path that vanishes and returns is told both times, and followed again")
+{
+    FollowedDisk machine;
+    machine.disk.file("a/file");
+    Listener listener(machine.watching, machine.path("a"));
+    tests::moveItem(machine.path("a"), machine.path("b"));
+    CHECK(listener.until("anythingChanged .").empty());
+    machine.disk.file("b/other");
+    tests::moveItem(machine.path("b"), machine.path("a"));
+    CHECK(listener.until("anythingChanged .").empty());
+    machine.disk.file("a/third");
+    CHECK(listener.hears("appeared third"));
+    std::filesystem::remove_all(machine.path("a"));
+    CHECK(listener.hears("anythingChanged ."));
+    machine.disk.folder("a");
+    changesSoFar(listener, machine.path("a"));
+}
+
+TEST_CASE("the rename of a folder above a watched path is a change of it")
+{
+    FollowedDisk machine;
+    machine.disk.folder("a/b/c");
+    Listener listener(machine.watching, machine.path("a/b/c"));
+    tests::moveItem(machine.path("a"), machine.path("z"));
+    CHECK(listener.until("anythingChanged .").empty());
+    tests::moveItem(machine.path("z"), machine.path("a"));
+    CHECK(listener.until("anythingChanged .").empty());
+    machine.disk.file("a/b/c/file");
+    CHECK(listener.hears("appeared file"));
+}
+
+TEST_CASE("an awaited path is still awaited after the folder above it was renamed and another took its place")
+{
+    FollowedDisk machine;
+    machine.disk.folder("a");
+    Listener listener(machine.watching, machine.path("a/b/c"));
+    tests::moveItem(machine.path("a"), machine.path("z"));
+    machine.disk.folder("z/b/c");
+    machine.disk.folder("a/b");
+    machine.disk.folder("a/b/c");
+    CHECK(listener.hears("anythingChanged ."));
+    machine.disk.file("a/b/c/file");
+    CHECK(listener.hears("appeared file"));
+}
+
+TEST_CASE("a link on the way that leads elsewhere is a change, and the new place is followed under the spelling")
+{
+    FollowedDisk machine;
+    machine.disk.folder("one/inner");
+    machine.disk.folder("two/inner");
+    machine.disk.link("link", "one");
+    const std::string chain = machine.disk.link("chain", machine.path("link"));
+    Listener listener(machine.watching, chain + "/inner");
+    machine.disk.file("one/inner/file");
+    CHECK(listener.hears("appeared file"));
+    listener.until("arrivalEnded file");
+    machine.disk.link("new link", "two");
+    tests::moveItem(machine.path("new link"), machine.path("link"));
+    CHECK(listener.until("anythingChanged .").empty());
+    machine.disk.file("two/inner/other");
+    CHECK(listener.hears("appeared other"));
+    machine.disk.file("one/inner/unseen");
+    CHECK(changesSoFar(listener, machine.path("two/inner")) == Changes { "arrivalEnded other" });
+}
+
+TEST_CASE("a path awaited through a link that leads nowhere is found where the link leads")
+{
+    FollowedDisk machine;
+    machine.disk.link("link", "later/folder");
+    Listener listener(machine.watching, machine.path("link"));
+    machine.disk.folder("later/folder");
+    CHECK(listener.hears("anythingChanged ."));
+    machine.disk.file("later/folder/file");
+    CHECK(listener.hears("appeared file"));
+}
+
+TEST_CASE("a folder above that can only be passed through does not keep a path from being followed")
+{
+    const auto check = [] {
+        FollowedDisk machine;
+        machine.disk.folder("a/b/c");
+        chmod(machine.path("a").c_str(), 0300);
+        Listener listener(machine.watching, machine.path("a/b/c"));
+        tests::moveItem(machine.path("a/b"), machine.path("a/z"));
+        const bool isTold = listener.hears("anythingChanged .") && listener.problems().empty();
+        chmod(machine.path("a").c_str(), 0700);
+        return isTold;
+    };
+    CHECK(tests::askAsOrdinaryUser(check) == tests::ChildAnswer::yes);
+}
+
+TEST_CASE("of a watched file changed content is told, and nothing of its neighbours")
+{
+    FollowedDisk machine;
+    const std::string path = machine.disk.file("file", "x");
+    Listener listener(machine.watching, path);
+    Listener witness(machine.watching, machine.path(""));
+    tests::writeFile(machine.path("neighbour"), "x");
+    tests::writeFile(path, "y");
+    CHECK(listener.until("contentChanged .").empty());
+    CHECK(changesSoFar(witness, machine.path(""))
+        == Changes { "appeared neighbour", "arrivalEnded neighbour", "contentChanged file" });
+}
+
+TEST_CASE("of a watched file disappearance, return and replacement are told by its own path only")
+{
+    FollowedDisk machine;
+    const std::string path = machine.disk.file("a/file", "x");
+    Listener listener(machine.watching, path);
+    std::filesystem::remove(path);
+    CHECK(listener.until("anythingChanged .").empty());
+    tests::writeFile(path, "y");
+    CHECK(listener.until("anythingChanged .").empty());
+    CHECK(listener.hears("contentChanged ."));
+    listener.take();
+    machine.disk.file("a/new", "z");
+    tests::moveItem(machine.path("a/new"), path);
+    CHECK(listener.until("anythingChanged .").empty());
+    tests::writeFile(path, "y");
+    CHECK(listener.until("contentChanged .").empty());
+    std::filesystem::remove(path);
+    machine.disk.folder("a/file/inner");
+    CHECK(listener.hears("anythingChanged ."));
+    machine.disk.file("a/file/inner/new");
+    CHECK(listener.hears("appeared inner/new"));
+}
+
+TEST_CASE("changes on a described machine come in the spelling of its links and volumes")
+{
+    FollowedDisk machine;
+    machine.disk.folder("real/inner");
+    const std::string volume = machine.disk.folder("volume");
+    tests::BareMachine bare(machine.files);
+    tests::DescribedMachine description;
+    description.link("/Ombrix Link", machine.path("real")).localVolume(volume, "Ombrix Disk");
+    const platform::Platform described = description.platform(machine.path("machine.json"), bare.platform());
+    const auto watching = machine.watching.withPathsOf(described.fileSystem, described.volumes);
+    Listener linked(*watching, "/Ombrix Link/inner");
+    Listener onVolume(*watching, "/Volumes/Ombrix Disk/Movies");
+    machine.disk.file("real/inner/file");
+    CHECK(linked.hears("appeared file"));
+    machine.disk.folder("volume/Movies");
+    CHECK(onVolume.hears("anythingChanged ."));
+    machine.disk.file("volume/Movies/file");
+    CHECK(onVolume.hears("appeared file"));
+}

@@ -20,8 +20,8 @@ struct PathChange {
         appeared, ///< an entry is new in its folder: made there, moved there, or renamed to this
         disappeared, ///< an entry is gone from its folder: deleted, moved away, or renamed from this
         found, ///< an entry that was in a folder when that had just appeared; tells nothing to who lists that folder
-        contentChanged, ///< a file was written to, and closed or left alone for a while
-        arrivalEnded, ///< a file that was still being written when it appeared has been closed
+        contentChanged, ///< a file was written to: told when it is closed, else a while after, once in that while
+        arrivalEnded, ///< a file that may have been being written when it appeared or was found has been closed
         attributesChanged, ///< permissions or times of a folder were set
         folderChanged, ///< entries directly in a folder changed; which is not known
         anythingChanged, ///< of all that is at or below `path` nothing is known any more

@@ -52,7 +52,7 @@ void PathWatcher::run()
         takeEvents();
         _events.tellDueContents();
         _placing.followNoted();
-        _counts->watchedFolders = _context.folders.watchCount();
+        _context.countWatches();
     }
     _counts->watchedFolders = 0;
 }

@@ -128,6 +128,7 @@ void RootPlacing::arrive(WatchedRoot& root, WatchedPlace place)
         return;
     const Date since = isFirst ? root.watch->since : FolderFollowing::never;
     const FolderFollowing::Look look = lookThroughPlace(root, since);
+    _context.countWatches();
     if (!isFirst || look.hasChangedSince || root.place.changed >= since)
         _context.roots.tellAnything(root);
     if (root.awaitedLook.empty())

@@ -24,6 +24,7 @@ struct WatchingContext {
         , inotify(theLimits.mayUseInotify)
         , roots(folders, queue)
         , arrivals(theLimits.arrivalsAtMost)
+        , counts(*parts.counts)
         , polling(std::move(parts))
     {
     }
@@ -36,7 +37,11 @@ struct WatchingContext {
     FileArrivals arrivals;
     UntoldContents contents {};
     PolledMounts mounts {};
+    WatchingCounts& counts;
     FolderPolling polling;
+
+    /// Says how much is watched, before anybody is told that it is.
+    void countWatches() { counts.watchedFolders = folders.watchCount(); }
 };
 
 } // namespace platform

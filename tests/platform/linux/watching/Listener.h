@@ -9,6 +9,8 @@
 #include "platform/linux/watching/LinuxPathWatching.h"
 #include "tests/support/TemporaryFolder.h"
 
+#include <doctest/doctest.h>
+
 #include <functional>
 #include <memory>
 #include <string>
@@ -88,3 +90,13 @@ Changes changesSoFar(Listener& listener, const std::string& root);
 platform::Date afterEverything();
 
 } // namespace tests
+
+template <> struct doctest::StringMaker<tests::Changes> {
+    static String convert(const tests::Changes& changes)
+    {
+        std::string text;
+        for (const std::string& change : changes)
+            text += (text.empty() ? "" : ", ") + change;
+        return ("{ " + text + " }").c_str();
+    }
+};

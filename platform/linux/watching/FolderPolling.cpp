@@ -71,7 +71,8 @@ void FolderPolling::Device::run()
     const std::shared_ptr<WatchingCounts> counts = _parts.counts;
     _nextRound = _parts.clock.monotonic() + _parts.interval;
     while (const std::shared_ptr<WakeSignal> wake = nextWake()) {
-        _parts.clock.sleep(_nextRound - _parts.clock.monotonic(), *wake);
+        if (!wake->isRaised())
+            _parts.clock.sleep(_nextRound - _parts.clock.monotonic(), *wake);
         work();
     }
     countFolders(0);

@@ -89,9 +89,10 @@ void WatchedRoots::noteFolder(WatchedFolders::Number folder, bool isGone)
 
 void WatchedRoots::noteAbove(WatchedFolders::Number folder)
 {
-    for (; folder != WatchedFolders::none; folder = _folders.parent(folder))
+    for (; folder != WatchedFolders::none; folder = _folders.parent(folder)) {
         if (_folders.isMarked(folder, WatchedFolders::isWatchedPath))
             noteFolder(folder, true);
+    }
 }
 
 void WatchedRoots::folderIsGone(WatchedFolders::Number folder)

@@ -146,8 +146,8 @@ TEST_CASE("the first close of a file that came with what it held is a change and
     tests::writeFile(machine.path("in/file"), "y");
     tests::writeFile(machine.path("in/folder/file"), "y");
     CHECK(changesSoFar(listener, machine.path("in"))
-        == Changes { "contentChanged file", "arrivalEnded file", "contentChanged folder/file",
-            "arrivalEnded folder/file" });
+        == Changes {
+            "contentChanged file", "arrivalEnded file", "contentChanged folder/file", "arrivalEnded folder/file" });
     tests::writeFile(machine.path("in/file"), "z");
     CHECK(changesSoFar(listener, machine.path("in")) == Changes { "contentChanged file" });
 }
@@ -254,8 +254,7 @@ TEST_CASE("after a folder has replaced an empty one it is followed at its new pl
     machine.disk.folder("other");
     Listener listener(machine.watching, machine.path(""));
     tests::moveItem(machine.path("one"), machine.path("other"));
-    CHECK(changesSoFar(listener, machine.path(""))
-        == Changes { "left one/", "appeared other/", "found other/inner/" });
+    CHECK(changesSoFar(listener, machine.path("")) == Changes { "left one/", "appeared other/", "found other/inner/" });
     makeFile(machine.path("other/inner/file"));
     CHECK(listener.hears("appeared other/inner/file"));
 }

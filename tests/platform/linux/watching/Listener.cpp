@@ -89,17 +89,18 @@ bool Listener::waitFor(const std::function<bool()>& isSo)
 
 bool Listener::waitUntilStanding()
 {
-    return waitFor([this] { return _stands; });
+    return waitFor([this]() REQUIRES(_lock) { return _stands; });
 }
 
 bool Listener::hears(const std::string& change)
 {
-    return waitFor([&] { return std::find(_changes.begin(), _changes.end(), change) != _changes.end(); });
+    return waitFor(
+        [&]() REQUIRES(_lock) { return std::find(_changes.begin(), _changes.end(), change) != _changes.end(); });
 }
 
 bool Listener::hearsFailure()
 {
-    return waitFor([this] { return !_problems.empty(); });
+    return waitFor([this]() REQUIRES(_lock) { return !_problems.empty(); });
 }
 
 Changes Listener::take()

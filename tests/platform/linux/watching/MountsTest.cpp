@@ -72,7 +72,9 @@ TEST_CASE("a mount at, above or below a watched path is told, is followed, and c
             listener.take();
             isRight = umount(place.c_str()) == 0 && isRight && listener.hears("anythingChanged .");
             tests::writeFile(place + "/inner/below", "x");
-            const std::string below = watched.empty() ? "place/inner/below" : watched == "place" ? "inner/below" : "below";
+            const std::string below = watched.empty() ? "place/inner/below"
+                : watched == "place"                  ? "inner/below"
+                                                      : "below";
             return isRight && listener.hears("appeared " + below);
         });
     }
@@ -87,8 +89,8 @@ TEST_CASE("a mount elsewhere is told to nobody")
         Listener listener(machine.watching, machine.path("watched"));
         Listener witness(machine.watching, place);
         mountMemory(place);
-        const bool isRight = witness.hears("anythingChanged .")
-            && tests::changesSoFar(listener, machine.path("watched")).empty();
+        const bool isRight
+            = witness.hears("anythingChanged .") && tests::changesSoFar(listener, machine.path("watched")).empty();
         return umount(place.c_str()) == 0 && isRight;
     });
 }

@@ -105,6 +105,7 @@ TEST_CASE("folders beyond the limit of watches are polled, the others are not")
     machine.disk.folder("a/beyond/inner");
     Listener listener(machine.watching, machine.path("a"));
     REQUIRE(listener.hearsFailure());
+    REQUIRE(machine.clock.waitForSleepers(1));
     REQUIRE(listener.problems().size() == 1);
     CHECK(listener.problems().front().path == machine.path("a/beyond"));
     CHECK(listener.problems().front().remedy == "sudo sysctl fs.inotify.max_user_watches=524288");

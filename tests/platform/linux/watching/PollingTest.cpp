@@ -74,6 +74,7 @@ TEST_CASE("a polled path that does not exist is awaited")
     PolledDisk machine(withoutInotify());
     Listener listener(machine.watching, machine.path("a/b"));
     CHECK(listener.take().empty());
+    REQUIRE(machine.clock.waitForSleepers(1));
     machine.disk.folder("a/b");
     machine.lookAgain();
     CHECK(listener.hears("anythingChanged ."));

@@ -16,8 +16,8 @@ namespace platform {
 
 namespace {
 
-    constexpr std::uint32_t entryEvents = IN_CREATE | IN_DELETE | IN_MOVED_FROM | IN_MOVED_TO | IN_ATTRIB;
-    constexpr std::uint32_t selfEvents = IN_DELETE_SELF | IN_MOVE_SELF;
+    constexpr std::uint32_t entryEvents = IN_CREATE | IN_DELETE | IN_MOVED_FROM | IN_MOVED_TO;
+    constexpr std::uint32_t selfEvents = IN_DELETE_SELF | IN_MOVE_SELF | IN_ATTRIB;
     constexpr std::uint32_t contentEvents = IN_MODIFY | IN_CLOSE_WRITE;
 
     constexpr unsigned reasonsToWatch
@@ -25,9 +25,10 @@ namespace {
 
     std::uint32_t maskForMarks(const WatchedFolders& folders, WatchedFolders::Number folder)
     {
-        const bool needsContents
-            = folders.isMarked(folder, WatchedFolders::followed | WatchedFolders::holdsWatchedFile);
-        return entryEvents | selfEvents | (needsContents ? contentEvents : 0);
+        constexpr unsigned needingContents = WatchedFolders::followed | WatchedFolders::holdsWatchedFile;
+        const bool needsContents = folders.isMarked(folder, needingContents);
+        const bool needsEntries = folders.isMarked(folder, needingContents | WatchedFolders::namesMatter);
+        return selfEvents | (needsEntries ? entryEvents : 0) | (needsContents ? contentEvents : 0);
     }
 
 } // namespace
@@ -101,28 +102,28 @@ FolderFollowing::Number FolderFollowing::entryAt(std::string_view path)
     return folder;
 }
 
-FolderFollowing::Number FolderFollowing::folderOnTheWay(const std::string& path, bool holdsFile, bool& isRefused)
+FolderFollowing::WayFolder FolderFollowing::folderOnTheWay(const std::string& path, unsigned marks)
 {
-    const Number folder = path.size() < PATH_MAX ? entryAt(path) : WatchedFolders::none;
-    if (folder == WatchedFolders::none)
-        return folder;
-    const unsigned marks
-        = holdsFile ? WatchedFolders::onTheWay | WatchedFolders::holdsWatchedFile : +WatchedFolders::onTheWay;
-    const bool wasOnTheWay = _context.folders.isMarked(folder, WatchedFolders::onTheWay);
-    _context.folders.mark(folder, marks);
-    const int error = watchFolder(_context, folder, path.c_str());
+    WayFolder found;
+    found.entry = path.size() < PATH_MAX ? entryAt(path) : WatchedFolders::none;
+    if (found.entry == WatchedFolders::none)
+        return found;
+    const bool wasOnTheWay = _context.folders.isMarked(found.entry, WatchedFolders::onTheWay);
+    _context.folders.mark(found.entry, marks | WatchedFolders::onTheWay);
+    const int error = watchFolder(_context, found.entry, path.c_str());
+    found.isWatched = error == 0;
+    const bool isMissing = error == ENOENT || error == ENOTDIR || error == ELOOP;
     // A folder that may only be passed through reports nothing; when it is moved, the next one on the way says so.
-    if (error == 0 || error == EACCES || error == EPERM)
-        return folder;
-    isRefused = isRefused || (error != ENOENT && error != ENOTDIR && error != ELOOP);
+    const bool isPassedThrough = error == EACCES || error == EPERM;
+    found.isRefused = error != 0 && !isMissing && !isPassedThrough;
     if (error == ENOSPC)
         tellUsedUpLimit(path);
-    if (!wasOnTheWay) {
-        _context.folders.unmark(folder, marks);
-        settle(folder);
-        return WatchedFolders::none;
+    if ((isMissing || found.isRefused) && !wasOnTheWay) {
+        _context.folders.unmark(found.entry, marks | WatchedFolders::onTheWay);
+        settle(found.entry);
+        found.entry = WatchedFolders::none;
     }
-    return folder;
+    return found;
 }
 
 bool FolderFollowing::isNeeded(Number folder) const

@@ -21,6 +21,13 @@ public:
         bool hasEntries = false;
     };
 
+    /// A folder through which a way leads.
+    struct WayFolder {
+        Number entry = WatchedFolders::none; ///< none where there is no such folder
+        bool isWatched = false; ///< what stands there now
+        bool isRefused = false; ///< it is there, and gets no watch for want of any
+    };
+
     /// Later than any change.
     static constexpr Date never { std::numeric_limits<std::int64_t>::max(), 0 };
 
@@ -37,10 +44,9 @@ public:
 
     /// The entry at the real path `path`, which is made if there is none, without a watch; none where no folder can be.
     Number entryAt(std::string_view path);
-    /// The entry of the folder at the real path `path`, with a watch for the names in it that matter to a way; with
-    /// `holdsFile` for the contents of files, too. None where there is no such folder. `isRefused` is set when it is
-    /// there and gets no watch.
-    Number folderOnTheWay(const std::string& path, bool holdsFile, bool& isRefused);
+    /// The folder at the real path `path`, with a watch that tells when it is moved or deleted, and what `marks` ask
+    /// besides.
+    WayFolder folderOnTheWay(const std::string& path, unsigned marks);
 
     /// Removes `folder` with all below it: it is not there any more.
     void drop(Number folder);

@@ -4,6 +4,8 @@
 #include "platform/linux/watching/WatchingProblems.h"
 
 #include <algorithm>
+#include <set>
+#include <string>
 #include <utility>
 
 namespace platform {
@@ -83,15 +85,27 @@ bool RootPlacing::watchWay(WatchedRoot& root, WatchedPlace& place)
 bool RootPlacing::watchSteps(WatchedRoot& root, const WatchedPlace& place)
 {
     std::vector<std::pair<WatchedFolders::Number, WatchedRoots::Step>> steps;
+    std::set<std::string> watched;
     bool isRefused = false;
-    for (const PlaceStep& step : place.steps) {
-        if (_context.mounts.holds(step.folder))
+    // From the last to the first: a folder that tells of its own moves saves the one that holds it from having to tell
+    // of all that comes and goes beside it. What the way leads to is told of by both, for an open folder that is
+    // deleted says so only once it is closed.
+    for (auto step = place.steps.rbegin(); step != place.steps.rend(); ++step) {
+        if (_context.mounts.holds(step->folder))
             continue;
-        const bool isPlace = pathJoined(step.folder, step.name) == place.path;
-        const bool holdsFile = isPlace && place.kind == WatchedPlace::Kind::other;
-        const WatchedFolders::Number folder = _following.folderOnTheWay(step.folder, holdsFile, isRefused);
-        if (folder != WatchedFolders::none)
-            steps.push_back({ folder, { &root, step.name, isPlace } });
+        const std::string path = pathJoined(step->folder, step->name);
+        const bool isPlace = path == place.path;
+        unsigned marks = 0;
+        if (isPlace || watched.count(path) == 0)
+            marks |= WatchedFolders::namesMatter;
+        if (isPlace && place.kind == WatchedPlace::Kind::other)
+            marks |= WatchedFolders::holdsWatchedFile;
+        const FolderFollowing::WayFolder folder = _following.folderOnTheWay(step->folder, marks);
+        isRefused = isRefused || folder.isRefused;
+        if (folder.isWatched)
+            watched.insert(step->folder);
+        if (folder.entry != WatchedFolders::none)
+            steps.push_back({ folder.entry, { &root, step->name, isPlace } });
     }
     settleSteps(_context.roots.setSteps(root, steps));
     return !isRefused;
@@ -100,7 +114,8 @@ bool RootPlacing::watchSteps(WatchedRoot& root, const WatchedPlace& place)
 void RootPlacing::settleSteps(const std::vector<WatchedFolders::Number>& folders)
 {
     for (const WatchedFolders::Number folder : folders) {
-        _context.folders.unmark(folder, WatchedFolders::onTheWay | WatchedFolders::holdsWatchedFile);
+        _context.folders.unmark(
+            folder, WatchedFolders::onTheWay | WatchedFolders::holdsWatchedFile | WatchedFolders::namesMatter);
         _following.settle(folder);
     }
 }

@@ -24,7 +24,7 @@ public:
     static constexpr int noWatch = -1;
 
     /// What is known of a folder; each is one bit.
-    enum Mark : std::uint8_t {
+    enum Mark : std::uint16_t {
         followed = 1, ///< lies in a watched path
         onTheWay = 2, ///< a watched path leads through it
         holdsWatchedFile = 4, ///< a watched path is a plain file in it
@@ -33,6 +33,7 @@ public:
         seen = 32, ///< met in the listing that is under way
         holdsArrivals = 64, ///< files in it are kept in mind as arriving
         polled = 128, ///< it and what is below it is looked at in intervals
+        namesMatter = 256, ///< what stands in it under some names decides where a watched path leads
     };
 
     WatchedFolders();
@@ -42,8 +43,8 @@ public:
     Number nextSibling(Number folder) const { return _folders[folder].next; }
     std::string_view name(Number folder) const { return { _folders[folder].name.get(), _folders[folder].nameLength }; }
     bool isMarked(Number folder, unsigned marks) const { return (_folders[folder].marks & marks) != 0; }
-    void mark(Number folder, unsigned marks) { _folders[folder].marks |= static_cast<std::uint8_t>(marks); }
-    void unmark(Number folder, unsigned marks) { _folders[folder].marks &= static_cast<std::uint8_t>(~marks); }
+    void mark(Number folder, unsigned marks) { _folders[folder].marks |= static_cast<std::uint16_t>(marks); }
+    void unmark(Number folder, unsigned marks) { _folders[folder].marks &= static_cast<std::uint16_t>(~marks); }
 
     Number child(Number folder, std::string_view name) const;
     /// The child called `name`, which is made if there is none.
@@ -80,7 +81,7 @@ private:
         Number nextOfWatch = none;
         int watch = noWatch;
         std::uint8_t nameLength = 0;
-        std::uint8_t marks = 0;
+        std::uint16_t marks = 0;
     };
 
     static std::uint64_t hashOfName(Number parent, std::string_view name);

@@ -43,6 +43,26 @@ TEST_CASE("what happens beside an awaited path is told to nobody")
     CHECK(listener.take().empty());
 }
 
+TEST_CASE("a folder on the way that another one replaces leads to what is in that")
+{
+    FollowedDisk machine;
+    machine.disk.folder("way/a/b/c");
+    machine.disk.folder("way/new/b/c");
+    Listener listener(machine.watching, machine.path("way/a/b/c"));
+    tests::moveItem(machine.path("way/a"), machine.path("way/old"));
+    listener.until("anythingChanged .");
+    tests::moveItem(machine.path("way/new"), machine.path("way/a"));
+    listener.until("anythingChanged .");
+    machine.disk.file("way/a/b/c/file");
+    CHECK(listener.hears("appeared file"));
+    machine.disk.file("way/old/b/c/unseen");
+    std::filesystem::remove_all(machine.path("way"));
+    CHECK(listener.until("anythingChanged .") == Changes { "appeared file", "arrivalEnded file", "disappeared file" });
+    machine.disk.folder("way/a");
+    machine.disk.folder("way/a/b/c");
+    CHECK(listener.hears("anythingChanged ."));
+}
+
 TEST_CASE("a watched path that vanishes and returns is told both times, and followed again")
 {
     FollowedDisk machine;

@@ -108,6 +108,16 @@ Text OBMediaManager::defaultNoDataMessage(const OBMediaGroupRef&)
     return {};
 }
 
+OBMenuRef OBMediaManager::contextMenuForMediaObject_inMediaGroup(const OBMediaObjectRef&, const OBMediaGroupRef&)
+{
+    return nullptr;
+}
+
+OBMenuRef OBMediaManager::contextMenuForMediaGroup(const OBMediaGroupRef&)
+{
+    return nullptr;
+}
+
 OBSourceInspection* OBMediaManager::inspection()
 {
     return nullptr;

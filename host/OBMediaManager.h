@@ -5,6 +5,7 @@
 #include "host/OBExport.h"
 #include "host/OBLoad.h"
 #include "host/OBMediaGroup.h"
+#include "host/OBMenu.h"
 #include "host/OBPathWatcher.h"
 #include "host/OBScanObserver.h"
 #include "platform/FileSystem.h"
@@ -19,6 +20,10 @@
 #include <string>
 #include <string_view>
 #include <vector>
+
+namespace platform {
+class Pasteboard;
+}
 
 class FrameworkCore;
 class OBMediaManagerClass;
@@ -109,6 +114,16 @@ public:
 
     /// What to show for an empty group; absent for no message.
     virtual platform::Text defaultNoDataMessage(const OBMediaGroupRef& group);
+
+    /// The context menu for an object or a group; null for none.
+    virtual OBMenuRef contextMenuForMediaObject_inMediaGroup(
+        const OBMediaObjectRef& object, const OBMediaGroupRef& group);
+    virtual OBMenuRef contextMenuForMediaGroup(const OBMediaGroupRef& group);
+
+    /// Writes what a person copies or drags; true when anything was written. The base operation begins the pasteboard
+    /// anew and writes the files, of groups those of their media objects, for any desktop program.
+    virtual bool writeMediaObjects_toPasteboard(const OBMediaObjectList& objects, platform::Pasteboard& pasteboard);
+    virtual bool writeMediaGroups_toPasteboard(const OBMediaGroupList& groups, platform::Pasteboard& pasteboard);
 
     /// What the source tells beside its tree; null when it offers nothing.
     virtual OBSourceInspection* inspection();

@@ -2,6 +2,7 @@
 
 #include "apps/common/HostileNames.h"
 #include "apps/common/Terminal.h"
+#include "platform/FileUri.h"
 
 #include <utility>
 
@@ -27,12 +28,6 @@ namespace {
         if (wishes.hyperlink != When::automatic)
             return wishes.hyperlink == When::always;
         return wishes.isTerminal && wantsColor(wishes);
-    }
-
-    bool mayStandInLink(unsigned char byte)
-    {
-        return (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z') || (byte >= '0' && byte <= '9')
-            || byte == '/' || byte == '-' || byte == '.' || byte == '_' || byte == '~';
     }
 
 } // namespace
@@ -117,20 +112,7 @@ std::string Style::drawn(std::string_view laidOut, std::string_view sequence) co
 
 std::string fileLink(std::string_view host, std::string_view path)
 {
-    constexpr std::string_view digits = "0123456789ABCDEF";
-    std::string link = "file://";
-    link += host;
-    for (const char letter : path) {
-        const auto byte = static_cast<unsigned char>(letter);
-        if (mayStandInLink(byte)) {
-            link += letter;
-        } else {
-            link += '%';
-            link += digits[byte >> 4];
-            link += digits[byte & 15];
-        }
-    }
-    return link;
+    return "file://" + std::string(host) + platform::uriEscapedPath(path);
 }
 
 } // namespace apps

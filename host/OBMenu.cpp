@@ -1,0 +1,10 @@
+#include "host/OBMenu.h"
+
+#include "host/OBMediaManager.h"
+
+void OBMenuItem::choose() const
+{
+    const auto manager = target.lock();
+    if (manager && action)
+        action->perform(*manager, *this);
+}

@@ -33,11 +33,13 @@ namespace {
         const std::optional<std::string> _home;
     };
 
-    /// Knows one application at most, and no icon.
+    /// Knows one application at most, and no icon; what is handed to the desktop goes to the real one.
     class DescribedWorkspace : public Workspace {
     public:
-        explicit DescribedWorkspace(std::optional<std::string> editorPath)
+        DescribedWorkspace(std::optional<std::string> editorPath, const FileSystem& files, Workspace& desktop)
             : _editorPath(std::move(editorPath))
+            , _files(files)
+            , _desktop(desktop)
         {
         }
         std::optional<std::string> applicationPath(std::string_view identifier) const override
@@ -45,9 +47,21 @@ namespace {
             return identifier == describedEditorIdentifier ? _editorPath : std::nullopt;
         }
         std::optional<std::string> applicationIconFile(std::string_view) const override { return std::nullopt; }
+        void launchApplication(std::string_view identifier) override
+        {
+            launchProgram(applicationPath(identifier).value_or(std::string()));
+        }
+        void launchProgram(std::string_view path) override { _desktop.launchProgram(_files.resolvedPath(path)); }
+        void revealFile(std::string_view path) override { _desktop.revealFile(_files.resolvedPath(path)); }
+        void observeHandOvers(std::function<void(const HandOver&)> observer) override
+        {
+            _desktop.observeHandOvers(std::move(observer));
+        }
 
     private:
         const std::optional<std::string> _editorPath;
+        const FileSystem& _files;
+        Workspace& _desktop;
     };
 
     std::string absolutePath(const std::string& file)
@@ -64,7 +78,7 @@ struct DescribedPlatform::Roles {
         , links(description.links, volumes, base.fileSystem.withoutAddedLinks())
         , fileSystem(base.fileSystem.withoutAddedLinks(), links, description.home)
         , pathWatching(base.pathWatching.withPathsOf(fileSystem, volumes))
-        , workspace(description.editorPath)
+        , workspace(description.editorPath, fileSystem, base.workspace)
     {
     }
 

@@ -27,7 +27,8 @@ struct LinuxPlatform::Roles {
     LinuxVolumes volumes { linkedFiles };
     LinkTable links { {}, volumes, realFiles };
     LinkedFileSystem linkedFiles { realFiles, links };
-    LinuxWorkspace workspace { linkedFiles };
+    LinuxThreads threads {};
+    LinuxWorkspace workspace { linkedFiles, threads };
     FilePreferences preferences { linkedFiles };
     FileMovies movies { linkedFiles };
     FileMetadataIndex metadataIndex { linkedFiles, movies };
@@ -35,7 +36,6 @@ struct LinuxPlatform::Roles {
     LocalNotificationCenter workspaceNotifications {};
     LinuxClock clock {};
     LinuxCalendar calendar {};
-    LinuxThreads threads {};
     LinuxMainRunLoop mainRunLoop {};
     StandardErrorConsole console {};
     LinuxBundles bundles { linkedFiles };

@@ -1,12 +1,18 @@
 #include "platform/linux/LinuxWorkspace.h"
 
 #include "platform/FileSystem.h"
+#include "platform/FileUri.h"
 #include "platform/PathText.h"
+#include "platform/Threads.h"
 #include "platform/formats/DesktopEntry.h"
 #include "platform/linux/DataFolders.h"
+#include "platform/linux/DetachedProgram.h"
 #include "platform/linux/IconTheme.h"
+#include "platform/linux/SessionBus.h"
 
 #include <algorithm>
+#include <chrono>
+#include <utility>
 
 #include <unistd.h>
 
@@ -14,10 +20,51 @@ namespace platform {
 
 namespace {
 
+    // Less than a person waits before trying again.
+    constexpr std::chrono::milliseconds busLimit { 2000 };
+
     struct Application {
         std::string program;
         std::string icon;
+        std::vector<std::string> command {}; // program first; empty where the entry has none
+        std::string workingFolder {};
+        bool isActivatedByBus = false;
     };
+
+    // An argument of the command line for a start without files (Desktop Entry Specification, "The Exec key"); absent
+    // for one that stands for what there is not.
+    void addArgument(std::vector<std::string>& command, const std::string& argument, const DesktopEntry& entry)
+    {
+        if (argument == "%i") {
+            if (!entry.icon.empty())
+                command.insert(command.end(), { "--icon", entry.icon });
+            return;
+        }
+        std::string text;
+        for (std::size_t index = 0; index < argument.size(); ++index) {
+            const bool isCode = argument[index] == '%' && index + 1 < argument.size();
+            if (!isCode)
+                text += argument[index];
+            else if (argument[++index] == '%')
+                text += '%';
+            else if (argument[index] == 'c')
+                text += entry.name;
+        }
+        if (!text.empty() || argument.empty())
+            command.push_back(std::move(text));
+    }
+
+    std::vector<std::string> commandOfEntry(const DesktopEntry& entry, const std::string& program)
+    {
+        const ExecArguments exec = splitExec(entry.exec);
+        std::vector<std::string> command;
+        if (!exec.problem.empty() || exec.arguments.empty())
+            return command;
+        command.push_back(program);
+        for (std::size_t index = 1; index < exec.arguments.size(); ++index)
+            addArgument(command, exec.arguments[index], entry);
+        return command;
+    }
 
     bool isProgram(const FileSystem& files, const std::string& path)
     {
@@ -80,15 +127,17 @@ namespace {
             const bool isApplication = result.entry.type.empty() || result.entry.type == "Application";
             if (result.entry.hidden || !isApplication || program.empty())
                 return std::nullopt;
-            return Application { program, result.entry.icon };
+            return Application { program, result.entry.icon, commandOfEntry(result.entry, program), result.entry.path,
+                result.entry.dBusActivatable };
         }
         return std::nullopt;
     }
 
 } // namespace
 
-LinuxWorkspace::LinuxWorkspace(const FileSystem& files)
+LinuxWorkspace::LinuxWorkspace(const FileSystem& files, Threads& threads)
     : _files(files)
+    , _threads(threads)
 {
 }
 
@@ -125,6 +174,55 @@ void LinuxWorkspace::remember(std::string_view identifier) const
     if (_identifiers.size() == identifiersAtMost)
         _identifiers.erase(_identifiers.begin());
     _identifiers.emplace_back(identifier);
+}
+
+void LinuxWorkspace::launchApplication(std::string_view identifier)
+{
+    auto application = findApplication(_files, identifier);
+    handOver([application = std::move(application), name = std::string(identifier)]() -> std::string {
+        if (!application)
+            return name + ": no such application";
+        if (application->isActivatedByBus) {
+            std::string problem = activateApplicationOnBus(name, busLimit);
+            if (problem.empty() || application->command.empty())
+                return problem;
+        }
+        return startDetachedProgram(application->command, application->workingFolder);
+    });
+}
+
+void LinuxWorkspace::launchProgram(std::string_view path)
+{
+    handOver([program = std::string(path)] { return startDetachedProgram({ program }, {}); });
+}
+
+void LinuxWorkspace::revealFile(std::string_view path)
+{
+    handOver([file = std::string(path)]() -> std::string {
+        if (showItemOnBus(fileUri(file), busLimit).empty())
+            return {};
+        const std::string folder = file.substr(0, std::max<std::size_t>(file.rfind('/'), 1));
+        const std::string problem = startDetachedProgram({ "xdg-open", folder }, {});
+        return problem.empty() || startDetachedProgram({ "gio", "open", folder }, {}).empty() ? std::string() : problem;
+    });
+}
+
+void LinuxWorkspace::observeHandOvers(std::function<void(const HandOver&)> observer)
+{
+    Locked guard(_observed->lock);
+    _observed->observer = std::move(observer);
+}
+
+/// On a thread of its own, so that neither a bus nor a program keeps the caller waiting.
+void LinuxWorkspace::handOver(std::function<std::string()> perform)
+{
+    const auto tell = [observed = _observed](const std::string& problem) {
+        Locked guard(observed->lock);
+        if (observed->observer)
+            observed->observer({ problem.empty(), problem });
+    };
+    if (!_threads.startDetached("ob-desktop", [tell, work = std::move(perform)] { tell(work()); }))
+        tell("the system gives no thread");
 }
 
 } // namespace platform

@@ -57,6 +57,10 @@ public:
 
     std::optional<std::string> applicationPath(std::string_view identifier) const override;
     std::optional<std::string> applicationIconFile(std::string_view) const override { return std::nullopt; }
+    void launchApplication(std::string_view) override { }
+    void launchProgram(std::string_view) override { }
+    void revealFile(std::string_view) override { }
+    void observeHandOvers(std::function<void(const platform::HandOver&)>) override { }
 };
 
 /// A machine on which nothing is mounted and nothing installed, and whose time stands still, with the files of a file

@@ -1,4 +1,5 @@
 #include "platform/linux/LinuxFileSystem.h"
+#include "platform/linux/LinuxThreads.h"
 #include "platform/linux/LinuxWorkspace.h"
 #include "tests/platform/linux/Environment.h"
 #include "tests/support/TemporaryFolder.h"
@@ -44,7 +45,8 @@ struct Desktop {
     tests::TemporaryFolder temporary;
     tests::Environment environment;
     LinuxFileSystem files;
-    LinuxWorkspace workspace { files };
+    platform::LinuxThreads threads {};
+    LinuxWorkspace workspace { files, threads };
 };
 
 } // namespace

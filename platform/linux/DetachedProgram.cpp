@@ -1,0 +1,84 @@
+#include "platform/linux/DetachedProgram.h"
+
+#include "platform/linux/Descriptor.h"
+
+#include <array>
+#include <cstring>
+
+#include <fcntl.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace platform {
+
+namespace {
+
+    // Between fork and exec only what POSIX calls async-signal-safe may be called: another thread of the parent may
+    // have held any lock.
+    [[noreturn]] void become(char* const* arguments, const char* workingFolder, int problemPipe)
+    {
+        sigset_t none;
+        sigemptyset(&none);
+        sigprocmask(SIG_SETMASK, &none, nullptr);
+        signal(SIGPIPE, SIG_DFL);
+        const int nowhere = open("/dev/null", O_RDWR);
+        for (int standard = 0; nowhere >= 0 && standard <= 2; ++standard)
+            dup2(nowhere, standard);
+        int problem = 0;
+        if (workingFolder && chdir(workingFolder) == -1)
+            problem = errno;
+        if (problem == 0) {
+            execvp(arguments[0], arguments);
+            problem = errno;
+        }
+        static_cast<void>(!write(problemPipe, &problem, sizeof(problem)));
+        _exit(127);
+    }
+
+    int problemReadFrom(int pipe)
+    {
+        int problem = 0;
+        const auto count = uninterrupted([&] { return read(pipe, &problem, sizeof(problem)); });
+        return count == static_cast<ssize_t>(sizeof(problem)) ? problem : 0;
+    }
+
+} // namespace
+
+std::string startDetachedProgram(const std::vector<std::string>& arguments, const std::string& workingFolder)
+{
+    if (arguments.empty())
+        return "no program is named";
+    std::vector<char*> texts;
+    for (const std::string& argument : arguments)
+        texts.push_back(const_cast<char*>(argument.c_str()));
+    texts.push_back(nullptr);
+    std::array<int, 2> ends {};
+    if (pipe2(ends.data(), O_CLOEXEC) == -1)
+        return std::strerror(errno);
+    const Descriptor reading(ends[0]);
+    Descriptor writing(ends[1]);
+    const char* const folder = workingFolder.empty() ? nullptr : workingFolder.c_str();
+
+    // The child ends at once, so that the program is nobody's child here and leaves no zombie.
+    const pid_t child = fork();
+    if (child == -1)
+        return std::strerror(errno);
+    if (child == 0) {
+        setsid();
+        const pid_t grandchild = fork();
+        if (grandchild == 0)
+            become(texts.data(), folder, ends[1]);
+        if (grandchild == -1) {
+            const int problem = errno;
+            static_cast<void>(!write(ends[1], &problem, sizeof(problem)));
+        }
+        _exit(0);
+    }
+    writing = Descriptor();
+    uninterrupted([&] { return waitpid(child, nullptr, 0); });
+    const int problem = problemReadFrom(reading.number());
+    return problem == 0 ? std::string() : arguments.front() + ": " + std::strerror(problem);
+}
+
+} // namespace platform

@@ -40,10 +40,11 @@ using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList
 ///   editor                   EditorDiscovery.cpp
 ///   projects                 projects/ProjectSearchPaths.cpp, ProjectFolderScan.cpp, ProjectMovies.cpp,
 ///                            ProjectReload.cpp
+///   pasteboard               projects/PasteboardExport.cpp
 ///   events                   events/EventSearchPaths.cpp, EventFolderScan.cpp, EventClips.cpp, EventYears.cpp,
 ///                            EventOrder.cpp, EventPreference.cpp, EventReload.cpp
 ///   watching                 watching/PathWatching.cpp, VolumeMounts.cpp, DiskFormats.cpp
-///   user interaction         ui/Icons.cpp
+///   user interaction         ui/Icons.cpp, ContextMenus.cpp
 ///   operators' questions     Inspection.cpp
 class OBMontaroPlugin : public OBMediaManager, public OBMediaManagerPlugin_MustImplement, private OBSourceInspection {
 public:
@@ -82,8 +83,6 @@ public:
 
     // Projects
 
-    /// A list that holds the list of the private type's name.
-    static platform::Value supportedPasteboardTypes();
     /// The project folder in the user's home; absent while no home folder is known. Asked for once a process.
     platform::Text _MontaroDefaultPath();
     void _prepareMontaroProjectsSearchPaths();
@@ -101,6 +100,19 @@ public:
     std::vector<std::string> _renderedMoviesPathsForProjectPath(const platform::Text& path);
     /// The first of them; absent when there is none.
     std::optional<std::string> _previewFileForProjectPath(const platform::Text& path);
+
+    // Pasteboard
+
+    /// A list that holds the list of the private type's name.
+    static platform::Value supportedPasteboardTypes();
+    bool writeMediaObjects_toPasteboard(const OBMediaObjectList& objects, platform::Pasteboard& pasteboard) override;
+    bool writeMediaGroups_toPasteboard(const OBMediaGroupList& groups, platform::Pasteboard& pasteboard) override;
+    /// The projects of the installed tree at `paths`, in tree order; one that occurs twice there comes twice.
+    OBMediaGroupList projectGroupsForPaths(const std::vector<platform::Text>& paths);
+    static void projectGroupsForPaths_currentGroup_resultsArray(const std::vector<platform::Text>& paths,
+        const OBMediaGroupRef& currentGroup, std::vector<OBMediaGroupRef>& results);
+    /// The property list that names projects and what was rendered of them; a dictionary, possibly empty.
+    static platform::Value dictionaryWithProjects(const OBMediaGroupList& projects);
 
     // Events
 
@@ -140,6 +152,13 @@ public:
 
     OBImageRef rootMediaGroupIcon() override;
     void _grabMontaroIcons();
+    OBMenuRef contextMenuForMediaObject_inMediaGroup(
+        const OBMediaObjectRef& object, const OBMediaGroupRef& group) override;
+    OBMenuRef contextMenuForMediaGroup(const OBMediaGroupRef& group) override;
+    /// Opens the editor, whatever was chosen.
+    void contextMenuOpen(const OBMenuItem& item);
+    /// Shows the file of the movie that the menu was built for.
+    void contextMenuReveal(const OBMenuItem& item);
 
     // Operators' questions
 
@@ -163,6 +182,11 @@ private:
     bool addEventsSearchPath(const platform::Text& path);
     /// An absolute path for one that begins with "~"; absent while no home folder is known.
     platform::Text expandingTilde(std::string_view path) const;
+    void writeProjects(const OBMediaGroupList& projects, platform::Pasteboard& pasteboard);
+    template <class Represented>
+    void addItem(
+        OBMenu& menu, std::string_view titleKey, const OBMenuAction& action, const Represented& representedObject);
+    void postWillOpenOrReveal();
     void dropAppIcon() NO_THREAD_SAFETY_ANALYSIS;
     OBMediaGroupRef projectGroup(const platform::Text& listedFolder, const platform::FolderListing& listing,
         const platform::FolderItem& item, ProjectScan& scan);

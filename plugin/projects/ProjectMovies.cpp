@@ -18,8 +18,6 @@ using platform::Value;
 
 namespace {
 
-constexpr const char* projectsPasteboardType = "OBMontaroProjectsPboardType";
-
 /// Whether a child of a folder is one whose movies it shows: neither a library nor a folder.
 bool isProject(const OBMediaGroupRef& child)
 {
@@ -42,12 +40,6 @@ void addRepresentatives(OBMediaManager& manager, OBMediaGroup& folder, std::span
 }
 
 } // namespace
-
-Value OBMontaroPlugin::supportedPasteboardTypes()
-{
-    const Value types = Value::List { projectsPasteboardType };
-    return Value::List { types };
-}
 
 SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& report, const Text& project)
 {

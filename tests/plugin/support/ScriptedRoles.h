@@ -102,6 +102,10 @@ public:
 
     std::optional<std::string> applicationPath(std::string_view identifier) const override;
     std::optional<std::string> applicationIconFile(std::string_view applicationPath) const override;
+    void launchApplication(std::string_view identifier) override { _trace.add("launches " + std::string(identifier)); }
+    void launchProgram(std::string_view path) override { _trace.add("launches the program " + std::string(path)); }
+    void revealFile(std::string_view path) override { _trace.add("reveals " + std::string(path)); }
+    void observeHandOvers(std::function<void(const platform::HandOver&)>) override { }
 
 private:
     Trace& _trace;

@@ -55,6 +55,33 @@ namespace {
         { "ombrix objects --group Montaro -0 | xargs -0 ls -l", "safe for every name" },
     };
 
+    constexpr OptionInfo menuOptions[] {
+        { "--object", "", "PATH", "the movie; the first with that path counts", false, false, "--group" },
+        { "--group", "", "ID", "the group; the first with that ID counts" },
+        json,
+    };
+    constexpr Example menuExamples[] {
+        { "ombrix menu --group Montaro", "what the source offers as a whole" },
+        { "ombrix menu --object final.mov --json", "the same for a program" },
+    };
+    constexpr Example openExamples[] {
+        { "ombrix open", "the editor comes up" },
+        { "ombrix open final.mov", "the same: the editor itself is opened" },
+    };
+    constexpr Example revealExamples[] {
+        { "ombrix reveal final.mov", "the file manager shows where it lies" },
+        { "ombrix find -0 --limit 1 sunset | xargs -0 ombrix reveal", "the best hit" },
+    };
+    constexpr OptionInfo exportOptions[] {
+        { "--object", "", "PATH", "a movie; the first with that path counts", false, true },
+        { "--in", "", "ID", "of those set on the group ID itself", false, true },
+        { "--group", "", "ID", "a group; the first with that ID counts", false, true },
+    };
+    constexpr Example exportExamples[] {
+        { "ombrix export --group ~/\"Movies/Montaro Projects/Trip\"", "one project, all that was rendered" },
+        { "ombrix export --object a.mov --in Montaro --object b.mov", "two movies, one of them of the root" },
+    };
+
     constexpr OptionInfo pathsOptions[] { zero, json };
     constexpr Example pathsExamples[] {
         { "ombrix paths", "which folders are searched, and which of them exist" },
@@ -128,6 +155,23 @@ namespace {
             pathsOptions, true, pathsExamples, runPaths },
         { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
             "Prints what is known of the source without loading its tree.", infoOptions, true, infoExamples, runInfo },
+        { "menu", Intent::act, "", 0, "show what is offered for a movie or a group",
+            "Loads once and prints the context menu: its title, then an item a line with its\n"
+            "action. Prints \"null\" where there is no such movie or group.",
+            menuOptions, true, menuExamples, runMenu },
+        { "open", Intent::act, "[PATH]", 1, "open the editor",
+            "Performs the first action of a movie's menu. Loads nothing, and waits 4 seconds\n"
+            "at most until the desktop has taken over.",
+            {}, true, openExamples, runOpen },
+        { "reveal", Intent::act, "PATH", 1, "show a file in the file manager",
+            "Performs the second action of a movie's menu on any file or folder. Loads\n"
+            "nothing, and waits 4 seconds at most until the desktop has taken over.",
+            {}, true, revealExamples, runReveal },
+        { "export", Intent::act, "", 0, "print what copying gives the editor",
+            "Loads once and prints the property list that copying or dragging the movies or\n"
+            "groups would hand to the editor, as XML: the projects that they belong to, each\n"
+            "with all that was rendered of it. Prints nothing where none is written.",
+            exportOptions, true, exportExamples, runExport },
         { "explain", Intent::ask, "PATH...", anyNumber, "say why files and folders are or are not in the tree",
             "Loads once and prints, for each path, every rule that it met on its way, the\n"
             "verdict, and what would make it appear. The path need not exist. With \"-0 -\" the\n"

@@ -15,7 +15,7 @@ struct OptionInfo {
     std::string_view value; ///< what its value is called in help; empty for an option without one
     std::string_view text;
     bool isRequired = false;
-    bool mayRepeat = false; ///< the last value counts; else two values are a mistake, for one would be lost
+    bool mayRepeat = false; ///< each value counts, or the last; else two values are a mistake, for one would be lost
     std::string_view excludes {}; ///< the option that it makes no sense with
 };
 
@@ -25,7 +25,7 @@ struct Example {
 };
 
 /// What a command is for; help lists the commands by it.
-enum class Intent { look, ask };
+enum class Intent { look, act, ask };
 
 /// One command. Parsing, help and suggestions know nothing of it but this.
 struct CommandInfo {

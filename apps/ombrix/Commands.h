@@ -17,6 +17,10 @@ int runMessage(Program& program);
 int runPlugins(Program& program);
 int runQuery(Program& program);
 int runDiskFormat(Program& program);
+int runMenu(Program& program);
+int runOpen(Program& program);
+int runReveal(Program& program);
+int runExport(Program& program);
 int runHelp(Program& program);
 
 } // namespace ombrix

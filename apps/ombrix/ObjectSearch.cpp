@@ -1,0 +1,33 @@
+#include "apps/ombrix/ObjectSearch.h"
+
+#include "apps/ombrix/GroupSearch.h"
+
+#include <cstddef>
+
+namespace ombrix {
+
+OBMediaObjectRef ownObjectWithPath(const OBMediaGroup& group, std::string_view path)
+{
+    const OBMediaObjectList objects = group.ownMediaObjects();
+    std::size_t index = 0;
+    bool isFound = false;
+    objects.visit([&](OBMediaObject& object) {
+        isFound = object.path() == path;
+        if (!isFound)
+            ++index;
+        return !isFound;
+    });
+    return isFound ? objects[index] : nullptr;
+}
+
+FoundObject objectWithPath(const OBMediaGroupRef& root, std::string_view path)
+{
+    FoundObject found;
+    visitDepthFirst(root, [&](const OBMediaGroupRef& group) {
+        found = { ownObjectWithPath(*group, path), group };
+        return !found.object;
+    });
+    return found.object ? found : FoundObject();
+}
+
+} // namespace ombrix

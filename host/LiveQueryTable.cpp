@@ -52,23 +52,25 @@ void LiveQueryTable::watch(std::size_t scope, platform::Date since)
     const std::weak_ptr<LiveQueryTable> table = weak_from_this();
     const auto changed = [table, scope](const PathChange& change) {
         if (const auto alive = table.lock())
-            alive->add(scope, change);
+            alive->add({ scope, change });
     };
-    const auto stands = [changed, folder = _scopes[scope].folder] { changed(walkOf(folder)); };
+    const auto stands = [table, scope, folder = _scopes[scope].folder] {
+        if (const auto alive = table.lock())
+            alive->add({ scope, walkOf(folder), true });
+    };
     _watches.push_back(
         _core.platform().pathWatching.watch(_scopes[scope].folder, since, { changed, stands, _handlers.failed }));
 }
 
-void LiveQueryTable::add(std::size_t scope, const PathChange& change)
+void LiveQueryTable::add(Task task)
 {
     {
         Locked guard(_lock);
-        if (_tasks.size() == mostTasks) {
-            _tasks.clear();
+        _tasks.push_back(std::move(task));
+        if (_tasks.size() > mostTasks) {
+            std::erase_if(_tasks, [](const Task& waiting) { return !waiting.gathers; });
             for (std::size_t index = 0; index < _scopes.size(); ++index)
                 _tasks.push_back({ index, walkOf(_scopes[index].folder) });
-        } else {
-            _tasks.push_back({ scope, change });
         }
         if (std::exchange(_works, true))
             return;
@@ -80,7 +82,7 @@ void LiveQueryTable::work()
 {
     Task first {};
     while (takeFirst(first))
-        perform(_scopes[first.scope], first.change);
+        perform(first);
 }
 
 bool LiveQueryTable::takeFirst(Task& first)
@@ -96,11 +98,12 @@ bool LiveQueryTable::takeFirst(Task& first)
     return true;
 }
 
-void LiveQueryTable::perform(Scope& scope, const PathChange& change)
+void LiveQueryTable::perform(const Task& task)
 {
-    const bool isFirstWalk
-        = !scope.isGathered && change.kind == PathChange::Kind::anythingChanged && change.path == scope.folder;
-    if (!scope.isGathered && !isFirstWalk)
+    Scope& scope = _scopes[task.scope];
+    const PathChange& change = task.change;
+    // What came before everything is looked at will be seen then.
+    if (!scope.isGathered && !task.gathers)
         return;
     switch (change.kind) {
     case PathChange::Kind::appeared:
@@ -122,8 +125,7 @@ void LiveQueryTable::perform(Scope& scope, const PathChange& change)
     default:
         walk(scope, change.path);
     }
-    if (isFirstWalk) {
-        scope.isGathered = true;
+    if (task.gathers && !std::exchange(scope.isGathered, true)) {
         if (std::all_of(_scopes.begin(), _scopes.end(), [](const Scope& other) { return other.isGathered; }))
             tellGathered();
     }

@@ -42,13 +42,14 @@ private:
     struct Task {
         std::size_t scope;
         platform::PathChange change;
+        bool gathers = false; ///< looks at everything for the first time
     };
 
     void watch(std::size_t scope, platform::Date since);
-    void add(std::size_t scope, const platform::PathChange& change);
+    void add(Task task);
     void work();
     bool takeFirst(Task& first);
-    void perform(Scope& scope, const platform::PathChange& change);
+    void perform(const Task& task);
     void lookAtFile(Scope& scope, const std::string& path);
     void lookAtFolder(Scope& scope, const std::string& path);
     void walk(Scope& scope, const std::string& path);

@@ -15,7 +15,37 @@ namespace {
 /// The manager that this thread, the main thread, works for alone.
 thread_local const ManagerState* aloneOnThisThread = nullptr;
 
+/// Marks this thread as working for a manager alone.
+class Alone {
+public:
+    explicit Alone(const ManagerState& manager)
+        : _outer(std::exchange(aloneOnThisThread, &manager))
+    {
+    }
+    ~Alone() { aloneOnThisThread = _outer; }
+    Alone(const Alone&) = delete;
+    Alone& operator=(const Alone&) = delete;
+
+private:
+    const ManagerState* const _outer;
+};
+
 } // namespace
+
+/// Ends a piece of work, also one that ends by an error which its caller survives.
+class ManagerState::WorkEnd {
+public:
+    explicit WorkEnd(ManagerState& manager)
+        : _manager(manager)
+    {
+    }
+    ~WorkEnd() { _manager.endWork(); }
+    WorkEnd(const WorkEnd&) = delete;
+    WorkEnd& operator=(const WorkEnd&) = delete;
+
+private:
+    ManagerState& _manager;
+};
 
 platform::Date ManagerState::changeTime() const
 {
@@ -29,8 +59,8 @@ void ManagerState::performReload(std::string_view part, const std::function<void
     } else if (!core->platform().mainRunLoop.isMainThread()) {
         if (!gate.begin(changeTime()))
             return;
+        const WorkEnd end(*this);
         runReload(part, reload);
-        endWork();
     } else if (!performAlone([&] { runReload(part, reload); })) {
         const auto again = [this, manager = _manager.shared_from_this(), cause = WorkCause::current(),
                                name = std::string(part), reload] {
@@ -53,10 +83,9 @@ bool ManagerState::performAlone(const std::function<void()>& call)
 {
     if (!gate.beginAlone(changeTime()))
         return false;
-    const ManagerState* const outer = std::exchange(aloneOnThisThread, this);
+    const WorkEnd end(*this);
+    const Alone alone(*this);
     call();
-    aloneOnThisThread = outer;
-    endWork();
     return true;
 }
 

@@ -336,12 +336,18 @@ bool ManagerState::publishRoot(const OBMediaGroupRef& group)
     for (const auto& observer : listening) {
         if (!observer->callbacks.rootPublished && !observer->callbacks.published)
             continue;
-        observer->executor([observer, publication = CurrentWork::publicationOf(core->platform(), group)] {
+        const auto tell = [observer, manager = _manager.weak_from_this(),
+                              publication = CurrentWork::publicationOf(core->platform(), group)] {
+            // Two threads may hand over in another order than they published in: what is out of date is not told.
+            const auto alive = manager.lock();
+            if (!alive || alive->rootMediaGroup() != publication.rootMediaGroup)
+                return;
             if (!observer->takenBack && observer->callbacks.rootPublished)
                 observer->callbacks.rootPublished(publication.rootMediaGroup);
             if (!observer->takenBack && observer->callbacks.published)
                 observer->callbacks.published(publication);
-        });
+        };
+        observer->executor(tell);
     }
     return true;
 }

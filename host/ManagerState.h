@@ -105,6 +105,7 @@ private:
     void finishLoad(OBLoadOutcome outcome);
     void performLoad();
     void runReload(std::string_view part, const std::function<void()>& reload);
+    class WorkEnd;
     void endWork();
     platform::Date changeTime() const;
     Observers observers() const;

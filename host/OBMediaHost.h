@@ -62,7 +62,8 @@ public:
     OBManagerResult createManager(std::string_view identifier);
 
     /// Follows what managers have registered, and volumes that are mounted, until the answer is dropped. The options
-    /// of whoever follows first count while anybody does.
+    /// of whoever follows first count while anybody does. Whoever follows before the first load misses nothing; volumes
+    /// that are mounted between a load and this are not told of. Not to be called by who is told of a volume.
     [[nodiscard]] OBObservation followChanges(const OBFollowOptions& options = {});
     /// Follows the files at and below the folders of `scope` that match `query`, whether or not changes are followed
     /// otherwise.

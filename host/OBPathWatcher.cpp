@@ -118,17 +118,23 @@ void OBPathWatcher::watchQuery_observer_queryScope_queryRunMode(
     std::string_view query, OBPathWatcherObserver* observer, std::vector<std::string> scope, int runMode)
 {
     WatchedQuery registration { { std::string(query), std::move(scope), runMode }, changesMatterSince(*observer) };
-    Registrations replaced; // ended after the lock
-    Locked guard(_lock);
-    std::vector<WatchedQuery>& queries = registrationsOf(observer).queries;
-    auto known = std::find_if(
-        queries.begin(), queries.end(), [&](const WatchedQuery& other) { return other.query.text == query; });
-    if (known == queries.end())
-        known = queries.insert(known, std::move(registration));
-    else if (known->query.scope != registration.query.scope || known->query.runMode != runMode)
-        replaced.queries.push_back(std::exchange(*known, std::move(registration)));
-    if (_follows && !known->watch)
-        startQuery(*known, *observer);
+    Registrations replaced;
+    std::string problem;
+    {
+        Locked guard(_lock);
+        std::vector<WatchedQuery>& queries = registrationsOf(observer).queries;
+        auto known = std::find_if(
+            queries.begin(), queries.end(), [&](const WatchedQuery& other) { return other.query.text == query; });
+        if (known == queries.end())
+            known = queries.insert(known, std::move(registration));
+        else if (known->query.scope != registration.query.scope || known->query.runMode != runMode)
+            replaced.queries.push_back(std::exchange(*known, std::move(registration)));
+        if (_follows && !known->watch)
+            problem = startQuery(*known, *observer);
+    }
+    if (!problem.empty())
+        _core->logOnce(problem, nullptr);
+    stop(replaced);
 }
 
 void OBPathWatcher::removeObserver(const OBPathWatcherObserver* observer)
@@ -186,31 +192,37 @@ std::vector<OBPathWatcher::Query> OBPathWatcher::queriesWatchedBy(const OBPathWa
 void OBPathWatcher::follow(const OBFollowOptions& options)
 {
     _callsOnMainThread = options.callsOnMainThread;
-    Locked guard(_lock);
-    if (std::exchange(_follows, true))
-        return;
-    for (auto& [observer, registered] : _registrations) {
-        for (WatchedPath& path : registered.paths)
-            startPath(path, *registered.observer);
-        for (WatchedQuery& query : registered.queries)
-            startQuery(query, *registered.observer);
+    std::vector<std::string> problems;
+    {
+        Locked guard(_lock);
+        if (std::exchange(_follows, true))
+            return;
+        for (auto& [observer, registered] : _registrations) {
+            for (WatchedPath& path : registered.paths)
+                startPath(path, *registered.observer);
+            for (WatchedQuery& query : registered.queries)
+                problems.push_back(startQuery(query, *registered.observer));
+        }
+    }
+    for (const std::string& problem : problems) {
+        if (!problem.empty())
+            _core->logOnce(problem, nullptr);
     }
 }
 
+/// The lanes stay registered until they are closed, so that whoever takes an observer back meanwhile waits for them too.
 void OBPathWatcher::stopFollowing()
 {
     AllRegistrations before;
     {
         Locked guard(_lock);
         _follows = false;
+        before = _registrations;
         for (auto& [observer, registered] : _registrations) {
-            Registrations& stopped = before[observer];
             for (WatchedPath& path : registered.paths)
-                stopped.paths.push_back(
-                    { {}, {}, std::exchange(path.lane, nullptr), std::exchange(path.watch, nullptr) });
+                path.watch = nullptr;
             for (WatchedQuery& query : registered.queries)
-                stopped.queries.push_back(
-                    { {}, {}, std::exchange(query.lane, nullptr), std::exchange(query.watch, nullptr) });
+                query.watch = nullptr;
         }
     }
     for (auto& [observer, stopped] : before)
@@ -239,19 +251,20 @@ void OBPathWatcher::startPath(WatchedPath& path, OBPathWatcherObserver& observer
     path.watch = _core->platform().pathWatching.watch(path.path, path.since, { changed, nullptr, failed });
 }
 
-void OBPathWatcher::startQuery(WatchedQuery& query, OBPathWatcherObserver& observer)
+/// Answers what is wrong with the query; empty when it is followed. The log is the application's, and no place to go to
+/// under a lock.
+std::string OBPathWatcher::startQuery(WatchedQuery& query, OBPathWatcherObserver& observer)
 {
     const OBMetadataQuery::ParseResult parsed = OBMetadataQuery::parse(query.query.text);
-    if (!parsed.query) {
-        _core->logOnce(query.query.text + ": " + parsed.problem, nullptr);
-        return;
-    }
+    if (!parsed.query)
+        return query.query.text + ": " + parsed.problem;
     query.lane = std::make_shared<ReportLane>(*_core, observer, std::string(platform::metadataQueryUpdatedNotification),
         "files came or went: " + query.query.text, [&observer, scope = query.query.scope](const std::string& name) {
             observer.watchedQueryChanged_queryScope({ platform::Text(name) }, scope);
         });
     const auto tell = [lane = query.lane](std::string_view name) { lane->add(std::string(name)); };
     query.watch = followQuery(*_core, parsed.query, query.query.scope, query.since, tell);
+    return {};
 }
 
 platform::Date OBPathWatcher::changesMatterSince(const OBPathWatcherObserver& observer) const

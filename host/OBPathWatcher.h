@@ -120,7 +120,7 @@ private:
 
     Registrations& registrationsOf(OBPathWatcherObserver* observer) REQUIRES(_lock);
     void startPath(WatchedPath& path, OBPathWatcherObserver& observer) REQUIRES(_lock);
-    void startQuery(WatchedQuery& query, OBPathWatcherObserver& observer) REQUIRES(_lock);
+    std::string startQuery(WatchedQuery& query, OBPathWatcherObserver& observer) REQUIRES(_lock);
     platform::Date changesMatterSince(const OBPathWatcherObserver& observer) const;
     static void stop(Registrations& registrations);
 

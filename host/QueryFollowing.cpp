@@ -14,13 +14,14 @@ using platform::PathChange;
 namespace {
 
 /// Whether a change can have brought a file into the result or taken one out of it. Where it cannot be known any more
-/// what was there, it can.
-bool mayChangeResult(const OBMetadataQuery& query, const platform::Platform& platform, const PathChange& change)
+/// what was there, it can. Asks no disk: one that does not answer would keep the reports of all others waiting. So a link that bears a
+/// movie's name counts as a movie.
+bool mayChangeResult(const OBMetadataQuery& query, const PathChange& change)
 {
     switch (change.kind) {
     case PathChange::Kind::appeared:
     case PathChange::Kind::found:
-        return !change.isFolder && query.matchesByPath(change.path) && query.matches(platform, change.path);
+        return !change.isFolder && query.matchesByPath(change.path);
     case PathChange::Kind::disappeared:
         return change.isFolder ? change.heldMore : query.matchesByPath(change.path);
     case PathChange::Kind::contentChanged:
@@ -50,8 +51,8 @@ std::shared_ptr<void> followQuery(FrameworkCore& core, const std::shared_ptr<con
     };
     if (scope.empty())
         tell(platform::metadataQueryFinishedGatheringNotification);
-    const auto changed = [query, tell, platform = core.platform()](const PathChange& change) {
-        if (mayChangeResult(*query, platform, change))
+    const auto changed = [query, tell](const PathChange& change) {
+        if (mayChangeResult(*query, change))
             tell(platform::metadataQueryUpdatedNotification);
     };
     const auto watches = std::make_shared<std::vector<std::shared_ptr<void>>>();

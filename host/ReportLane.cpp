@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <utility>
+#include <vector>
 
 using platform::Locked;
 
@@ -16,8 +17,8 @@ namespace {
 constexpr std::size_t mostWorkers = 2; // one at work, one that sleeps or waits
 constexpr std::size_t mostPending = 256;
 
-/// The lane whose call this thread makes.
-thread_local const ReportLane* callingOnThisThread = nullptr;
+/// The lanes whose calls this thread makes, innermost last: a call may run a loop in which others are made.
+thread_local std::vector<const ReportLane*> callingOnThisThread;
 
 } // namespace
 
@@ -132,9 +133,9 @@ bool ReportLane::deliverFirst()
     if (!takeFirst(first))
         return false;
     const WorkCause cause({ _cause.empty() ? "changed: " + first.report : _cause, first.heardAt });
-    const ReportLane* const outer = std::exchange(callingOnThisThread, this);
+    callingOnThisThread.push_back(this);
     _deliver(first.report);
-    callingOnThisThread = outer;
+    callingOnThisThread.pop_back();
     return true;
 }
 
@@ -153,7 +154,7 @@ void ReportLane::close()
     Locked guard(_lock);
     _closed = true;
     _pending.clear();
-    const std::size_t own = callingOnThisThread == this ? 1 : 0;
+    const auto own = static_cast<std::size_t>(std::count(callingOnThisThread.begin(), callingOnThisThread.end(), this));
     while (!_keepsItselfAlive && _calls > own)
         _callEnded.wait(_lock);
 }

@@ -32,10 +32,10 @@ void VolumeNotices::stop()
 
 void VolumeNotices::mountsChanged()
 {
-    std::vector<std::string> now = _core.platform().volumes.localVolumes();
     std::vector<std::string> added;
     {
         Locked guard(_lock);
+        std::vector<std::string> now = _core.platform().volumes.localVolumes();
         for (const std::string& volume : now) {
             if (std::find(_mounted.begin(), _mounted.end(), volume) == _mounted.end())
                 added.push_back(volume);

@@ -21,8 +21,19 @@ public:
         OBMediaGroupRef library {}; ///< its children are the half
     };
 
-    /// Of the scan that begins now.
-    Number begin() { return ++_begun; }
+    /// Of the scan that begins now, whose list `shown` shows from now on: in one step, so that the list which is shown
+    /// is that of the scan that began last.
+    template <class List> Number begin(platform::Snapshot<List>& shown, const List& list)
+    {
+        Number number = 0;
+        List before; // released after the snapshot's lock
+        shown.update([&](List old) {
+            before = std::move(old);
+            number = ++_begun;
+            return list;
+        });
+        return number;
+    }
 
     /// A load puts the result of this scan into the tree by itself.
     void beganForLoad(Number number) { _loaded = number; }

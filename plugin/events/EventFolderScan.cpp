@@ -70,13 +70,12 @@ void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newe
 OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const Text& parentID, bool updateRoot)
 {
     _poolingEventsReload = false;
-    const ScanHistory::Number number = _eventScans.begin();
-    if (!updateRoot)
-        _eventScans.beganForLoad(number);
     EventScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), clipKind(),
         localizedString("MontaroClipNameDisplayFormat"), sharedValues().eventIcon.load(),
         sharedValues().calendarIcon.load() };
-    _flatEventGroupsList.store(scan.flatGroups);
+    const ScanHistory::Number number = _eventScans.begin(_flatEventGroupsList, scan.flatGroups);
+    if (!updateRoot)
+        _eventScans.beganForLoad(number);
     const Text name = localizedString("MontaroEventLibrary");
     const OBMediaGroupRef collected = makeGroup(OBMontaroRootGroupTypeIdentifier, name, name, parentID, scan.eventIcon);
 

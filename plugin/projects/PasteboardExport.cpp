@@ -99,6 +99,8 @@ bool OBMontaroPlugin::writeMediaGroups_toPasteboard(const OBMediaGroupList& grou
     std::vector<OBMediaGroupRef> forHost;
     std::vector<OBMediaGroupRef> projects;
     for (const OBMediaGroupRef& group : groups) {
+        if (!group)
+            continue;
         if (group->typeIdentifier() != OBMontaroProjectGroupTypeIdentifier) {
             forHost.push_back(group);
             continue;

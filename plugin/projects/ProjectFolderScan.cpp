@@ -62,12 +62,11 @@ OBMediaGroupRef libraryOf(const OBMediaGroupList& groups)
 OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
 {
     _poolingProjectsReload = false;
-    const ScanHistory::Number number = _projectScans.begin();
-    if (!updateRoot)
-        _projectScans.beganForLoad(number);
     ProjectScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), movieKind(*this),
         sharedValues().projectIcon.load(), sharedValues().emptyProjectIcon.load() };
-    _flatProjectGroupsList.store(scan.flatGroups);
+    const ScanHistory::Number number = _projectScans.begin(_flatProjectGroupsList, scan.flatGroups);
+    if (!updateRoot)
+        _projectScans.beganForLoad(number);
 
     std::vector<OBMediaGroupRef> libraries;
     {

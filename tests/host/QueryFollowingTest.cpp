@@ -7,6 +7,7 @@
 #include <doctest/doctest.h>
 
 #include <string>
+#include <thread>
 #include <vector>
 
 using namespace tests;
@@ -83,6 +84,42 @@ TEST_CASE("a query that asks by name or type tells that it has gathered once all
     CHECK(query.listener.scopes.lines() == Lines { "/a", "/a" });
 }
 
+TEST_CASE("a query that is registered again over other folders tells nothing more of the old ones")
+{
+    class Stopping : public OBPathWatcherObserver {
+    public:
+        void watchedQueryChanged_queryScope(
+            const platform::Notification&, const std::vector<std::string>& scope) override
+        {
+            journal.write(scope.front());
+            gate.pass();
+        }
+        Gate gate {};
+        Journal journal {};
+    };
+    QueryOfFolder query;
+    Stopping stopping;
+    stopping.gate.close();
+    query.watcher().watchQuery_observer_queryScope_queryRunMode(movieQuery, &stopping, { "/old" }, OBQueryRunModeLive);
+    query.disk().tell("/old", { Kind::anythingChanged, true, false, "/old" });
+    CHECK(stopping.gate.waitForArrivals(1));
+    query.disk().tell("/old", { Kind::anythingChanged, true, false, "/old" });
+    CHECK(stopping.gate.waitForArrivals(2));
+    query.disk().tell("/old", { Kind::anythingChanged, true, false, "/old" });
+    std::thread again([&] {
+        query.watcher().watchQuery_observer_queryScope_queryRunMode(
+            movieQuery, &stopping, { "/new" }, OBQueryRunModeLive);
+    });
+    while (query.watcher().queriesWatchedBy(&stopping).front().scope.front() == "/old")
+        std::this_thread::yield();
+    stopping.gate.open();
+    again.join();
+    query.disk().tell("/new", { Kind::anythingChanged, true, false, "/new" });
+    CHECK(stopping.journal.waitFor("/new"));
+    CHECK(stopping.journal.count("/old") == 2);
+    query.watcher().removeObserver(&stopping);
+}
+
 TEST_CASE("a query over no folder has gathered at once")
 {
     QueryOfFolder query;
@@ -101,8 +138,8 @@ TEST_CASE("files that come into a result by their name or leave it are told, eve
              { Kind::appeared, "there.mov", true },
              { Kind::found, "there.mov", true },
              { Kind::appeared, "there.txt", false },
-             { Kind::appeared, "gone.mov", false },
-             { Kind::appeared, "link.mov", false },
+             { Kind::appeared, "gone.mov", true },
+             { Kind::appeared, "link.mov", true },
              { Kind::disappeared, "gone.mov", true },
              { Kind::disappeared, "gone.txt", false },
              { Kind::contentChanged, "there.mov", false },

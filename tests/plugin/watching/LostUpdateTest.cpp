@@ -4,6 +4,8 @@
 
 #include <doctest/doctest.h>
 
+#include <stdexcept>
+
 using namespace tests;
 using Lines = std::vector<std::string>;
 
@@ -18,6 +20,18 @@ void stopAtListing(FollowedSource& test, Stop& stop, const std::string& folder)
         return platform::FileProblem::none;
     };
 }
+
+/// A source whose tree has become empty.
+struct EmptyTree : FollowedSource {
+    EmptyTree()
+    {
+        removeItem(projectsFolder());
+        removeItem(eventsFolder());
+        source->_reloadMontaroEvents();
+        source->_reloadMontaroProjects();
+        CHECK(childNames(*source->rootMediaGroup()) == "");
+    }
+};
 
 } // namespace
 
@@ -39,18 +53,18 @@ TEST_CASE("a reload that ends while a load runs is not undone by the load's tree
 
 TEST_CASE("of two scans of one half that overlap, what the one found that began later stays")
 {
-    FollowedSource test;
+    EmptyTree test;
+    // The earlier scan found nothing, and asks whether the editor is there before it says so in the tree.
     Stop stop;
-    // Both halves' locks let only one scan of a half list at a time: the later one waits behind the earlier.
-    stopAtListing(test, stop, test.projectsFolder());
+    test.workspace.whenAsked = [&stop] { stop.stopHere(); };
     std::thread earlier([&] { test.source->_reloadMontaroProjects(); });
     CHECK(stop.waitUntilReached());
     test.projects().project("Second");
-    std::thread later([&] { test.source->_reloadMontaroProjects(); });
+    test.source->_reloadMontaroProjects();
+    CHECK(childNames(*test.source->rootMediaGroup()) == "Second");
     stop.release();
     earlier.join();
-    later.join();
-    CHECK(childNames(*test.source->rootMediaGroup()) == "First Second Events");
+    CHECK(childNames(*test.source->rootMediaGroup()) == "Second");
 }
 
 TEST_CASE("two halves that end at the same moment both stay")
@@ -83,18 +97,29 @@ TEST_CASE("a tree that another has replaced is not published again")
 
 TEST_CASE("a reload that began before a load, and ends after it, changes nothing in the load's tree")
 {
-    FollowedSource test;
+    EmptyTree test;
     Stop stop;
-    // The reload has scanned and is about to look at the root's children.
-    test.workspace.whenAsked = [] {};
-    stopAtListing(test, stop, "/Montaro Events");
-    test.clip("Gone", "g.mov", noonOf(2013));
-    std::thread reload([&] { test.source->_reloadMontaroEvents(); });
+    test.workspace.whenAsked = [&stop] { stop.stopHere(); };
+    std::thread reload([&] { test.source->_reloadMontaroProjects(); });
     CHECK(stop.waitUntilReached());
-    removeItem(test.eventsFolder() + "/Gone");
-    std::thread load([&] { test.load(*test.source); });
+    test.projects().project("Second");
+    test.load(*test.source);
+    const OBMediaGroupRef installed = test.source->rootMediaGroup();
+    CHECK(childNames(*installed) == "Second Events");
     stop.release();
     reload.join();
-    load.join();
-    CHECK(test.eventNames() == "Trip");
+    CHECK(test.source->rootMediaGroup() == installed);
+    CHECK(childNames(*installed) == "Second Events");
+}
+
+TEST_CASE("a scan whose reload fails by an error ends its work, and the source goes on")
+{
+    FollowedSource test;
+    test.files.onEachCall = [](std::string_view) { throw std::runtime_error("the disk is on fire"); };
+    CHECK_THROWS_AS(
+        test.source->performReload("events", [&] { test.source->_reloadMontaroEvents(); }), std::runtime_error);
+    test.files.onEachCall = nullptr;
+    test.source->cancelLoad();
+    CHECK_FALSE(test.source->isCancelLoadRequestPending());
+    CHECK(test.load(*test.source).outcome == OBLoadOutcome::loaded);
 }

@@ -139,11 +139,16 @@ TEST_CASE("a file that is no object of the root changes nothing, whatever the co
 TEST_CASE("a movie of the root that changed is given its own thumbnail again, and nothing is reloaded")
 {
     FollowedSource test;
+    Trace read;
+    test.movies.whenRead = [&read](std::string_view path) { read.add(std::string(path)); };
     const OBMediaObjectRef clip = test.source->rootMediaGroup()->mediaObjects().objects().front();
     CHECK(clip->name() == "a");
+    test.source->watchedPathChanged_fileChangedEventFlags(clip->path(), 0);
+    CHECK(read.lines() == Lines { clip->path().string() });
     const OBImageRef picture = clip->thumbnailImage();
     test.source->watchedPathChanged_fileChangedEventFlags(clip->path(), 0);
     CHECK(clip->thumbnailImage() == picture);
+    CHECK(read.lines().size() == 1);
     CHECK(test.clock.sleepers() == 0);
     CHECK(test.published.lines().empty());
 }

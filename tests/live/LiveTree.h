@@ -1,0 +1,48 @@
+#pragma once
+
+#include "host/OBMediaHost.h"
+#include "tests/live/RandomOperations.h"
+#include "tests/support/simulated/SimulatedMachine.h"
+
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace tests {
+
+/// A tree that an application leaves open on a simulated machine while anything happens to the disks.
+class LiveTree {
+public:
+    explicit LiveTree(std::uint64_t seed);
+    ~LiveTree();
+    LiveTree(const LiveTree&) = delete;
+    LiveTree& operator=(const LiveTree&) = delete;
+
+    /// Lets so many operations come, in bursts and at long intervals, until all is quiet.
+    void live(int operations);
+    /// What differs between the tree and a fresh load; empty when nothing does.
+    std::string difference();
+    /// What has happened, a line each.
+    std::string history() const;
+
+private:
+    void follow();
+    void load(OBMediaManager& manager);
+    void reloadUnseen();
+    std::shared_ptr<OBMediaManager> makeSource();
+    OBMediaGroupRef freshTree();
+    void tellVolumesInSearchOrder();
+    std::vector<std::string> laterVolumes() const;
+
+    SimulatedMachine _machine;
+    RandomOperations _operations;
+    std::unique_ptr<OBMediaHost> _host;
+    std::shared_ptr<OBMediaManager> _source {};
+    OBObservation _observation {};
+    OBObservation _following {};
+    ListedVolumes _toldVolumes {};
+    std::vector<std::shared_ptr<OBMediaManager>> _freshSources {}; // the end of one would empty what all share
+};
+
+} // namespace tests

@@ -1,0 +1,485 @@
+#include "tests/live/RandomOperations.h"
+
+#include "platform/PathText.h"
+#include "plugin/MontaroConstants.h"
+
+#include <algorithm>
+#include <array>
+#include <chrono>
+#include <cstdio>
+#include <numeric>
+#include <utility>
+
+namespace tests {
+
+using platform::ItemKind;
+using platform::pathJoined;
+using Kind = platform::PathChange::Kind;
+using Reason = UnseenChanges::Reason;
+
+namespace {
+
+    constexpr std::chrono::seconds longestStep { 8 };
+    constexpr std::chrono::seconds longestWriting { 30 };
+    constexpr std::chrono::minutes longestFault { 1 };
+    constexpr std::string_view projects = "Montaro Projects";
+    constexpr std::string_view events = "Montaro Events";
+
+    std::vector<std::string> foldersIn(const SimulatedDisk::Item& folder)
+    {
+        std::vector<std::string> names;
+        for (const auto& item : folder.items) {
+            if (item->kind == ItemKind::folder)
+                names.push_back(item->name);
+        }
+        return names;
+    }
+
+} // namespace
+
+RandomOperations::RandomOperations(SimulatedMachine& machine)
+    : _machine(machine)
+    , _chance(machine.chance)
+    , _disk(machine.disk)
+    , _mayBeUnseen(_chance.oneIn(3))
+{
+    _volumes.push_back(machine.makeVolume("/media/ann/Stick", "Stick", true));
+    _volumes.push_back(machine.makeVolume("/media/ann/disk-1", "Disk 1"));
+    _volumes.push_back(machine.makeVolume("/media/ann/Late", "Late"));
+    _disk.changed = [this](const SimulatedDisk::Change& change) { diskChanged(change); };
+    machine.files.whenListing = [this](std::string_view folder) {
+        if (!_failing.contains(std::string(folder)))
+            return platform::FileProblem::none;
+        unseen.note(Reason::failedListing, folder);
+        return platform::FileProblem::readError;
+    };
+}
+
+RandomOperations::~RandomOperations()
+{
+    _machine.files.whenListing = nullptr;
+    _disk.changed = nullptr;
+}
+
+const std::vector<RandomOperations::Operation>& RandomOperations::operations()
+{
+    static const std::vector<Operation> table {
+        { 3, &RandomOperations::makeLibrary },
+        { 12, &RandomOperations::makeProject },
+        { 12, &RandomOperations::makeEvent },
+        { 12, &RandomOperations::addFile },
+        { 5, &RandomOperations::makeFolder },
+        { 8, &RandomOperations::renameItem },
+        { 10, &RandomOperations::moveItem },
+        { 8, &RandomOperations::removeItem },
+        { 2, &RandomOperations::replaceByFile },
+        { 2, &RandomOperations::replaceByFolder },
+        { 3, &RandomOperations::makeLink },
+        { 3, &RandomOperations::closeFolder },
+        { 2, &RandomOperations::dateFolder },
+        { 3, &RandomOperations::hideNames },
+        { 6, &RandomOperations::mountOrUnmount },
+        { 1, &RandomOperations::dropReports },
+        { 5, &RandomOperations::askForCancelAndLoad },
+        { 3, &RandomOperations::askForLoad },
+        { 1, &RandomOperations::changePreference },
+        { 1, &RandomOperations::takeEditor },
+        { 2, &RandomOperations::rewriteFile },
+        { 1, &RandomOperations::failFolder },
+    };
+    return table;
+}
+
+void RandomOperations::prepare()
+{
+    for (SimulatedMachine::Volume& volume : _volumes) {
+        if (volume.displayName != "Late" && !_chance.oneIn(4))
+            _machine.mount(volume);
+    }
+    for (const std::string_view kind : { projects, events, projects, events })
+        _disk.makeFolders(library(kind));
+    for (int count = 0; count < 6; ++count) {
+        makeProject();
+        makeEvent();
+        makeFolder();
+    }
+    _machine.threads.run(std::chrono::hours(1));
+    unseen.forget();
+}
+
+void RandomOperations::makeEditor()
+{
+    _disk.makeFolders("/opt");
+    _disk.writeFile("/opt/montaro", "");
+    _machine.workspace.applications = { { MontaroBundleIdentifier, "/opt/montaro" } };
+    editorIsMissing = false;
+}
+
+void RandomOperations::perform()
+{
+    const std::vector<Operation>& all = operations();
+    const int weights = std::accumulate(
+        all.begin(), all.end(), 0, [](int sum, const Operation& operation) { return sum + operation.weight; });
+    int drawn = static_cast<int>(_chance.below(static_cast<std::size_t>(weights)));
+    for (const Operation& operation : all) {
+        drawn -= operation.weight;
+        if (drawn < 0)
+            return (this->*operation.perform)();
+    }
+}
+
+void RandomOperations::log(const std::string& line)
+{
+    std::array<char, 32> time {};
+    std::snprintf(
+        time.data(), time.size(), "%12.6f  ", std::chrono::duration<double>(_machine.threads.monotonic()).count());
+    _lines.push_back(time.data() + line);
+}
+
+/// A change behind a link is told by nobody, unless a library itself is the link.
+void RandomOperations::diskChanged(const SimulatedDisk::Change& change)
+{
+    const std::string path = change.name.empty() ? change.folder : pathJoined(change.folder, change.name);
+    for (const std::uint64_t number : _links) {
+        const SimulatedDisk::Item* const link = _disk.itemWithNumber(number);
+        if (!link)
+            continue;
+        const std::string target = _disk.placeOf(link->text).path;
+        if (platform::isSameOrBelow(path, target) || platform::isSameOrBelow(target, path)
+            || platform::isSameOrBelow(link->text, path))
+            unseen.note(Reason::behindLink, link->path());
+    }
+    if (path.find("/Montaro Events/") != std::string::npos && path.find("/Montaro Projects") != std::string::npos)
+        unseen.note(Reason::ambiguousPath, path);
+    if ((change.kind == Kind::contentChanged || change.kind == Kind::arrivalEnded)
+        && _machine.pathWatching.somethingIsPolled())
+        unseen.note(Reason::polledContents, path);
+    _machine.pathWatching.diskChanged(change);
+}
+
+// Where.
+
+std::string RandomOperations::library(std::string_view kind)
+{
+    std::vector<std::string> places { "/Users/ann/Movies", "/Users/ann/Movies", "/" };
+    for (const SimulatedMachine::Volume& volume : _volumes) {
+        if (volume.isMounted)
+            places.push_back(volume.mountPoint);
+    }
+    return pathJoined(_chance.of(places), kind);
+}
+
+std::string RandomOperations::anyFolder()
+{
+    std::string path = _chance.oneIn(8) ? "/elsewhere" : library(_chance.oneIn(2) ? projects : events);
+    const SimulatedDisk::Item* item = _disk.itemAt(path);
+    while (item && !_chance.oneIn(3)) {
+        std::vector<std::string> folders = foldersIn(*item);
+        if (folders.empty())
+            break;
+        path = pathJoined(path, _chance.of(folders));
+        item = _disk.itemAt(path);
+    }
+    return path;
+}
+
+/// Something in a folder, or at times a whole library.
+std::string RandomOperations::anyItem()
+{
+    const std::string folder = anyFolder();
+    const SimulatedDisk::Item* const item = _disk.itemAt(folder);
+    if (!item || item->items.empty() || _chance.oneIn(20))
+        return folder;
+    return pathJoined(folder, _chance.of(item->items)->name);
+}
+
+std::string RandomOperations::newName()
+{
+    static const std::vector<std::string> names { "Trip", "Old", "b", "A", "alpha", "Zed", "Ber\xc3\xa9nice",
+        "x.mtrproject", "Pack.app", ".dot", "clip.mov", "two.m4v", "shot.MOV", "note.txt", "Shared Items",
+        "Original Media", "Montaro Projects", "Montaro Events" };
+    return _chance.of(names);
+}
+
+std::string RandomOperations::freePath()
+{
+    return pathJoined(anyFolder(), newName());
+}
+
+std::string RandomOperations::folderOfFiles()
+{
+    for (int attempt = 0; attempt < 12; ++attempt) {
+        std::string folder = anyFolder();
+        if (folder.ends_with("/Shared Items") || folder.ends_with("/Original Media"))
+            return folder;
+    }
+    return anyFolder();
+}
+
+std::string RandomOperations::movie()
+{
+    static const std::vector<std::string> movies { "1280x720", "1920x1080", "640x480", "1920x800", "no movie" };
+    return _chance.of(movies);
+}
+
+// What.
+
+/// One step now, the others a little later each.
+void RandomOperations::performSlowly(std::vector<std::function<void()>> steps)
+{
+    std::chrono::nanoseconds delay {};
+    const bool isSlow = _chance.oneIn(3);
+    for (std::function<void()>& step : steps) {
+        if (delay.count() == 0)
+            step();
+        else
+            _machine.threads.after(delay, std::move(step));
+        if (isSlow)
+            delay += _chance.time(longestStep);
+    }
+}
+
+void RandomOperations::writeSlowly(const std::string& path, const std::string& text)
+{
+    std::optional<platform::Date> date;
+    if (_chance.oneIn(3))
+        date = { 1'200'000'000 + static_cast<std::int64_t>(_chance.below(400'000'000)), 0 };
+    const auto end = [this, number = _disk.beginFile(path), text, date] { _disk.endFile(number, text, date); };
+    if (_chance.oneIn(3))
+        _machine.threads.after(_chance.time(longestWriting), end);
+    else
+        end();
+}
+
+void RandomOperations::makeLibrary()
+{
+    const std::string path = library(_chance.oneIn(2) ? projects : events);
+    log("make the library " + path);
+    if (_chance.oneIn(6)) {
+        _disk.makeFolders("/elsewhere/library");
+        _disk.makeLink(path, "/elsewhere/library");
+    }
+    _disk.makeFolder(path);
+}
+
+void RandomOperations::makeProject()
+{
+    const std::string path = pathJoined(_chance.oneIn(2) ? library(projects) : anyFolder(), newName());
+    log("make the project " + path);
+    const std::string movies = path + "/Shared Items";
+    std::vector<std::function<void()>> steps { [this, path] { _disk.makeFolder(path); },
+        [this, path] { _disk.writeFile(path + "/CurrentVersion.mtrproject", "mark"); } };
+    if (!_chance.oneIn(4)) {
+        steps.emplace_back([this, movies] { _disk.makeFolder(movies); });
+        for (std::size_t count = _chance.below(3); count != 0; --count) {
+            steps.emplace_back([this, file = pathJoined(movies, "m" + std::to_string(count) + ".mov"), text = movie()] {
+                writeSlowly(file, text);
+            });
+        }
+    }
+    performSlowly(std::move(steps));
+}
+
+void RandomOperations::makeEvent()
+{
+    const std::string path = pathJoined(_chance.oneIn(2) ? library(events) : anyFolder(), newName());
+    log("make the event " + path);
+    const std::string clips = path + "/Original Media";
+    std::vector<std::function<void()>> steps { [this, path] { _disk.makeFolder(path); },
+        [this, path] { _disk.writeFile(path + "/CurrentVersion.mtrevent", "mark"); },
+        [this, clips] { _disk.makeFolder(clips); } };
+    for (std::size_t count = 1 + _chance.below(3); count != 0; --count)
+        steps.emplace_back(
+            [this, file = pathJoined(clips, "c" + std::to_string(count) + ".mov")] { writeSlowly(file, "clip"); });
+    performSlowly(std::move(steps));
+}
+
+void RandomOperations::addFile()
+{
+    const std::string path = pathJoined(folderOfFiles(), newName());
+    log("write " + path);
+    writeSlowly(path, movie());
+}
+
+void RandomOperations::makeFolder()
+{
+    const std::string path = freePath();
+    log("make the folder " + path);
+    _disk.makeFolder(path);
+}
+
+void RandomOperations::renameItem()
+{
+    const std::string path = anyItem();
+    const std::string to = pathJoined(platform::pathByRemovingLastComponent(path), newName());
+    if (_disk.rename(path, to))
+        log("rename " + path + " to " + to);
+}
+
+void RandomOperations::moveItem()
+{
+    const std::string path = anyItem();
+    const std::string name(_chance.oneIn(2) ? std::string(platform::lastPathComponent(path)) : newName());
+    const std::string to = pathJoined(anyFolder(), name);
+    if (_disk.rename(path, to))
+        log("move " + path + " to " + to);
+}
+
+void RandomOperations::removeItem()
+{
+    const std::string path = anyItem();
+    log("remove " + path);
+    _disk.remove(path);
+}
+
+void RandomOperations::replaceByFile()
+{
+    const std::string path = anyItem();
+    log("replace " + path + " by a file");
+    if (_disk.remove(path))
+        _disk.writeFile(path, movie());
+}
+
+void RandomOperations::replaceByFolder()
+{
+    const std::string path = anyItem();
+    log("replace " + path + " by a folder");
+    if (_disk.remove(path))
+        _disk.makeFolder(path);
+}
+
+void RandomOperations::makeLink()
+{
+    const std::string path = freePath();
+    const std::string target = _chance.oneIn(8) ? "/nowhere" : anyItem();
+    if (!_disk.makeLink(path, target))
+        return;
+    log("link " + path + " to " + target);
+    _links.push_back(_disk.itemAt(path)->number);
+}
+
+void RandomOperations::closeFolder()
+{
+    const std::string path = anyFolder();
+    const SimulatedDisk::Item* const folder = _disk.itemAt(path);
+    if (!folder || folder->kind != ItemKind::folder || path == "/elsewhere")
+        return;
+    const std::uint64_t number = folder->number;
+    log("close " + path);
+    _disk.setOpen(path, false);
+    if (!_chance.oneIn(4)) {
+        _machine.threads.after(_chance.time(longestFault), [this, number] {
+            const SimulatedDisk::Item* const closed = _disk.itemWithNumber(number);
+            if (closed && _disk.setOpen(closed->path(), true))
+                log("open " + closed->path());
+        });
+    }
+}
+
+void RandomOperations::dateFolder()
+{
+    const std::string path = anyFolder();
+    const SimulatedDisk::Item* const folder = _disk.itemAt(path);
+    if (!folder || folder->kind != ItemKind::folder)
+        return;
+    log("date " + path);
+    _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
+}
+
+void RandomOperations::hideNames()
+{
+    const std::string path = pathJoined(anyFolder(), ".hidden");
+    log("write " + path);
+    _disk.writeFile(path, newName() + "\n" + newName());
+}
+
+void RandomOperations::mountOrUnmount()
+{
+    SimulatedMachine::Volume& volume = _chance.of(_volumes);
+    log((volume.isMounted ? "unmount " : "mount ") + volume.mountPoint);
+    if (volume.isMounted)
+        _machine.unmount(volume);
+    else
+        _machine.mount(volume);
+    for (const std::uint64_t number : _links) {
+        const SimulatedDisk::Item* const link = _disk.itemWithNumber(number);
+        if (link && platform::isSameOrBelow(link->text, volume.mountPoint))
+            unseen.note(Reason::behindLink, link->path());
+    }
+}
+
+void RandomOperations::dropReports()
+{
+    log("drop reports");
+    _machine.pathWatching.beginDropping();
+}
+
+void RandomOperations::askForCancelAndLoad()
+{
+    log("cancel and load");
+    if (cancelAndLoad)
+        cancelAndLoad();
+}
+
+void RandomOperations::askForLoad()
+{
+    log("load");
+    if (load)
+        load();
+}
+
+void RandomOperations::changePreference()
+{
+    if (!_mayBeUnseen)
+        return;
+    const std::string_view value = _chance.oneIn(2) ? "true" : "false";
+    log("prefer the newest events first: " + std::string(value));
+    _disk.writeFile("/Users/ann/Library/Preferences/org.ombrix.Montaro.plist",
+        "<plist version=\"1.0\"><dict><key>ZREventLibraryModule.arrangeEventsByMostRecent</key><" + std::string(value)
+            + "/></dict></plist>");
+    if (_chance.oneIn(2))
+        _disk.writeFile("/Users/ann/Library/Preferences/org.ombrix.Zuno.plist", "shared");
+    preferenceChanged = true;
+}
+
+void RandomOperations::takeEditor()
+{
+    if (!_mayBeUnseen)
+        return;
+    log("take the editor away for a while");
+    _disk.remove("/opt/montaro");
+    editorIsMissing = true;
+    unseen.noteBoth(Reason::editorMissing);
+    _machine.threads.after(_chance.time(longestFault), [this] {
+        log("put the editor back");
+        makeEditor();
+    });
+}
+
+void RandomOperations::rewriteFile()
+{
+    const std::string path = anyItem();
+    const SimulatedDisk::Item* const file = _disk.itemAt(path);
+    if (!_mayBeUnseen || !file || file->kind != ItemKind::file)
+        return;
+    log("rewrite " + path);
+    unseen.note(Reason::rewrittenInPlace, path);
+    _disk.writeFile(path, movie());
+    _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
+    _disk.setOpen(path, !_chance.oneIn(4));
+}
+
+void RandomOperations::failFolder()
+{
+    const std::string path = anyFolder();
+    if (!_mayBeUnseen || _failing.contains(path))
+        return;
+    log("fail to list " + path);
+    _failing.insert(path);
+    _machine.threads.after(_chance.time(longestFault), [this, path] {
+        log("list again " + path);
+        _failing.erase(path);
+    });
+}
+
+} // namespace tests

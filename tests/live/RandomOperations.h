@@ -1,0 +1,98 @@
+#pragma once
+
+#include "tests/live/UnseenChanges.h"
+#include "tests/support/simulated/SimulatedMachine.h"
+
+#include <cstdint>
+#include <functional>
+#include <map>
+#include <set>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace tests {
+
+/// What happens to the disks of a simulated machine while a tree is open: one operation after the other, drawn from the
+/// seed, with a line in the log for each.
+class RandomOperations {
+public:
+    /// `machine` outlives this object.
+    explicit RandomOperations(SimulatedMachine& machine);
+    ~RandomOperations();
+    RandomOperations(const RandomOperations&) = delete;
+    RandomOperations& operator=(const RandomOperations&) = delete;
+
+    /// Performs one operation on the disks, or begins it: some go on while time passes.
+    void perform();
+    /// Some disks with some libraries, to begin with.
+    void prepare();
+    void makeEditor();
+
+    /// What the application of the tree is asked to do, when that is drawn.
+    std::function<void()> cancelAndLoad {};
+    std::function<void()> load {};
+
+    void log(const std::string& line);
+    const std::vector<std::string>& lines() const { return _lines; }
+
+    UnseenChanges unseen {};
+    bool preferenceChanged = false;
+    bool editorIsMissing = false;
+
+private:
+    using Steps = std::vector<std::pair<std::string, std::function<void()>>>;
+    struct Operation {
+        int weight;
+        void (RandomOperations::*perform)();
+    };
+    static const std::vector<Operation>& operations();
+
+    // Where.
+    std::string library(std::string_view kind);
+    std::string anyFolder();
+    std::string anyItem();
+    std::string newName();
+    std::string freePath();
+    std::string folderOfFiles();
+
+    // What.
+    void makeLibrary();
+    void makeProject();
+    void makeEvent();
+    void addFile();
+    void makeFolder();
+    void renameItem();
+    void moveItem();
+    void removeItem();
+    void replaceByFile();
+    void replaceByFolder();
+    void makeLink();
+    void closeFolder();
+    void dateFolder();
+    void hideNames();
+    void mountOrUnmount();
+    void dropReports();
+    void askForCancelAndLoad();
+    void askForLoad();
+    void changePreference();
+    void takeEditor();
+    void rewriteFile();
+    void failFolder();
+
+    void performSlowly(std::vector<std::function<void()>> steps);
+    void writeSlowly(const std::string& path, const std::string& text);
+    std::string movie();
+    void diskChanged(const SimulatedDisk::Change& change);
+
+    SimulatedMachine& _machine;
+    Chance& _chance;
+    SimulatedDisk& _disk;
+    std::vector<SimulatedMachine::Volume> _volumes {};
+    std::vector<std::uint64_t> _links {};
+    std::set<std::string> _failing {};
+    std::vector<std::string> _lines {};
+    bool _mayBeUnseen = false;
+};
+
+} // namespace tests

@@ -1,0 +1,76 @@
+// The locks of simulated threads.
+//
+// The framework's threads wait for one another in locks and conditions of the standard library, which end up here: in a
+// program that is linked with this file these functions come before those of the C library. A simulated thread that
+// would block hands over to another instead; every other thread gets what it asked for. Not in a build for the thread
+// sanitizer, which needs these names itself.
+
+#include "tests/support/simulated/SimulatedThreads.h"
+
+#include <cerrno>
+
+#include <dlfcn.h>
+
+#if !defined(__SANITIZE_THREAD__)
+
+namespace {
+
+/// The C library's own function called `name`. Of conditions some machines have two kinds, of which the program that is
+/// linked today uses the later one.
+template <class Function> Function* original(const char* name)
+{
+    void* const later = ::dlvsym(RTLD_NEXT, name, "GLIBC_2.3.2");
+    return reinterpret_cast<Function*>(later ? later : ::dlsym(RTLD_NEXT, name));
+}
+
+int waitForCondition(pthread_mutex_t* mutex)
+{
+    ::pthread_mutex_unlock(mutex);
+    tests::SimulatedThreads::waitForCondition();
+    return ::pthread_mutex_lock(mutex);
+}
+
+} // namespace
+
+#pragma GCC visibility push(default)
+
+extern "C" {
+
+int pthread_mutex_lock(pthread_mutex_t* mutex)
+{
+    static const auto lock = original<int(pthread_mutex_t*)>("pthread_mutex_lock");
+    if (!tests::SimulatedThreads::isSimulated())
+        return lock(mutex);
+    int problem = ::pthread_mutex_trylock(mutex);
+    while (problem == EBUSY) {
+        tests::SimulatedThreads::waitForMutex(mutex);
+        problem = ::pthread_mutex_trylock(mutex);
+    }
+    return problem;
+}
+
+int pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex)
+{
+    static const auto wait = original<int(pthread_cond_t*, pthread_mutex_t*)>("pthread_cond_wait");
+    return tests::SimulatedThreads::isSimulated() ? waitForCondition(mutex) : wait(condition, mutex);
+}
+
+int pthread_cond_signal(pthread_cond_t* condition)
+{
+    static const auto signal = original<int(pthread_cond_t*)>("pthread_cond_signal");
+    tests::SimulatedThreads::conditionSignalled();
+    return signal(condition);
+}
+
+int pthread_cond_broadcast(pthread_cond_t* condition)
+{
+    static const auto broadcast = original<int(pthread_cond_t*)>("pthread_cond_broadcast");
+    tests::SimulatedThreads::conditionSignalled();
+    return broadcast(condition);
+}
+
+} // extern "C"
+
+#pragma GCC visibility pop
+
+#endif

@@ -1,0 +1,78 @@
+#pragma once
+
+#include "platform/Clock.h"
+#include "platform/Threads.h"
+#include "tests/support/simulated/Chance.h"
+
+#include <chrono>
+#include <functional>
+#include <map>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <pthread.h>
+
+namespace tests {
+
+/// Threads and time of a simulated machine: threads run one at a time, on real ones that hand over, and time passes
+/// only when none can run. Which one goes on is drawn from the seed, so a seed replays exactly.
+///
+/// A thread runs until it sleeps, ends, waits for a lock or a condition, or reaches a call of the simulated disk that
+/// takes its time. The thread that made this object drives the others; what it scheduled runs on it.
+class SimulatedThreads : public platform::Threads, public platform::Clock {
+public:
+    SimulatedThreads(Chance& chance, platform::Date now);
+    /// Every thread has ended.
+    ~SimulatedThreads() override;
+    SimulatedThreads(const SimulatedThreads&) = delete;
+    SimulatedThreads& operator=(const SimulatedThreads&) = delete;
+
+    /// Refuses the threads that help a scan: with them the order of its calls would not be the seed's.
+    bool startDetached(const std::string& name, std::function<void()> body) override;
+    void setNiceOfCurrentThread(int) override { }
+    std::chrono::nanoseconds processorTimeOfCurrentThread() const override { return {}; }
+
+    platform::Date now() const override;
+    std::chrono::nanoseconds monotonic() const override { return _passed; }
+    bool sleep(std::chrono::nanoseconds duration, platform::WakeSignal& wake) const override;
+
+    /// Has the driving thread make a call after a while.
+    void after(std::chrono::nanoseconds delay, std::function<void()> call);
+    /// Runs threads and calls for so long.
+    void run(std::chrono::nanoseconds duration);
+    /// Runs them until there is nothing left but threads that wait in `waitUntil`.
+    void runUntilQuiet();
+
+    /// Whether the caller is one of these threads.
+    static bool isSimulated();
+    /// Of one of these threads: lets time pass for it, and others run. Of any other: nothing.
+    void pause(std::chrono::nanoseconds duration) const;
+    /// Of one of these threads: lets others run until `condition` holds, which is asked on the driving thread.
+    void waitUntil(std::function<bool()> condition) const;
+
+    // For the locks of these threads.
+    struct Thread;
+    static void waitForMutex(pthread_mutex_t* mutex);
+    static void waitForCondition();
+    static void conditionSignalled();
+
+private:
+    using Calls = std::multimap<std::chrono::nanoseconds, std::function<void()>>;
+
+    void body(const std::shared_ptr<Thread>& thread);
+    void handOver(Thread& thread) const;
+    void yield(std::function<bool()> mayGoOn, std::chrono::nanoseconds at) const;
+    bool runOne();
+    bool letTimePass(std::chrono::nanoseconds end);
+    void removeEnded();
+    void checkForDeadlock() const;
+
+    Chance& _chance;
+    const platform::Date _start;
+    std::chrono::nanoseconds _passed {};
+    std::vector<std::shared_ptr<Thread>> _threads {};
+    Calls _calls {};
+};
+
+} // namespace tests

@@ -68,6 +68,11 @@ LiveTree::LiveTree(std::uint64_t seed)
     : _machine(seed, reinterpret_cast<void*>(&OBPluginMediaManagerClass))
     , _operations(_machine)
 {
+    _machine.threads.perform([this] { prepare(); });
+}
+
+void LiveTree::prepare()
+{
     Chance& chance = _machine.chance;
     _machine.pathWatching.dropsOneIn = chance.oneIn(3) ? 150 : 0;
     _machine.pathWatching.pollsOneIn = chance.oneIn(4) ? 3 : 0;
@@ -89,13 +94,14 @@ LiveTree::LiveTree(std::uint64_t seed)
 
 LiveTree::~LiveTree()
 {
-    _observation = {};
-    _following = {};
-    _freshSources.clear();
-    _source = nullptr;
-    _machine.threads.runUntilQuiet();
-    _machine.mainRunLoop.quit();
-    _machine.threads.runUntilQuiet();
+    _machine.threads.perform([this] {
+        _observation = {};
+        _following = {};
+        _freshSources.clear();
+        _source = nullptr;
+        _machine.threads.waitUntilQuiet();
+        _machine.mainRunLoop.quit();
+    });
 }
 
 std::shared_ptr<OBMediaManager> LiveTree::makeSource()
@@ -118,7 +124,7 @@ void LiveTree::follow()
     const OBFollowOptions options { .callsOnMainThread = _machine.chance.oneIn(5) };
     if (followsFirst)
         _following = _host->followChanges(options);
-    _machine.threads.run(followsFirst ? std::chrono::seconds(0) : std::chrono::hours(1));
+    _machine.threads.pause(followsFirst ? std::chrono::seconds(0) : std::chrono::hours(1));
     load(*_source);
     if (!followsFirst)
         _following = _host->followChanges(options);
@@ -137,9 +143,9 @@ void LiveTree::live(int operations)
     for (; operations != 0; --operations) {
         _operations.perform();
         if (!chance.oneIn(3))
-            _machine.threads.run(chance.time(chance.oneIn(10) ? std::chrono::hours(2) : std::chrono::seconds(20)));
+            _machine.threads.pause(chance.time(chance.oneIn(10) ? std::chrono::hours(2) : std::chrono::seconds(20)));
     }
-    _machine.threads.runUntilQuiet();
+    _machine.threads.waitUntilQuiet();
 }
 
 /// What changed unseen is seen with the next reload of its half, whatever brings that about.
@@ -147,8 +153,12 @@ void LiveTree::reloadUnseen()
 {
     if (std::exchange(_operations.preferenceChanged, false)) {
         _machine.disk.writeFile(sharedPreferences, "shared");
-        _machine.threads.runUntilQuiet();
+        _machine.threads.waitUntilQuiet();
         _operations.unseen.note(UnseenChanges::Reason::preference, "/Users/ann/Movies/Montaro Events");
+    }
+    if (std::exchange(_operations.editorWasMissing, false)) {
+        load(*_source);
+        _machine.threads.waitUntilQuiet();
     }
     for (const std::string folder : { "/Users/ann/Movies/Montaro Projects", "/Users/ann/Movies/Montaro Events" }) {
         if (folder.ends_with("Projects") ? _operations.unseen.projects() : _operations.unseen.events())
@@ -156,7 +166,7 @@ void LiveTree::reloadUnseen()
                 folder, { platform::PathChange::Kind::folderChanged, true, false, folder + "/no such folder" });
     }
     _operations.unseen.forget();
-    _machine.threads.runUntilQuiet();
+    _machine.threads.waitUntilQuiet();
 }
 
 /// The volumes that are searched for events, and for projects not.
@@ -189,11 +199,21 @@ OBMediaGroupRef LiveTree::freshTree()
     _freshSources.push_back(makeSource());
     OBMediaManager& fresh = *_freshSources.back();
     load(fresh);
-    _machine.threads.runUntilQuiet();
+    _machine.threads.waitUntilQuiet();
     _host->pathWatcher().removeObserver(&fresh);
-    _machine.threads.runUntilQuiet();
+    _machine.threads.waitUntilQuiet();
     _machine.toldVolumes = nullptr;
     return fresh.rootMediaGroup();
+}
+
+std::string LiveTree::differenceAfter(int operations)
+{
+    std::string found;
+    _machine.threads.perform([&] {
+        live(operations);
+        found = difference();
+    });
+    return found;
 }
 
 std::string LiveTree::difference()

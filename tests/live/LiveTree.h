@@ -19,15 +19,17 @@ public:
     LiveTree(const LiveTree&) = delete;
     LiveTree& operator=(const LiveTree&) = delete;
 
-    /// Lets so many operations come, in bursts and at long intervals, until all is quiet.
-    void live(int operations);
-    /// What differs between the tree and a fresh load; empty when nothing does.
-    std::string difference();
+    /// Lets so many operations come, in bursts and at long intervals, until all is quiet; then answers what differs
+    /// between the tree and a fresh load, which is empty when nothing does.
+    std::string differenceAfter(int operations);
     /// What has happened, a line each.
     std::string history() const;
 
 private:
+    void prepare();
     void follow();
+    void live(int operations);
+    std::string difference();
     void load(OBMediaManager& manager);
     void reloadUnseen();
     std::shared_ptr<OBMediaManager> makeSource();

@@ -48,6 +48,7 @@ RandomOperations::RandomOperations(SimulatedMachine& machine)
     _volumes.push_back(machine.makeVolume("/media/ann/Late", "Late"));
     _disk.changed = [this](const SimulatedDisk::Change& change) { diskChanged(change); };
     machine.files.whenListing = [this](std::string_view folder) {
+        const SimulatedThreads::Undisturbed here;
         if (!_failing.contains(std::string(folder)))
             return platform::FileProblem::none;
         unseen.note(Reason::failedListing, folder);
@@ -103,7 +104,7 @@ void RandomOperations::prepare()
         makeEvent();
         makeFolder();
     }
-    _machine.threads.run(std::chrono::hours(1));
+    _machine.threads.pause(std::chrono::hours(1));
     unseen.forget();
 }
 
@@ -112,7 +113,6 @@ void RandomOperations::makeEditor()
     _disk.makeFolders("/opt");
     _disk.writeFile("/opt/montaro", "");
     _machine.workspace.applications = { { MontaroBundleIdentifier, "/opt/montaro" } };
-    editorIsMissing = false;
 }
 
 void RandomOperations::perform()
@@ -130,6 +130,7 @@ void RandomOperations::perform()
 
 void RandomOperations::log(const std::string& line)
 {
+    const SimulatedThreads::Undisturbed here;
     std::array<char, 32> time {};
     std::snprintf(
         time.data(), time.size(), "%12.6f  ", std::chrono::duration<double>(_machine.threads.monotonic()).count());
@@ -386,11 +387,16 @@ void RandomOperations::dateFolder()
     _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
 }
 
+/// A name that is there more often than not, in a list that is there already if need be.
 void RandomOperations::hideNames()
 {
-    const std::string path = pathJoined(anyFolder(), ".hidden");
-    log("write " + path);
-    _disk.writeFile(path, newName() + "\n" + newName());
+    std::string folder = anyFolder();
+    for (int attempt = 0; attempt < 4 && !_disk.itemAt(folder + "/.hidden"); ++attempt)
+        folder = anyFolder();
+    const SimulatedDisk::Item* const item = _disk.itemAt(folder);
+    const std::string name = item && !item->items.empty() ? _chance.of(item->items)->name : newName();
+    log("write " + folder + "/.hidden: " + name);
+    _disk.writeFile(folder + "/.hidden", name + "\n" + newName());
 }
 
 void RandomOperations::mountOrUnmount()
@@ -448,8 +454,7 @@ void RandomOperations::takeEditor()
         return;
     log("take the editor away for a while");
     _disk.remove("/opt/montaro");
-    editorIsMissing = true;
-    unseen.noteBoth(Reason::editorMissing);
+    editorWasMissing = true;
     _machine.threads.after(_chance.time(longestFault), [this] {
         log("put the editor back");
         makeEditor();

@@ -38,7 +38,7 @@ public:
 
     UnseenChanges unseen {};
     bool preferenceChanged = false;
-    bool editorIsMissing = false;
+    bool editorWasMissing = false;
 
 private:
     using Steps = std::vector<std::pair<std::string, std::function<void()>>>;

@@ -107,11 +107,6 @@ void UnseenChanges::note(Reason, std::string_view path)
     _events = _events || isBelowFolderCalled(path, MontaroEventsFolderName);
 }
 
-void UnseenChanges::noteBoth(Reason)
-{
-    _projects = _events = true;
-}
-
 std::string comparableTree(const OBMediaGroupRef& root, const std::vector<std::string>& laterVolumes)
 {
     if (!root)

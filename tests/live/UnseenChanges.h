@@ -18,6 +18,9 @@ namespace tests {
 //   projects of later ones are taken out of its tree.
 // - An events library without clips leaves the tree with a reload and stays in it with a load: it is taken out of both.
 //
+// Differences that last until the tree is loaded again:
+// - While the editor is missing nothing is loaded, and what cannot be loaded does not empty the tree.
+//
 // Differences that last until the half is reloaded for another reason: `UnseenChanges::Reason`.
 
 /// The halves of the tree in which something changed that nothing tells of.
@@ -31,11 +34,9 @@ public:
         ambiguousPath, ///< which half a change belongs to is read off its path: below a folder called Montaro Projects in
         ///< the events, it belongs to the projects
         preference, ///< the order of events: the preference is read anew, and used by the next reload
-        editorMissing, ///< nothing is loaded, and nothing emptied, while the editor is missing
     };
 
     void note(Reason reason, std::string_view path);
-    void noteBoth(Reason reason);
     bool projects() const { return _projects; }
     bool events() const { return _events; }
     void forget() { *this = {}; }

@@ -1,15 +1,19 @@
-// The locks of simulated threads.
+// The locks of simulated threads, and where they may be disturbed.
 //
 // The framework's threads wait for one another in locks and conditions of the standard library, which end up here: in a
 // program that is linked with this file these functions come before those of the C library. A simulated thread that
-// would block hands over to another instead; every other thread gets what it asked for. Not in a build for the thread
+// would block hands over to another instead; every other thread gets what it asked for. What allocates or locks is also
+// where a thread is made to stop between two steps of its own. Not in a build for the thread
 // sanitizer, which needs these names itself.
 
 #include "tests/support/simulated/SimulatedThreads.h"
 
 #include <cerrno>
+#include <cstdlib>
+#include <new>
 
 #include <dlfcn.h>
+#include <sched.h>
 
 #if !defined(__SANITIZE_THREAD__)
 
@@ -41,6 +45,7 @@ int pthread_mutex_lock(pthread_mutex_t* mutex)
     static const auto lock = original<int(pthread_mutex_t*)>("pthread_mutex_lock");
     if (!tests::SimulatedThreads::isSimulated())
         return lock(mutex);
+    tests::SimulatedThreads::mayBeDisturbed();
     int problem = ::pthread_mutex_trylock(mutex);
     while (problem == EBUSY) {
         tests::SimulatedThreads::waitForMutex(mutex);
@@ -69,7 +74,35 @@ int pthread_cond_broadcast(pthread_cond_t* condition)
     return broadcast(condition);
 }
 
+/// Asked for by who waits for a lock that is held for a few steps only.
+int sched_yield()
+{
+    static const auto yield = original<int()>("sched_yield");
+    if (!tests::SimulatedThreads::isSimulated())
+        return yield();
+    tests::SimulatedThreads::letOthersRun();
+    return 0;
+}
+
 } // extern "C"
+
+void* operator new(std::size_t size)
+{
+    tests::SimulatedThreads::mayBeDisturbed();
+    if (void* const memory = std::malloc(size))
+        return memory;
+    throw std::bad_alloc();
+}
+
+void operator delete(void* memory) noexcept
+{
+    std::free(memory);
+}
+
+void operator delete(void* memory, std::size_t) noexcept
+{
+    std::free(memory);
+}
 
 #pragma GCC visibility pop
 

@@ -32,6 +32,7 @@ SimulatedMachine::SimulatedMachine(std::uint64_t seed, void* linkedEntryPoint)
     volumes.local = { { "/", "Boot" } };
     disk.changed = [this](const SimulatedDisk::Change& change) { pathWatching.diskChanged(change); };
     files.onEachCall = [this](std::string_view) {
+        const SimulatedThreads::Undisturbed here;
         if (diskTakesTime && chance.oneIn(6))
             threads.pause(chance.oneIn(3) ? chance.time(std::chrono::seconds(2)) : std::chrono::nanoseconds(0));
     };

@@ -37,6 +37,55 @@ private:
     const platform::FileSystem& _files;
 };
 
+/// Whole answers of a file system, in which no other thread changes anything meanwhile.
+class UndisturbedFileSystem : public platform::FileSystem {
+public:
+    explicit UndisturbedFileSystem(const platform::FileSystem& files)
+        : _files(files)
+    {
+    }
+    std::optional<std::string> homeFolder() const override { return _files.homeFolder(); }
+    platform::FolderListing itemsInFolder(
+        std::string_view folder, const platform::ListingRequest& request) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.itemsInFolder(folder, request);
+    }
+    std::optional<platform::ItemStatus> status(std::string_view path) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.status(path);
+    }
+    std::optional<platform::ItemStatus> linkStatus(std::string_view path) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.linkStatus(path);
+    }
+    std::optional<std::string> linkTarget(std::string_view path) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.linkTarget(path);
+    }
+    platform::ItemFlags itemFlags(std::string_view path) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.itemFlags(path);
+    }
+    std::string resolvedPath(std::string_view path) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.resolvedPath(path);
+    }
+    platform::OpenResult openPlainFile(std::string_view path, platform::PathKnowledge known) const override
+    {
+        const SimulatedThreads::Undisturbed here;
+        return _files.openPlainFile(path, known);
+    }
+
+private:
+    const platform::FileSystem& _files;
+};
+
 /// A whole machine in memory whose hours pass in milliseconds: disk, volumes, watching, threads, time and main thread,
 /// all of them decided by a seed. Real are only the plug-in's own bundle and the calendar.
 class SimulatedMachine {
@@ -69,7 +118,8 @@ public:
     platform::LinkTable links { {}, volumes, bareFiles };
     platform::LinkedFileSystem linkedFiles { bareFiles, links };
     SimulatedPathWatching pathWatching { threads, chance, disk, linkedFiles };
-    FaultyFileSystem files { linkedFiles };
+    UndisturbedFileSystem undisturbedFiles { linkedFiles };
+    FaultyFileSystem files { undisturbedFiles };
     ListedWorkspace workspace {};
     SimulatedMovies movies { files };
     platform::FilePreferences preferences { files };
@@ -90,11 +140,24 @@ private:
             : _machine(machine)
         {
         }
-        std::vector<std::string> localVolumes() const override { return told().localVolumes(); }
-        std::vector<std::string> removableMedia() const override { return told().removableMedia(); }
-        std::string displayName(std::string_view path) const override { return told().displayName(path); }
+        std::vector<std::string> localVolumes() const override
+        {
+            const SimulatedThreads::Undisturbed here;
+            return told().localVolumes();
+        }
+        std::vector<std::string> removableMedia() const override
+        {
+            const SimulatedThreads::Undisturbed here;
+            return told().removableMedia();
+        }
+        std::string displayName(std::string_view path) const override
+        {
+            const SimulatedThreads::Undisturbed here;
+            return told().displayName(path);
+        }
         std::optional<std::string> fileSystemType(std::string_view path) const override
         {
+            const SimulatedThreads::Undisturbed here;
             return told().fileSystemType(path);
         }
         std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const override

@@ -29,10 +29,22 @@ void SimulatedMainLoop::work()
             _threads.waitUntil([this] { return !_calls.empty() || _quits; });
             continue;
         }
-        const std::function<void()> call = std::move(_calls.front());
-        _calls.pop_front();
-        call();
+        takeFirst()();
     }
+}
+
+std::function<void()> SimulatedMainLoop::takeFirst()
+{
+    const SimulatedThreads::Undisturbed here;
+    std::function<void()> call = std::move(_calls.front());
+    _calls.pop_front();
+    return call;
+}
+
+void SimulatedMainLoop::post(std::function<void()> call)
+{
+    const SimulatedThreads::Undisturbed here;
+    _calls.push_back(std::move(call));
 }
 
 bool SimulatedMainLoop::performAndWait(const std::function<void()>& call)

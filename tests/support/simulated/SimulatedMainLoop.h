@@ -19,7 +19,7 @@ public:
     void endModal() override { }
     void quit() override { _quits = true; }
     bool isMainThread() const override;
-    void post(std::function<void()> call) override { _calls.push_back(std::move(call)); }
+    void post(std::function<void()> call) override;
     /// Asked on one of the simulated threads.
     bool performAndWait(const std::function<void()>& call) override;
     void performAfterDelay(
@@ -27,6 +27,7 @@ public:
 
 private:
     void work();
+    std::function<void()> takeFirst();
 
     SimulatedThreads& _threads;
     std::deque<std::function<void()>> _calls {};

@@ -58,6 +58,7 @@ bool SimulatedPathWatching::somethingIsPolled() const
 std::shared_ptr<void> SimulatedPathWatching::watch(
     std::string_view path, platform::Date since, platform::PathWatchHandlers handlers)
 {
+    const SimulatedThreads::Undisturbed here;
     const auto root = std::make_shared<Root>(Root { std::string(path), since, std::move(handlers) });
     root->isPolled = pollsOneIn != 0 && _chance.oneIn(pollsOneIn);
     _roots->push_back(root);
@@ -66,6 +67,7 @@ std::shared_ptr<void> SimulatedPathWatching::watch(
             stand(*root);
     });
     return std::shared_ptr<void>(nullptr, [roots = _roots, root](void*) {
+        const SimulatedThreads::Undisturbed ending;
         root->isTakenBack = true;
         std::erase(*roots, root);
     });

@@ -19,7 +19,8 @@ namespace tests {
 /// only when none can run. Which one goes on is drawn from the seed, so a seed replays exactly.
 ///
 /// A thread runs until it sleeps, ends, waits for a lock or a condition, or reaches a call of the simulated disk that
-/// takes its time. The thread that made this object drives the others; what it scheduled runs on it.
+/// takes its time; those of the code under test also now and then where they allocate or lock. The thread that made
+/// this object drives the others and does nothing else meanwhile.
 class SimulatedThreads : public platform::Threads, public platform::Clock {
 public:
     SimulatedThreads(Chance& chance, platform::Date now);
@@ -37,22 +38,34 @@ public:
     std::chrono::nanoseconds monotonic() const override { return _passed; }
     bool sleep(std::chrono::nanoseconds duration, platform::WakeSignal& wake) const override;
 
-    /// Has the driving thread make a call after a while.
+    /// Has a thread of the machine's own make a call after a while.
     void after(std::chrono::nanoseconds delay, std::function<void()> call);
-    /// Runs threads and calls for so long.
-    void run(std::chrono::nanoseconds duration);
-    /// Runs them until there is nothing left but threads that wait in `waitUntil`.
-    void runUntilQuiet();
+    /// Of the driving thread: runs `body` on a thread of an application, and all others, until it has returned.
+    void perform(std::function<void()> body);
 
     /// Whether the caller is one of these threads.
     static bool isSimulated();
-    /// Of one of these threads: lets time pass for it, and others run. Of any other: nothing.
+    // Of these threads, the application's for instance; of any other: nothing.
+    /// Lets time pass, and others run.
     void pause(std::chrono::nanoseconds duration) const;
-    /// Of one of these threads: lets others run until `condition` holds, which is asked on the driving thread.
+    /// Lets others run until `condition` holds, which is asked on the driving thread.
     void waitUntil(std::function<bool()> condition) const;
+    /// Lets others run until there is nothing left but threads that wait in `waitUntil`.
+    void waitUntilQuiet() const;
 
-    // For the locks of these threads.
+    /// While one lives, its thread goes on undisturbed where it does not wait: for what is no code under test.
+    class Undisturbed {
+    public:
+        Undisturbed();
+        ~Undisturbed();
+        Undisturbed(const Undisturbed&) = delete;
+        Undisturbed& operator=(const Undisturbed&) = delete;
+    };
+
+    // For the locks and allocations of these threads.
     struct Thread;
+    static void mayBeDisturbed();
+    static void letOthersRun();
     static void waitForMutex(pthread_mutex_t* mutex);
     static void waitForCondition();
     static void conditionSignalled();
@@ -60,19 +73,23 @@ public:
 private:
     using Calls = std::multimap<std::chrono::nanoseconds, std::function<void()>>;
 
+    Thread& start(const std::string& name, std::function<void()> body);
     void body(const std::shared_ptr<Thread>& thread);
+    void makeCalls();
+    bool hasDueCall() const { return !_calls.empty() && _calls.begin()->first <= _passed; }
     void handOver(Thread& thread) const;
     void yield(std::function<bool()> mayGoOn, std::chrono::nanoseconds at) const;
     bool runOne();
-    bool letTimePass(std::chrono::nanoseconds end);
+    bool letTimePass();
+    bool tellQuiet();
     void removeEnded();
-    void checkForDeadlock() const;
 
     Chance& _chance;
     const platform::Date _start;
     std::chrono::nanoseconds _passed {};
     std::vector<std::shared_ptr<Thread>> _threads {};
     Calls _calls {};
+    bool _ends = false;
 };
 
 } // namespace tests

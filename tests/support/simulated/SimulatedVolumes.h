@@ -33,6 +33,7 @@ public:
 
     std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const override
     {
+        const SimulatedThreads::Undisturbed here;
         const int number = ++_last;
         _followers->emplace(number, changed);
         return std::shared_ptr<void>(nullptr, [followers = _followers, number](void*) { followers->erase(number); });

@@ -84,9 +84,9 @@ void LiveTree::prepare()
     options.pluginFolders = { OMBRIX_PLUGIN_FOLDER };
     _host = std::make_unique<OBMediaHost>(_machine.platform(), std::move(options));
     _source = makeSource();
-    _operations.load = [this] { load(*_source); };
-    _operations.cancelAndLoad = [this] {
-        _source->cancelLoad();
+    _operations.load = [this](bool cancelsFirst) {
+        if (cancelsFirst)
+            _source->cancelLoad();
         load(*_source);
     };
     follow();

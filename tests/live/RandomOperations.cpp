@@ -22,18 +22,6 @@ namespace {
     constexpr std::chrono::seconds longestStep { 8 };
     constexpr std::chrono::seconds longestWriting { 30 };
     constexpr std::chrono::minutes longestFault { 1 };
-    constexpr std::string_view projects = "Montaro Projects";
-    constexpr std::string_view events = "Montaro Events";
-
-    std::vector<std::string> foldersIn(const SimulatedDisk::Item& folder)
-    {
-        std::vector<std::string> names;
-        for (const auto& item : folder.items) {
-            if (item->kind == ItemKind::folder)
-                names.push_back(item->name);
-        }
-        return names;
-    }
 
 } // namespace
 
@@ -41,11 +29,12 @@ RandomOperations::RandomOperations(SimulatedMachine& machine)
     : _machine(machine)
     , _chance(machine.chance)
     , _disk(machine.disk)
+    , _places(machine)
     , _mayBeUnseen(_chance.oneIn(3))
 {
-    _volumes.push_back(machine.makeVolume("/media/ann/Stick", "Stick", true));
-    _volumes.push_back(machine.makeVolume("/media/ann/disk-1", "Disk 1"));
-    _volumes.push_back(machine.makeVolume("/media/ann/Late", "Late"));
+    _places.volumes.push_back(machine.makeVolume("/media/ann/Stick", "Stick", true));
+    _places.volumes.push_back(machine.makeVolume("/media/ann/disk-1", "Disk 1"));
+    _places.volumes.push_back(machine.makeVolume("/media/ann/Late", "Late"));
     _disk.changed = [this](const SimulatedDisk::Change& change) { diskChanged(change); };
     machine.files.whenListing = [this](std::string_view folder) {
         const SimulatedThreads::Undisturbed here;
@@ -73,16 +62,14 @@ const std::vector<RandomOperations::Operation>& RandomOperations::operations()
         { 8, &RandomOperations::renameItem },
         { 10, &RandomOperations::moveItem },
         { 8, &RandomOperations::removeItem },
-        { 2, &RandomOperations::replaceByFile },
-        { 2, &RandomOperations::replaceByFolder },
+        { 4, &RandomOperations::replaceItem },
         { 3, &RandomOperations::makeLink },
         { 3, &RandomOperations::closeFolder },
         { 2, &RandomOperations::dateFolder },
         { 3, &RandomOperations::hideNames },
         { 6, &RandomOperations::mountOrUnmount },
         { 1, &RandomOperations::dropReports },
-        { 5, &RandomOperations::askForCancelAndLoad },
-        { 3, &RandomOperations::askForLoad },
+        { 8, &RandomOperations::askForLoad },
         { 1, &RandomOperations::changePreference },
         { 1, &RandomOperations::takeEditor },
         { 2, &RandomOperations::rewriteFile },
@@ -93,12 +80,12 @@ const std::vector<RandomOperations::Operation>& RandomOperations::operations()
 
 void RandomOperations::prepare()
 {
-    for (SimulatedMachine::Volume& volume : _volumes) {
+    for (SimulatedMachine::Volume& volume : _places.volumes) {
         if (volume.displayName != "Late" && !_chance.oneIn(4))
             _machine.mount(volume);
     }
-    for (const std::string_view kind : { projects, events, projects, events })
-        _disk.makeFolders(library(kind));
+    for (const char* const kind : { MontaroProjectsFolderName, MontaroEventsFolderName, MontaroProjectsFolderName })
+        _disk.makeFolders(_places.library(kind));
     for (int count = 0; count < 6; ++count) {
         makeProject();
         makeEvent();
@@ -158,73 +145,6 @@ void RandomOperations::diskChanged(const SimulatedDisk::Change& change)
     _machine.pathWatching.diskChanged(change);
 }
 
-// Where.
-
-std::string RandomOperations::library(std::string_view kind)
-{
-    std::vector<std::string> places { "/Users/ann/Movies", "/Users/ann/Movies", "/" };
-    for (const SimulatedMachine::Volume& volume : _volumes) {
-        if (volume.isMounted)
-            places.push_back(volume.mountPoint);
-    }
-    return pathJoined(_chance.of(places), kind);
-}
-
-std::string RandomOperations::anyFolder()
-{
-    std::string path = _chance.oneIn(8) ? "/elsewhere" : library(_chance.oneIn(2) ? projects : events);
-    const SimulatedDisk::Item* item = _disk.itemAt(path);
-    while (item && !_chance.oneIn(3)) {
-        std::vector<std::string> folders = foldersIn(*item);
-        if (folders.empty())
-            break;
-        path = pathJoined(path, _chance.of(folders));
-        item = _disk.itemAt(path);
-    }
-    return path;
-}
-
-/// Something in a folder, or at times a whole library.
-std::string RandomOperations::anyItem()
-{
-    const std::string folder = anyFolder();
-    const SimulatedDisk::Item* const item = _disk.itemAt(folder);
-    if (!item || item->items.empty() || _chance.oneIn(20))
-        return folder;
-    return pathJoined(folder, _chance.of(item->items)->name);
-}
-
-std::string RandomOperations::newName()
-{
-    static const std::vector<std::string> names { "Trip", "Old", "b", "A", "alpha", "Zed", "Ber\xc3\xa9nice",
-        "x.mtrproject", "Pack.app", ".dot", "clip.mov", "two.m4v", "shot.MOV", "note.txt", "Shared Items",
-        "Original Media", "Montaro Projects", "Montaro Events" };
-    return _chance.of(names);
-}
-
-std::string RandomOperations::freePath()
-{
-    return pathJoined(anyFolder(), newName());
-}
-
-std::string RandomOperations::folderOfFiles()
-{
-    for (int attempt = 0; attempt < 12; ++attempt) {
-        std::string folder = anyFolder();
-        if (folder.ends_with("/Shared Items") || folder.ends_with("/Original Media"))
-            return folder;
-    }
-    return anyFolder();
-}
-
-std::string RandomOperations::movie()
-{
-    static const std::vector<std::string> movies { "1280x720", "1920x1080", "640x480", "1920x800", "no movie" };
-    return _chance.of(movies);
-}
-
-// What.
-
 /// One step now, the others a little later each.
 void RandomOperations::performSlowly(std::vector<std::function<void()>> steps)
 {
@@ -254,7 +174,7 @@ void RandomOperations::writeSlowly(const std::string& path, const std::string& t
 
 void RandomOperations::makeLibrary()
 {
-    const std::string path = library(_chance.oneIn(2) ? projects : events);
+    const std::string path = _places.library(_chance.oneIn(2) ? MontaroProjectsFolderName : MontaroEventsFolderName);
     log("make the library " + path);
     if (_chance.oneIn(6)) {
         _disk.makeFolders("/elsewhere/library");
@@ -265,7 +185,8 @@ void RandomOperations::makeLibrary()
 
 void RandomOperations::makeProject()
 {
-    const std::string path = pathJoined(_chance.oneIn(2) ? library(projects) : anyFolder(), newName());
+    const std::string path = pathJoined(
+        _chance.oneIn(2) ? _places.library(MontaroProjectsFolderName) : _places.anyFolder(), _places.newName());
     log("make the project " + path);
     const std::string movies = path + "/Shared Items";
     std::vector<std::function<void()>> steps { [this, path] { _disk.makeFolder(path); },
@@ -273,9 +194,8 @@ void RandomOperations::makeProject()
     if (!_chance.oneIn(4)) {
         steps.emplace_back([this, movies] { _disk.makeFolder(movies); });
         for (std::size_t count = _chance.below(3); count != 0; --count) {
-            steps.emplace_back([this, file = pathJoined(movies, "m" + std::to_string(count) + ".mov"), text = movie()] {
-                writeSlowly(file, text);
-            });
+            steps.emplace_back([this, file = pathJoined(movies, "m" + std::to_string(count) + ".mov"),
+                                   text = _places.movie()] { writeSlowly(file, text); });
         }
     }
     performSlowly(std::move(steps));
@@ -283,7 +203,8 @@ void RandomOperations::makeProject()
 
 void RandomOperations::makeEvent()
 {
-    const std::string path = pathJoined(_chance.oneIn(2) ? library(events) : anyFolder(), newName());
+    const std::string path = pathJoined(
+        _chance.oneIn(2) ? _places.library(MontaroEventsFolderName) : _places.anyFolder(), _places.newName());
     log("make the event " + path);
     const std::string clips = path + "/Original Media";
     std::vector<std::function<void()>> steps { [this, path] { _disk.makeFolder(path); },
@@ -297,62 +218,55 @@ void RandomOperations::makeEvent()
 
 void RandomOperations::addFile()
 {
-    const std::string path = pathJoined(folderOfFiles(), newName());
+    const std::string path = pathJoined(_places.folderOfFiles(), _places.newName());
     log("write " + path);
-    writeSlowly(path, movie());
+    writeSlowly(path, _places.movie());
 }
 
 void RandomOperations::makeFolder()
 {
-    const std::string path = freePath();
+    const std::string path = _places.freePath();
     log("make the folder " + path);
     _disk.makeFolder(path);
 }
 
 void RandomOperations::renameItem()
 {
-    const std::string path = anyItem();
-    const std::string to = pathJoined(platform::pathByRemovingLastComponent(path), newName());
+    const std::string path = _places.anyItem();
+    const std::string to = pathJoined(platform::pathByRemovingLastComponent(path), _places.newName());
     if (_disk.rename(path, to))
         log("rename " + path + " to " + to);
 }
 
 void RandomOperations::moveItem()
 {
-    const std::string path = anyItem();
-    const std::string name(_chance.oneIn(2) ? std::string(platform::lastPathComponent(path)) : newName());
-    const std::string to = pathJoined(anyFolder(), name);
+    const std::string path = _places.anyItem();
+    const std::string name(_chance.oneIn(2) ? std::string(platform::lastPathComponent(path)) : _places.newName());
+    const std::string to = pathJoined(_places.anyFolder(), name);
     if (_disk.rename(path, to))
         log("move " + path + " to " + to);
 }
 
 void RandomOperations::removeItem()
 {
-    const std::string path = anyItem();
+    const std::string path = _places.anyItem();
     log("remove " + path);
     _disk.remove(path);
 }
 
-void RandomOperations::replaceByFile()
+void RandomOperations::replaceItem()
 {
-    const std::string path = anyItem();
-    log("replace " + path + " by a file");
+    const std::string path = _places.anyItem();
+    const bool byFolder = _chance.oneIn(2);
+    log("replace " + path + (byFolder ? " by a folder" : " by a file"));
     if (_disk.remove(path))
-        _disk.writeFile(path, movie());
-}
-
-void RandomOperations::replaceByFolder()
-{
-    const std::string path = anyItem();
-    log("replace " + path + " by a folder");
-    if (_disk.remove(path))
-        _disk.makeFolder(path);
+        byFolder ? _disk.makeFolder(path) : _disk.writeFile(path, _places.movie());
 }
 
 void RandomOperations::makeLink()
 {
-    const std::string path = freePath();
-    const std::string target = _chance.oneIn(8) ? "/nowhere" : anyItem();
+    const std::string path = _places.freePath();
+    const std::string target = _chance.oneIn(8) ? "/nowhere" : _places.anyItem();
     if (!_disk.makeLink(path, target))
         return;
     log("link " + path + " to " + target);
@@ -361,7 +275,7 @@ void RandomOperations::makeLink()
 
 void RandomOperations::closeFolder()
 {
-    const std::string path = anyFolder();
+    const std::string path = _places.anyFolder();
     const SimulatedDisk::Item* const folder = _disk.itemAt(path);
     if (!folder || folder->kind != ItemKind::folder || path == "/elsewhere")
         return;
@@ -379,7 +293,7 @@ void RandomOperations::closeFolder()
 
 void RandomOperations::dateFolder()
 {
-    const std::string path = anyFolder();
+    const std::string path = _places.anyFolder();
     const SimulatedDisk::Item* const folder = _disk.itemAt(path);
     if (!folder || folder->kind != ItemKind::folder)
         return;
@@ -390,18 +304,18 @@ void RandomOperations::dateFolder()
 /// A name that is there more often than not, in a list that is there already if need be.
 void RandomOperations::hideNames()
 {
-    std::string folder = anyFolder();
+    std::string folder = _places.anyFolder();
     for (int attempt = 0; attempt < 4 && !_disk.itemAt(folder + "/.hidden"); ++attempt)
-        folder = anyFolder();
+        folder = _places.anyFolder();
     const SimulatedDisk::Item* const item = _disk.itemAt(folder);
-    const std::string name = item && !item->items.empty() ? _chance.of(item->items)->name : newName();
+    const std::string name = item && !item->items.empty() ? _chance.of(item->items)->name : _places.newName();
     log("write " + folder + "/.hidden: " + name);
-    _disk.writeFile(folder + "/.hidden", name + "\n" + newName());
+    _disk.writeFile(folder + "/.hidden", name + "\n" + _places.newName());
 }
 
 void RandomOperations::mountOrUnmount()
 {
-    SimulatedMachine::Volume& volume = _chance.of(_volumes);
+    SimulatedMachine::Volume& volume = _chance.of(_places.volumes);
     log((volume.isMounted ? "unmount " : "mount ") + volume.mountPoint);
     if (volume.isMounted)
         _machine.unmount(volume);
@@ -420,18 +334,11 @@ void RandomOperations::dropReports()
     _machine.pathWatching.beginDropping();
 }
 
-void RandomOperations::askForCancelAndLoad()
-{
-    log("cancel and load");
-    if (cancelAndLoad)
-        cancelAndLoad();
-}
-
 void RandomOperations::askForLoad()
 {
-    log("load");
-    if (load)
-        load();
+    const bool cancelsFirst = !_chance.oneIn(3);
+    log(cancelsFirst ? "cancel and load" : "load");
+    load(cancelsFirst);
 }
 
 void RandomOperations::changePreference()
@@ -463,20 +370,20 @@ void RandomOperations::takeEditor()
 
 void RandomOperations::rewriteFile()
 {
-    const std::string path = anyItem();
+    const std::string path = _places.anyItem();
     const SimulatedDisk::Item* const file = _disk.itemAt(path);
     if (!_mayBeUnseen || !file || file->kind != ItemKind::file)
         return;
     log("rewrite " + path);
     unseen.note(Reason::rewrittenInPlace, path);
-    _disk.writeFile(path, movie());
+    _disk.writeFile(path, _places.movie());
     _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
     _disk.setOpen(path, !_chance.oneIn(4));
 }
 
 void RandomOperations::failFolder()
 {
-    const std::string path = anyFolder();
+    const std::string path = _places.anyFolder();
     if (!_mayBeUnseen || _failing.contains(path))
         return;
     log("fail to list " + path);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "tests/live/RandomPlaces.h"
 #include "tests/live/UnseenChanges.h"
 #include "tests/support/simulated/SimulatedMachine.h"
 
@@ -29,9 +30,8 @@ public:
     void prepare();
     void makeEditor();
 
-    /// What the application of the tree is asked to do, when that is drawn.
-    std::function<void()> cancelAndLoad {};
-    std::function<void()> load {};
+    /// Asks the application of the tree for a load, after a cancel at times.
+    std::function<void(bool cancelsFirst)> load {};
 
     void log(const std::string& line);
     const std::vector<std::string>& lines() const { return _lines; }
@@ -41,22 +41,12 @@ public:
     bool editorWasMissing = false;
 
 private:
-    using Steps = std::vector<std::pair<std::string, std::function<void()>>>;
     struct Operation {
         int weight;
         void (RandomOperations::*perform)();
     };
     static const std::vector<Operation>& operations();
 
-    // Where.
-    std::string library(std::string_view kind);
-    std::string anyFolder();
-    std::string anyItem();
-    std::string newName();
-    std::string freePath();
-    std::string folderOfFiles();
-
-    // What.
     void makeLibrary();
     void makeProject();
     void makeEvent();
@@ -65,15 +55,13 @@ private:
     void renameItem();
     void moveItem();
     void removeItem();
-    void replaceByFile();
-    void replaceByFolder();
+    void replaceItem();
     void makeLink();
     void closeFolder();
     void dateFolder();
     void hideNames();
     void mountOrUnmount();
     void dropReports();
-    void askForCancelAndLoad();
     void askForLoad();
     void changePreference();
     void takeEditor();
@@ -82,13 +70,12 @@ private:
 
     void performSlowly(std::vector<std::function<void()>> steps);
     void writeSlowly(const std::string& path, const std::string& text);
-    std::string movie();
     void diskChanged(const SimulatedDisk::Change& change);
 
     SimulatedMachine& _machine;
     Chance& _chance;
     SimulatedDisk& _disk;
-    std::vector<SimulatedMachine::Volume> _volumes {};
+    RandomPlaces _places;
     std::vector<std::uint64_t> _links {};
     std::set<std::string> _failing {};
     std::vector<std::string> _lines {};

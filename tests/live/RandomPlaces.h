@@ -1,0 +1,43 @@
+#pragma once
+
+#include "tests/support/simulated/SimulatedMachine.h"
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace tests {
+
+/// Where on the disks of a simulated machine something is to happen, drawn from the seed.
+class RandomPlaces {
+public:
+    /// `machine` outlives this object.
+    explicit RandomPlaces(SimulatedMachine& machine)
+        : _chance(machine.chance)
+        , _disk(machine.disk)
+    {
+    }
+
+    /// All there are, mounted or not.
+    std::vector<SimulatedMachine::Volume> volumes {};
+
+    /// A folder called `kind` where libraries may lie, whether or not it exists.
+    std::string library(std::string_view kind);
+    /// A library, a folder in one, or one elsewhere.
+    std::string anyFolder();
+    /// Something in a folder, or at times a whole library.
+    std::string anyItem();
+    /// One of a few, so that names meet again.
+    std::string newName();
+    std::string freePath();
+    /// A folder of movies or clips more often than not.
+    std::string folderOfFiles();
+    /// What a file holds that may be a movie.
+    std::string movie();
+
+private:
+    Chance& _chance;
+    SimulatedDisk& _disk;
+};
+
+} // namespace tests

@@ -21,7 +21,8 @@ constexpr int operationsBetween = 12;
 } // namespace
 
 // OMBRIX_FIRST_SEED and OMBRIX_SEEDS choose others, and how many.
-TEST_CASE("a tree left open equals a fresh load, whatever happened to the disks in between")
+TEST_CASE("a tree left open equals a fresh load, whatever happened to the disks in between"
+    * doctest::skip(!tests::simulatesLocks))
 {
     const std::uint64_t first = numberFromEnvironment("OMBRIX_FIRST_SEED", 1);
     const std::uint64_t count = numberFromEnvironment("OMBRIX_SEEDS", usualSeeds);

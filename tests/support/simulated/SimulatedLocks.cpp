@@ -15,7 +15,7 @@
 #include <dlfcn.h>
 #include <sched.h>
 
-#if !defined(__SANITIZE_THREAD__)
+#if OMBRIX_SIMULATES_LOCKS
 
 namespace {
 

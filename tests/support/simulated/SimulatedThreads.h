@@ -13,7 +13,22 @@
 
 #include <pthread.h>
 
+// The thread sanitizer needs the locks to itself; without them, threads that wait for one another would stop for good.
+#if defined(__SANITIZE_THREAD__)
+#define OMBRIX_SIMULATES_LOCKS 0
+#elif defined(__has_feature)
+#if __has_feature(thread_sanitizer)
+#define OMBRIX_SIMULATES_LOCKS 0
+#endif
+#endif
+#if !defined(OMBRIX_SIMULATES_LOCKS)
+#define OMBRIX_SIMULATES_LOCKS 1
+#endif
+
 namespace tests {
+
+/// Whether simulated threads can wait for one another in this build.
+inline constexpr bool simulatesLocks = OMBRIX_SIMULATES_LOCKS != 0;
 
 /// Threads and time of a simulated machine: threads run one at a time, on real ones that hand over, and time passes
 /// only when none can run. Which one goes on is drawn from the seed, so a seed replays exactly.

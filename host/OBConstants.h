@@ -38,6 +38,9 @@ inline constexpr std::string_view OBMediaObjectResolutionKey = "OBMediaObjectRes
 /// Attribute of a movie: its length in seconds.
 inline constexpr std::string_view OBMediaObjectDurationKey = "OBMediaObjectDurationKey";
 
+/// Attribute of an object that only stands for a movie which is an object itself.
+inline constexpr std::string_view OBMediaObjectRepresentativeKey = "Project Representative";
+
 /// Preferences that the maker's consumer applications share; a change there makes sources read theirs again.
 inline constexpr std::string_view OBZunoPrefsPath = "~/Library/Preferences/org.ombrix.Zuno.plist";
 

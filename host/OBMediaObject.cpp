@@ -220,6 +220,11 @@ Value OBMediaObject::attributeForKey(std::string_view key) const
     return attributeBesideOwn(key);
 }
 
+bool OBMediaObject::isRepresentative() const
+{
+    return !attributeForKey(OBMediaObjectRepresentativeKey).isNull();
+}
+
 Value OBMediaObject::attributeBesideOwn(std::string_view key) const
 {
     const OBMediaObjectKind& kind = _origin.kind();

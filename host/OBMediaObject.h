@@ -124,6 +124,9 @@ public:
     /// All attributes, in the order in which they came.
     platform::Value::Dictionary attributes() const;
 
+    /// Whether it only stands for a movie that is an object itself: it has the attribute that says so.
+    bool isRepresentative() const;
+
     /// Null when none was set.
     OBImageRef icon() const;
     void setIcon(OBImageRef icon);

@@ -54,6 +54,12 @@ public:
     /// Shows `visitor` what the list is made of, in order; batches stay valid while the list lives.
     void visitRuns(OBMediaObjectRunVisitor& visitor) const;
 
+    /// Whether `other` is this very list, or a copy of it; lists made apart are not, whatever they hold.
+    bool isSameAs(const OBMediaObjectList& other) const noexcept
+    {
+        return _count == other._count && (_count == 0 || _sequence == other._sequence);
+    }
+
     /// This list followed by one more object, or by the objects of another list.
     OBMediaObjectList appending(OBMediaObjectRef object) const;
     OBMediaObjectList appending(const OBMediaObjectList& others) const;

@@ -15,15 +15,9 @@
 namespace apps {
 namespace {
 
-    constexpr std::string_view representative = "Project Representative";
     constexpr std::size_t blockSize = 16 * 1024;
 
 } // namespace
-
-bool isRepresentative(const OBMediaObject& object)
-{
-    return !object.attributeForKey(representative).isNull();
-}
 
 NameBlock::NameBlock(const NameQuery& query)
     : _query(query)
@@ -153,7 +147,7 @@ void NameBlock::take(const Owner& owner, std::string_view folded)
         object = owner.batch->objectAtIndex(owner.index);
     else if (owner.object)
         object = owner.object;
-    if (object && isRepresentative(*object))
+    if (object && object->isRepresentative())
         return;
     _mayRepeat |= !owner.isOnlyHere;
     _hits.push_back({ std::move(object), owner.group, owner.position, *match });

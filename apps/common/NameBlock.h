@@ -13,9 +13,6 @@
 
 namespace apps {
 
-/// Whether the object only stands for a movie that is an object itself.
-bool isRepresentative(const OBMediaObject& object);
-
 /// Folded names one after the other, until there are enough of them to be looked through at once. The lists that hold
 /// the objects, and the query, outlive it. One thread at a time.
 class NameBlock {

@@ -228,7 +228,7 @@ std::size_t countOfNames(const OBMediaGroupRef& root, NameKinds kinds)
         if (kinds == NameKinds::groups)
             continue;
         flat.group->ownMediaObjects().visit([&objects](OBMediaObject& object) {
-            if (!isRepresentative(object))
+            if (!object.isRepresentative())
                 objects.insert(&object);
             return true;
         });

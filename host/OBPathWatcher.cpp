@@ -10,6 +10,8 @@
 #include "platform/PathWatching.h"
 
 #include <algorithm>
+#include <atomic>
+#include <cstddef>
 #include <utility>
 
 using platform::Locked;
@@ -46,6 +48,47 @@ std::string textOf(const platform::WatchingProblem& problem)
 }
 
 } // namespace
+
+/// Counts the paths that are to be followed and are not yet. Any thread.
+class PathsToStand {
+public:
+    explicit PathsToStand(std::function<void()> stands)
+        : _stands(std::move(stands))
+    {
+    }
+
+    /// One of them, until it stands or is given up.
+    class One {
+    public:
+        explicit One(std::shared_ptr<PathsToStand> all)
+            : _all(std::move(all))
+        {
+            ++_all->_count;
+        }
+        ~One()
+        {
+            if (!_isStanding)
+                --_all->_count;
+        }
+        One(const One&) = delete;
+        One& operator=(const One&) = delete;
+        void stands()
+        {
+            if (!_isStanding.exchange(true) && --_all->_count == 0 && _all->_stands)
+                _all->_stands();
+        }
+
+    private:
+        const std::shared_ptr<PathsToStand> _all;
+        std::atomic<bool> _isStanding { false };
+    };
+
+    bool isEmpty() const { return _count == 0; }
+
+private:
+    const std::function<void()> _stands;
+    std::atomic<std::size_t> _count { 0 };
+};
 
 OBPathWatcherObserver::~OBPathWatcherObserver() = default;
 
@@ -197,6 +240,8 @@ void OBPathWatcher::follow(const OBFollowOptions& options)
         Locked guard(_lock);
         if (std::exchange(_follows, true))
             return;
+        _options = options;
+        _toStand = std::make_shared<PathsToStand>(options.stands);
         for (auto& [observer, registered] : _registrations) {
             for (WatchedPath& path : registered.paths)
                 startPath(path, *registered.observer);
@@ -208,6 +253,12 @@ void OBPathWatcher::follow(const OBFollowOptions& options)
         if (!problem.empty())
             _core->logOnce(problem, nullptr);
     }
+}
+
+bool OBPathWatcher::pathsStand() const
+{
+    Locked guard(_lock);
+    return !_toStand || _toStand->isEmpty();
 }
 
 /// The lanes stay registered until they are closed, so that whoever takes an observer back meanwhile waits for them too.
@@ -244,11 +295,15 @@ void OBPathWatcher::startPath(WatchedPath& path, OBPathWatcherObserver& observer
         if (const std::string report = pathToReport(change, watched); !report.empty())
             lane->add(report);
     };
-    const auto failed = [core = _core->weak_from_this()](const platform::WatchingProblem& problem) {
-        if (const auto alive = core.lock())
-            alive->logOnce(textOf(problem), nullptr);
-    };
-    path.watch = _core->platform().pathWatching.watch(path.path, path.since, { changed, nullptr, failed });
+    const auto failed
+        = [core = _core->weak_from_this(), tell = _options.failed](const platform::WatchingProblem& problem) {
+              if (const auto alive = core.lock())
+                  alive->logOnce(textOf(problem), nullptr);
+              if (tell)
+                  tell(problem);
+          };
+    const auto stands = [one = std::make_shared<PathsToStand::One>(_toStand)] { one->stands(); };
+    path.watch = _core->platform().pathWatching.watch(path.path, path.since, { changed, stands, failed });
 }
 
 /// Answers what is wrong with the query; empty when it is followed. The log is the application's, and no place to go to

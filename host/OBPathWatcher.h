@@ -18,8 +18,11 @@ class FrameworkCore;
 class OBMetadataQuery;
 class ReportLane;
 
+class PathsToStand;
+
 namespace platform {
 struct Notification;
+struct WatchingProblem;
 }
 
 /// Hears of changes. The calls may come on any thread, two at once for each path and query.
@@ -50,6 +53,11 @@ struct OBFollowOptions {
     /// Observers are called on the main thread, and then none while a load or reload of theirs is at work elsewhere,
     /// which in turn waits for the call. Otherwise they are called on threads of the framework, free to sleep.
     bool callsOnMainThread = false;
+    // Told on threads that must not be kept.
+    /// All paths registered so far are followed, after some were not. Not told of queries.
+    std::function<void()> stands {};
+    /// Why some folders are only looked at now and then.
+    std::function<void(const platform::WatchingProblem&)> failed {};
 };
 
 /// The framework's one watcher of paths and metadata queries. Any thread.
@@ -98,6 +106,9 @@ public:
     void stopFollowing();
     bool callsOnMainThread() const { return _callsOnMainThread; }
 
+    /// Whether each path that is to be followed is by now.
+    bool pathsStand() const;
+
 private:
     struct WatchedPath {
         std::string path;
@@ -128,5 +139,7 @@ private:
     std::atomic<bool> _callsOnMainThread { false };
     mutable platform::Mutex _lock; // never taken while a report is told or delivered
     bool _follows GUARDED_BY(_lock) = false;
+    OBFollowOptions _options GUARDED_BY(_lock);
+    std::shared_ptr<PathsToStand> _toStand GUARDED_BY(_lock);
     AllRegistrations _registrations GUARDED_BY(_lock);
 };

@@ -44,6 +44,7 @@ struct WatchingProblem {
 struct WatchingState {
     std::uint64_t watchedFolders = 0; ///< by the kernel's reports
     std::uint64_t polledFolders = 0; ///< by looking at their change times
+    std::uint64_t overflows = 0; ///< how often reports were lost, after which everything counted as changed
 };
 
 /// Who hears of one watched path. The calls come on the watcher's own threads, one at a time, and must return soon.

@@ -1,5 +1,6 @@
 #include "apps/common/HumanText.h"
 
+#include <algorithm>
 #include <array>
 #include <ctime>
 
@@ -16,6 +17,7 @@ namespace {
         long long year = 0;
         int hour = 0;
         int minute = 0;
+        int second = 0;
 
         bool isSameDayAs(const Day& other) const
         {
@@ -29,7 +31,7 @@ namespace {
         std::tm parts {};
         if (!localtime_r(&seconds, &parts))
             return {};
-        return { parts.tm_mday, parts.tm_mon, parts.tm_year + 1900LL, parts.tm_hour, parts.tm_min };
+        return { parts.tm_mday, parts.tm_mon, parts.tm_year + 1900LL, parts.tm_hour, parts.tm_min, parts.tm_sec };
     }
 
     std::string_view monthName(const Day& day)
@@ -113,6 +115,18 @@ std::string durationText(std::chrono::nanoseconds duration)
     if (duration < minutes(2))
         return std::to_string(duration_cast<seconds>(duration).count()) + " s";
     return std::to_string(duration_cast<minutes>(duration).count()) + " min";
+}
+
+std::string secondsText(std::chrono::nanoseconds duration)
+{
+    const auto count = std::max<std::chrono::nanoseconds::rep>(duration.count(), 0);
+    return withOneDigit(static_cast<std::uint64_t>(count), 1'000'000'000) + " s";
+}
+
+std::string timeText(platform::Date date)
+{
+    const Day day = localDay(date);
+    return twoDigits(day.hour) + ":" + twoDigits(day.minute) + ":" + twoDigits(day.second);
 }
 
 std::string dateText(platform::Date date, platform::Date now)

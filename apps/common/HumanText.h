@@ -21,6 +21,10 @@ std::string unitText(std::uint64_t count, std::string_view unit);
 std::string sizeText(std::uint64_t bytes);
 /// "31 ms", "3 s", "2 min".
 std::string durationText(std::chrono::nanoseconds duration);
+/// "5.0 s", however long.
+std::string secondsText(std::chrono::nanoseconds duration);
+/// "14:02:07".
+std::string timeText(platform::Date date);
 /// "14 Nov 2026"; "today 14:02" on the day of `now`.
 std::string dateText(platform::Date date, platform::Date now);
 /// "3 – 9 Mar 2026", as short as the two days allow; one day alone where they are the same. Without the year where

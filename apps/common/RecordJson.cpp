@@ -97,19 +97,48 @@ namespace {
         writeObjects(writer, group.ownMediaObjects());
     }
 
+    /// A group or object that is named without what is in it.
+    struct NamedRecord {
+        bool isObject;
+        Text name;
+        Text path;
+        Text holder; ///< ID of the group that it lies in
+    };
+
+    void writeRecord(JsonWriter& writer, const NamedRecord& record)
+    {
+        writer.beginObject();
+        writer.plainKey("kind");
+        writer.string(record.isObject ? "object" : "group");
+        writeText(writer, "name", record.name);
+        writeText(writer, "path", record.path);
+        writeText(writer, "group", record.holder);
+        writer.endObject();
+    }
+
     void writeHit(JsonWriter& writer, const FoundNames& found, const NameHit& hit)
     {
         const FlatGroup& place = found.groups[hit.group];
         const OBMediaGroup& group = *place.group;
-        writer.beginObject();
-        writer.key("kind");
-        writer.string(hit.object ? "object" : "group");
-        writeText(writer, "name", hit.object ? hit.object->name() : group.name());
-        writeText(writer, "path", hit.object ? hit.object->path() : group.path());
         const bool isRoot = !hit.object && hit.group == 0;
         const OBMediaGroup& holder = hit.object ? group : *found.groups[place.parent].group;
-        writeText(writer, "group", isRoot ? Text() : holder.ID());
-        writer.endObject();
+        writeRecord(writer,
+            { hit.object != nullptr, hit.object ? hit.object->name() : group.name(),
+                hit.object ? hit.object->path() : group.path(), isRoot ? Text() : holder.ID() });
+    }
+
+    void writeChanges(JsonWriter& writer, std::string_view key, const std::vector<OBTreeChange>& changes)
+    {
+        writer.plainKey(key);
+        writer.beginList();
+        for (const OBTreeChange& change : changes)
+            writeRecord(writer, { change.object != nullptr, change.name, change.path, change.groupID });
+        writer.endList();
+    }
+
+    Text textOrNull(std::string_view text)
+    {
+        return text.empty() ? Text() : Text(text);
     }
 
     /// A group that was begun, and how many of its children were written.
@@ -174,6 +203,19 @@ void printHits(Output& output, const FoundNames& found, std::size_t count)
     for (std::size_t index = 0; index < count; ++index)
         writeHit(document.writer, found, found.hits[index]);
     document.writer.endList();
+}
+
+void printChanges(Output& output, const OBTreeChanges& changes, std::string_view half, std::string_view cause)
+{
+    Document document(output);
+    JsonWriter& writer = document.writer;
+    writer.beginObject();
+    writeText(writer, "half", textOrNull(half));
+    writeChanges(writer, "added", changes.added);
+    writeChanges(writer, "removed", changes.removed);
+    writeChanges(writer, "changed", changes.changed);
+    writeText(writer, "cause", textOrNull(cause));
+    writer.endObject();
 }
 
 void printValue(Output& output, const Value& value)

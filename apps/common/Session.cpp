@@ -5,6 +5,8 @@
 #include "apps/common/Terminal.h"
 
 #include <charconv>
+#include <filesystem>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -32,6 +34,14 @@ namespace {
         printError(name + "[" + std::to_string(level) + "]: " + escapedText(message));
     }
 
+    /// Bundles are read from when something of them is needed, and the working folder may be another one then.
+    std::string absoluteFolder(std::string_view folder)
+    {
+        std::error_code error;
+        const std::filesystem::path absolute = std::filesystem::absolute(folder, error);
+        return error ? std::string(folder) : absolute.string();
+    }
+
     std::vector<std::string> foldersOfPluginPath()
     {
         std::vector<std::string> folders;
@@ -40,7 +50,7 @@ namespace {
             const std::string_view folder = rest.substr(0, rest.find(':'));
             rest.remove_prefix(std::min(rest.size(), folder.size() + 1));
             if (!folder.empty())
-                folders.emplace_back(folder);
+                folders.push_back(absoluteFolder(folder));
         }
         return folders;
     }

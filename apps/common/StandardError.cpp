@@ -115,6 +115,22 @@ void eraseProgressOnSignals()
         handle(signal);
 }
 
+bool waitForEndingSignal()
+{
+    sigset_t awaited;
+    sigemptyset(&awaited);
+    bool isAnyAwaited = false;
+    for (const int signal : endingSignals) {
+        struct sigaction action { };
+        if (::sigaction(signal, nullptr, &action) != 0 || action.sa_handler == SIG_IGN)
+            continue;
+        sigaddset(&awaited, signal);
+        isAnyAwaited = true;
+    }
+    int signal = 0;
+    return isAnyAwaited && ::sigwait(&awaited, &signal) == 0;
+}
+
 EndingSignalsHeld::EndingSignalsHeld()
 {
     sigset_t held;

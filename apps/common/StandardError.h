@@ -35,4 +35,8 @@ private:
     sigset_t _before {};
 };
 
+/// Waits for one of those signals, and takes it; every thread has to hold them. False, at once, when all of them are
+/// ignored.
+bool waitForEndingSignal();
+
 } // namespace apps

@@ -19,4 +19,10 @@ std::optional<std::string> absolutePath(const std::string& path)
     return std::string(platform::pathWithoutTrailingSlashes(normal));
 }
 
+void leaveWorkingFolder()
+{
+    std::error_code ignored;
+    std::filesystem::current_path("/", ignored);
+}
+
 } // namespace ombrix

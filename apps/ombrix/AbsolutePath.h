@@ -13,4 +13,8 @@ std::optional<std::string> absolutePath(const std::string& path);
 /// Why there is none.
 inline constexpr std::string_view noCurrentFolder = "it is relative, and there is no current folder";
 
+/// Makes / the working folder, so that no volume is held by a program that runs for long. Relative paths lead elsewhere
+/// from then on.
+void leaveWorkingFolder();
+
 } // namespace ombrix

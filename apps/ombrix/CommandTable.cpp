@@ -94,6 +94,16 @@ namespace {
         { "ombrix info --json | jq .canLoadData", "whether a tree can be loaded" },
     };
 
+    constexpr OptionInfo watchOptions[] {
+        { "--json", "", "", "print the whole tree each time, one JSON document a line" },
+        { "--changes", "", "", "print the tree, then one JSON document a change" },
+        { "--for", "", "SECONDS", "end when so long has passed since the tree was printed" },
+    };
+    constexpr Example watchExamples[] {
+        { "ombrix watch", "a line whenever something comes or goes" },
+        { "ombrix watch --changes | jq -c '.added[]?.path'", "what comes, for a program" },
+    };
+
     constexpr OptionInfo explainOptions[] {
         { "-0", "", "", "read paths ended by zero bytes from standard input" },
         { "--json", "", "", "print one JSON document a path, one a line" },
@@ -155,6 +165,11 @@ namespace {
             pathsOptions, true, pathsExamples, runPaths },
         { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
             "Prints what is known of the source without loading its tree.", infoOptions, true, infoExamples, runInfo },
+        { "watch", Intent::follow, "", 0, "print the tree's changes as they happen",
+            "Loads, then tells what comes, goes and changes, about 5 seconds after it did, and\n"
+            "why, until it is interrupted. Holds no disk: each can be unmounted meanwhile.\n"
+            "A document of --changes is {\"half\", \"added\", \"removed\", \"changed\", \"cause\"}.",
+            watchOptions, true, watchExamples, runWatch },
         { "menu", Intent::act, "", 0, "show what is offered for a movie or a group",
             "Loads once and prints the context menu: its title, then an item a line with its\n"
             "action. Prints \"null\" where there is no such movie or group.",

@@ -25,7 +25,7 @@ struct Example {
 };
 
 /// What a command is for; help lists the commands by it.
-enum class Intent { look, act, ask };
+enum class Intent { look, follow, act, ask };
 
 /// One command. Parsing, help and suggestions know nothing of it but this.
 struct CommandInfo {

@@ -15,6 +15,7 @@ int runInfo(Program& program);
 int runExplain(Program& program);
 int runMessage(Program& program);
 int runPlugins(Program& program);
+int runWatch(Program& program);
 int runQuery(Program& program);
 int runDiskFormat(Program& program);
 int runMenu(Program& program);

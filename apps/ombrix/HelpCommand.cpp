@@ -60,9 +60,10 @@ namespace {
 
 std::string helpText()
 {
-    std::string text = "Show and explain the media tree of your video editor.\n\n"
+    std::string text = "Show, follow and explain the media tree of your video editor.\n\n"
                        "  ombrix [OPTION...] COMMAND [ARGUMENT...]\n\n";
     text += listed("Look\n", Intent::look);
+    text += listed("Follow\n", Intent::follow);
     text += listed("Act\n", Intent::act);
     text += listed("Ask\n", Intent::ask);
     text += "Options, before or after the command\n";

@@ -135,28 +135,36 @@ const OBMediaManagerClass* Program::managerClass()
     return managerClass;
 }
 
+std::shared_ptr<OBMediaManager> Program::loadableManager()
+{
+    std::shared_ptr<OBMediaManager> source = manager();
+    if (!source || source->canLoadData())
+        return source;
+    failLoad(*source, OBLoadOutcome::unavailable);
+    return nullptr;
+}
+
+int Program::failLoad(OBMediaManager& manager, OBLoadOutcome outcome) const
+{
+    if (outcome != OBLoadOutcome::unavailable)
+        return fail(manager.displayName(), "the load ended without a tree");
+    const auto [place, what] = whyNothingLoads(manager);
+    return fail(place, what);
+}
+
 OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
 {
-    const std::shared_ptr<OBMediaManager> source = manager();
+    const std::shared_ptr<OBMediaManager> source = loadableManager();
     if (!source)
         return nullptr;
-    if (!source->canLoadData()) {
-        const auto [place, what] = whyNothingLoads(*source);
-        fail(place, what);
-        return nullptr;
-    }
     if (observer)
         source->setScanObserver(observer);
     const apps::TreeLoad load = apps::loadTree(source);
     _loadDuration = load.duration;
-    if (load.result.outcome == OBLoadOutcome::unavailable) {
-        const auto [place, what] = whyNothingLoads(*source);
-        fail(place, what);
-        return nullptr;
-    }
-    if (!load.result.rootMediaGroup)
-        fail(source->displayName(), "the load ended without a tree");
-    return load.result.rootMediaGroup;
+    if (load.result.outcome != OBLoadOutcome::unavailable && load.result.rootMediaGroup)
+        return load.result.rootMediaGroup;
+    failLoad(*source, load.result.outcome);
+    return nullptr;
 }
 
 Program::GroupAnswer Program::loadGroupOfOption()

@@ -12,6 +12,8 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
+#include <vector>
 
 namespace ombrix {
 
@@ -53,8 +55,12 @@ public:
     std::shared_ptr<OBMediaManager> manager();
     /// The source's class, without a manager; null after having said why.
     const OBMediaManagerClass* managerClass();
+    /// The source's manager, which can load now; null after having said why.
+    std::shared_ptr<OBMediaManager> loadableManager();
     /// Loads the tree once, with `observer` told what the scan decides; null after having said why there is none.
     OBMediaGroupRef load(const std::shared_ptr<OBScanObserver>& observer = nullptr);
+    /// Says why a load by `manager` gave no tree; answers the exit status.
+    int failLoad(OBMediaManager& manager, OBLoadOutcome outcome) const;
     /// Where `load` has been: how long it took.
     std::chrono::nanoseconds loadDuration() const { return _loadDuration; }
     /// A group, or the exit status after having said why there is none.
@@ -71,6 +77,9 @@ public:
     /// Warns likewise of these folders.
     void warnOfUnreadFolders(const std::vector<OBLoadProblem>& folders) const;
 
+    /// Keeps what threads may still use when the program ends: nothing is torn down then.
+    void keep(std::shared_ptr<void> used) { _kept.push_back(std::move(used)); }
+
     /// Hands out what was printed; answers `status`, or that of a failed write, having said so.
     int finish(int status);
 
@@ -80,6 +89,7 @@ private:
     const apps::Style _style;
     std::unique_ptr<apps::Session> _session;
     std::chrono::nanoseconds _loadDuration {};
+    std::vector<std::shared_ptr<void>> _kept;
 };
 
 } // namespace ombrix

@@ -67,7 +67,7 @@ bool LinuxPathWatching::startThread()
 
 WatchingState LinuxPathWatching::state() const
 {
-    return { _counts->watchedFolders, _counts->polledFolders };
+    return { _counts->watchedFolders, _counts->polledFolders, _counts->overflows };
 }
 
 std::unique_ptr<PathWatching> LinuxPathWatching::withPathsOf(const FileSystem& files, const Volumes& volumes) const

@@ -107,6 +107,7 @@ void PathWatcher::takeEvents()
 // Reports were lost. All that have come up to now tell of what a look sees anyway.
 void PathWatcher::resynchronise()
 {
+    ++_counts->overflows;
     _context.inotify.discardEvents();
     _events.forget();
     _placing.followAllAnew();

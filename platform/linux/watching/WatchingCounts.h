@@ -38,6 +38,7 @@ private:
 struct WatchingCounts {
     std::atomic<std::uint64_t> watchedFolders { 0 };
     std::atomic<std::uint64_t> polledFolders { 0 };
+    std::atomic<std::uint64_t> overflows { 0 };
     ThreadCount threads {}; ///< that use the roles which the watching was given
 };
 

@@ -176,6 +176,7 @@ TEST_CASE("when reports are lost everything is looked at again, and everything c
     overflown.raise();
     CHECK(listener.hears("anythingChanged ."));
     CHECK(other.hears("anythingChanged ."));
+    CHECK(machine.watching.state().overflows == 1);
     machine.disk.file("a/later/inner/file");
     CHECK(listener.hears("appeared later/inner/file"));
     CHECK(other.hears("appeared inner/file"));

@@ -119,7 +119,11 @@ namespace {
         { "ombrix message --group \"$HOME/Movies/Montaro Projects/Trip\"", "why a project is" },
     };
 
-    constexpr OptionInfo queryOptions[] { zero, json };
+    constexpr OptionInfo queryOptions[] {
+        { "--live", "", "", "then +path and -path as files come and go", false, false, "--json" },
+        zero,
+        json,
+    };
     constexpr Example queryExamples[] {
         { "ombrix query \"kMDItemFSName = '*trip*'cd\" ~/Movies", "names with \"trip\", or \"Tríp\"" },
         { "ombrix query 'kMDItemPixelWidth >= 3840' ~ -0 | xargs -0 ls -l", "wide movies" },
@@ -166,8 +170,8 @@ namespace {
         { "info", Intent::look, "", 0, "show the source, its editor and its preferences",
             "Prints what is known of the source without loading its tree.", infoOptions, true, infoExamples, runInfo },
         { "watch", Intent::follow, "", 0, "print the tree's changes as they happen",
-            "Loads, then tells what comes, goes and changes, about 5 seconds after it did, and\n"
-            "why, until it is interrupted. Holds no disk: each can be unmounted meanwhile.\n"
+            "Loads, then tells what comes, goes and changes, about 5 seconds after it did,\n"
+            "and why, until it is interrupted. Every disk can be unmounted meanwhile.\n"
             "A document of --changes is {\"half\", \"added\", \"removed\", \"changed\", \"cause\"}.",
             watchOptions, true, watchExamples, runWatch },
         { "menu", Intent::act, "", 0, "show what is offered for a movie or a group",
@@ -198,7 +202,8 @@ namespace {
             messageOptions, true, messageExamples, runMessage },
         { "query", Intent::ask, "EXPRESSION SCOPE...", anyNumber, "find files by their attributes",
             "Prints every plain file at or below a SCOPE that EXPRESSION matches, hidden ones\n"
-            "too; links below it are not followed. EXPRESSION is made of comparisons with\n"
+            "too; links below it are not followed. With --live goes on until interrupted.\n"
+            "EXPRESSION is made of comparisons with\n"
             "&& || ! and parentheses. A comparison is an attribute, then = == != < > <= or\n"
             ">=, then a value.\n\n"
             "Texts       kMDItemFSName kMDItemPath kMDItemContentType, only = == !=\n"

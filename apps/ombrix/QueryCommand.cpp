@@ -6,8 +6,10 @@
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/ProblemText.h"
 #include "apps/ombrix/Program.h"
+#include "apps/ombrix/WatchText.h"
 #include "host/OBMetadataQuery.h"
 #include "platform/Clock.h"
+#include "platform/MainRunLoop.h"
 #include "platform/PathText.h"
 #include "platform/ThreadSafety.h"
 
@@ -189,6 +191,87 @@ namespace {
         return status;
     }
 
+    /// Prints what a live query answers: what is there first, then what comes and goes. The calls come one at a time.
+    class LiveAnswers {
+    public:
+        explicit LiveAnswers(Program& program)
+            : _program(program)
+            , _platform(program.session()->platform())
+            , _handedOut(_platform.clock.monotonic())
+        {
+        }
+
+        void found(std::string_view path)
+        {
+            print({}, path);
+            const std::chrono::nanoseconds now = _platform.clock.monotonic();
+            if (now - _handedOut < untilHandedOut)
+                return;
+            _handedOut = now;
+            handOut();
+        }
+        void gathered()
+        {
+            _isGathered = true;
+            for (const auto& [sign, path] : std::exchange(_waiting, {}))
+                print(sign, path);
+            handOut();
+        }
+        /// A scope that has been gathered already may change while another is being gathered.
+        void changed(std::string_view sign, std::string_view path)
+        {
+            if (!_isGathered) {
+                _waiting.emplace_back(sign, path);
+                return;
+            }
+            print(sign, path);
+            handOut();
+        }
+
+    private:
+        void print(std::string_view sign, std::string_view path)
+        {
+            _program.output().write(sign);
+            if (_program.arguments().has("-0"))
+                return _program.printPath(path);
+            const apps::Style& style = _program.style();
+            _program.printLine(style.plain(style.name(path), path));
+        }
+        void handOut()
+        {
+            _program.output().flush();
+            if (!_program.output().problem().empty())
+                _platform.mainRunLoop.quit();
+        }
+
+        Program& _program;
+        const platform::Platform& _platform;
+        std::chrono::nanoseconds _handedOut;
+        bool _isGathered = false;
+        std::vector<std::pair<std::string_view, std::string>> _waiting {};
+    };
+
+    /// Until it is interrupted, or nobody takes the answers.
+    int answerLive(Program& program, const Wishes& wishes)
+    {
+        leaveWorkingFolder();
+        std::vector<std::string> scope;
+        for (const Scope& one : wishes.scopes)
+            scope.emplace_back(platform::pathWithoutTrailingSlashes(one.path));
+        const auto answers = std::make_shared<LiveAnswers>(program);
+        const OBLiveQueryHandlers handlers {
+            .found = [answers](std::string_view path) { answers->found(path); },
+            .gathered = [answers] { answers->gathered(); },
+            .came = [answers](std::string_view path) { answers->changed("+", path); },
+            .went = [answers](std::string_view path) { answers->changed("-", path); },
+            .failed = [&program](const platform::WatchingProblem& problem) { program.warn(pollingText(problem)); },
+        };
+        OBMediaHost& host = program.session()->host();
+        program.keep(std::make_shared<OBObservation>(host.followQuery(wishes.query, scope, handlers)));
+        program.session()->platform().mainRunLoop.run();
+        return done;
+    }
+
 } // namespace
 
 int runQuery(Program& program)
@@ -198,7 +281,9 @@ int runQuery(Program& program)
         return program.failUsage("query: " + wishes.problem);
     if (const int status = makeAbsolute(program, wishes.scopes); status != done)
         return status;
-    return program.session() ? answerOnce(program, wishes) : failed;
+    if (!program.session())
+        return failed;
+    return program.arguments().has("--live") ? answerLive(program, wishes) : answerOnce(program, wishes);
 }
 
 } // namespace ombrix

@@ -7,6 +7,8 @@
 #include "host/OBConstants.h"
 #include "host/OBSourceInspection.h"
 #include "platform/Clock.h"
+#include "platform/FileSystem.h"
+#include "platform/PathText.h"
 #include "platform/PathWatching.h"
 #include "platform/Threads.h"
 
@@ -167,14 +169,15 @@ void WatchOutput::begin(const Shown& first)
     _handlers.began();
 }
 
-/// What the source watches beside folders is what its order is read from, or may be.
+/// The source need not watch what its order is read from, and the file need not exist yet: their folder is watched.
 void WatchOutput::watchPreferences()
 {
-    OBPathWatcher& watcher = _program.session()->host().pathWatcher();
-    for (const std::string& path : watcher.pathsWatchedBy(_manager.get())) {
-        if (path.ends_with(".plist"))
-            watcher.watchPath_observer(path, this);
-    }
+    const auto home = _platform.fileSystem.homeFolder();
+    if (!home || _form != WatchForm::lines)
+        return;
+    const std::string preferences = *home + std::string(OBZunoPrefsPath.substr(1));
+    _program.session()->host().pathWatcher().watchPath_observer(
+        platform::pathByRemovingLastComponent(preferences), this);
 }
 
 void WatchOutput::goOn(const Shown& next)

@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <filesystem>
 #include <string_view>
 
 #include <fcntl.h>
@@ -206,6 +207,56 @@ ProgramRun runWithErrorsOnTerminal(const RunWishes& wishes, const TerminalWishes
     ::close(output.ends[0]);
     run.errors = withoutReturns(run.errors);
     return run;
+}
+
+RunningProgram::RunningProgram(const RunWishes& wishes)
+{
+    const Pipe output;
+    const Pipe errors;
+    _child = start(wishes, "dumb", { output.ends[1], errors.ends[1] });
+    ::close(output.ends[1]);
+    ::close(errors.ends[1]);
+    _output = output.ends[0];
+    _errors = errors.ends[0];
+}
+
+RunningProgram::~RunningProgram()
+{
+    if (_child >= 0)
+        end(SIGKILL);
+}
+
+bool RunningProgram::prints(const std::string& text)
+{
+    while (_run.output.find(text) == std::string::npos) {
+        pollfd side { _output, POLLIN, 0 };
+        if (::poll(&side, 1, longestWait) <= 0 || !readSome(_output, _run.output))
+            return false;
+    }
+    return true;
+}
+
+std::string RunningProgram::workingFolder() const
+{
+    return std::filesystem::read_symlink("/proc/" + std::to_string(_child) + "/cwd").string();
+}
+
+void RunningProgram::stopReading()
+{
+    ::close(std::exchange(_output, -1));
+}
+
+ProgramRun RunningProgram::end(int signal)
+{
+    if (signal != 0)
+        ::kill(_child, signal);
+    readAll(_run, { _output, _errors }, _child, {});
+    _run.status = statusOf(std::exchange(_child, -1));
+    for (const int descriptor : { _output, _errors }) {
+        if (descriptor >= 0)
+            ::close(descriptor);
+    }
+    return _run;
 }
 
 } // namespace tests

@@ -43,4 +43,30 @@ ProgramRun runOnTerminal(const RunWishes& wishes, const TerminalWishes& terminal
 /// The same with standard output at a pipe, into `output`; `errors` is what the terminal got.
 ProgramRun runWithErrorsOnTerminal(const RunWishes& wishes, const TerminalWishes& terminal);
 
+/// A run of the program with pipes that goes on until the test ends it.
+class RunningProgram {
+public:
+    explicit RunningProgram(const RunWishes& wishes);
+    /// Kills it where it still runs.
+    ~RunningProgram();
+    RunningProgram(const RunningProgram&) = delete;
+    RunningProgram& operator=(const RunningProgram&) = delete;
+
+    /// Reads until standard output holds `text`; false when it has ended, or printed nothing for long, before that.
+    bool prints(const std::string& text);
+    /// What it has printed so far, as far as it was read.
+    const std::string& output() const { return _run.output; }
+    std::string workingFolder() const;
+    /// Closes the reading end of its standard output.
+    void stopReading();
+    /// Sends a signal, none for 0, and waits for the end.
+    ProgramRun end(int signal);
+
+private:
+    int _child = -1;
+    int _output = -1;
+    int _errors = -1;
+    ProgramRun _run;
+};
+
 } // namespace tests

@@ -129,6 +129,46 @@ TEST_CASE("a query ends by the signal when nobody reads it, and fails when its o
     CHECK(full.errors.find("ombrix: standard output: ") == 0);
 }
 
+TEST_CASE("a live query prints what is there, then what comes and goes, at once, until a signal ends it")
+{
+    const TemporaryFolder folder;
+    const std::string first = folder.file("a/one.mov");
+    RunningProgram program({ { "query", "--live", movies, folder.path("a"), folder.path("later") } });
+    REQUIRE(program.prints(first + "\n"));
+    const std::string second = folder.file("a/two.mov");
+    REQUIRE(program.prints("+" + second + "\n"));
+    const std::string third = folder.file("later/below/three.mov");
+    REQUIRE(program.prints("+" + third + "\n"));
+    std::filesystem::remove(first);
+    REQUIRE(program.prints("-" + first + "\n"));
+    CHECK(program.workingFolder() == "/");
+    const ProgramRun run = program.end(SIGTERM);
+    CHECK(run.status == 128 + SIGTERM);
+    CHECK(run.errors.empty());
+    CHECK(run.output == first + "\n+" + second + "\n+" + third + "\n-" + first + "\n");
+}
+
+TEST_CASE("paths of a live query can be ended by zero bytes, and it has no one document")
+{
+    const TemporaryFolder folder;
+    const std::string first = folder.file("a/one.mov");
+    const std::string zero(1, '\0');
+    RunningProgram program({ { "query", "--live", "-0", movies, folder.path("a") } });
+    REQUIRE(program.prints(first + zero));
+    const std::string second = folder.file("a/t\nwo.mov");
+    CHECK(program.prints("+" + second + zero));
+    CHECK(query({ "--live", "--json", movies, folder.path() }).status == 2);
+}
+
+TEST_CASE("a live query fails when its output cannot be written")
+{
+    const TemporaryFolder folder;
+    folder.file("a.mov");
+    const ProgramRun full = runProgram({ { "query", "--live", movies, folder.path() }, {}, "/dev/full" });
+    CHECK(full.status == 1);
+    CHECK(full.errors.find("ombrix: standard output: ") == 0);
+}
+
 TEST_CASE("a disk's format is told by the file system that holds a path, and a path that does not exist has none")
 {
     const TemporaryFolder folder;

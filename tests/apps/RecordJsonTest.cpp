@@ -105,3 +105,19 @@ TEST_CASE("a tree of five thousand levels is printed whole")
     CHECK(count == 5001);
     CHECK(text.substr(text.size() - 5) == "]}]}\n");
 }
+
+TEST_CASE("changes are printed like hits of a search, with the half and the cause, null where there is none")
+{
+    OBTreeChanges changes;
+    CHECK(printed([&](apps::Output& output) { apps::printChanges(output, changes, "", ""); })
+        == "{\"half\":null,\"added\":[],\"removed\":[],\"changed\":[],\"cause\":null}\n");
+    changes.added.push_back(
+        { nullptr, OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "clip"), "clip", "/a/clip.mov", {}, "/a" });
+    changes.removed.push_back({ OBMediaGroup::initWithTypeIdentifier(nullptr), nullptr, "2011", {}, "2011", "Events" });
+    changes.changed.push_back({ OBMediaGroup::initWithTypeIdentifier(nullptr), nullptr, "root", {}, "root", {} });
+    CHECK(printed([&](apps::Output& output) { apps::printChanges(output, changes, "events", "changed: /a"); })
+        == "{\"half\":\"events\",\"added\":[{\"kind\":\"object\",\"name\":\"clip\",\"path\":\"/a/clip.mov\","
+           "\"group\":\"/a\"}],\"removed\":[{\"kind\":\"group\",\"name\":\"2011\",\"path\":null,"
+           "\"group\":\"Events\"}],\"changed\":[{\"kind\":\"group\",\"name\":\"root\",\"path\":null,\"group\":null}],"
+           "\"cause\":\"changed: /a\"}\n");
+}

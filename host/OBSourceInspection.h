@@ -14,6 +14,8 @@ public:
     virtual std::vector<std::string> eventSearchPaths() = 0;
     /// Whether the newest events come first; absent where the source has no such order.
     virtual std::optional<bool> mostRecentEventFirst() const = 0;
+    /// The preferences domains that are read.
+    virtual std::vector<std::string> preferencesDomains() const { return {}; }
     virtual std::optional<double> pluginVersionNumber() const = 0;
     virtual std::optional<std::string> pluginVersionString() const = 0;
 };

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -47,6 +48,26 @@ struct WatchingState {
     std::uint64_t overflows = 0; ///< how often reports were lost, after which everything counted as changed
 };
 
+/// By what changes at and below a path are noticed.
+enum class FollowingMeans : std::uint8_t {
+    nothing, ///< they are not
+    reports, ///< the kernel's own
+    looking, ///< looking at its folders in intervals
+};
+
+/// One thing of which the kernel gives a user's programs only so many.
+struct WatchingLimit {
+    std::uint64_t inUse = 0; ///< by all programs of this user
+    std::uint64_t allowed = 0;
+    std::string remedy {}; ///< the command that raises it far enough
+};
+
+/// What the kernel's reports cost of what it gives.
+struct WatchingLimits {
+    WatchingLimit watches {}; ///< one a folder
+    WatchingLimit instances {}; ///< one a program, or a few
+};
+
 /// Who hears of one watched path. The calls come on the watcher's own threads, one at a time, and must return soon.
 struct PathWatchHandlers {
     std::function<void(const PathChange&)> changed;
@@ -73,6 +94,22 @@ public:
     virtual std::shared_ptr<void> watch(std::string_view path, Date since, PathWatchHandlers handlers) = 0;
 
     virtual WatchingState state() const = 0;
+
+    /// By what `path` would be followed now, limits aside. Touches no disk on which it would only be looked at; may
+    /// block while another does not answer.
+    virtual FollowingMeans meansOfFollowing(std::string_view path) const
+    {
+        static_cast<void>(path);
+        return FollowingMeans::nothing;
+    }
+
+    /// The limits on the kernel's reports, with commands that leave room for `furtherWatches` more; absent where there
+    /// are none.
+    virtual std::optional<WatchingLimits> limits(std::uint64_t furtherWatches) const
+    {
+        static_cast<void>(furtherWatches);
+        return std::nullopt;
+    }
 
     /// The same machine watched by the paths of `files`, for a machine laid over this one. Both arguments outlive the
     /// answer.

@@ -27,6 +27,10 @@ public:
     /// `Icon`, looked up as the Icon Theme specification says. Absent when it has none.
     virtual std::optional<std::string> applicationIconFile(std::string_view applicationPath) const = 0;
 
+    /// The folder in which the desktop keeps its user's videos, absolute, whether or not it exists. Absent where the
+    /// desktop has none of its own (xdg-user-dirs).
+    virtual std::optional<std::string> videosFolder() const { return std::nullopt; }
+
     // Handing something to the desktop. Each answers at once; what became of it goes to the observer.
 
     /// Starts the application registered under `identifier` as its desktop entry says, so that it outlives this process.

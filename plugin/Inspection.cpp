@@ -4,6 +4,8 @@
 #include "plugin/OBMontaroPlugin.h"
 #include "plugin/SearchFolders.h"
 
+#include "host/OBConstants.h"
+
 using platform::Text;
 
 OBSourceInspection* OBMontaroPlugin::inspection()
@@ -27,6 +29,11 @@ std::vector<std::string> OBMontaroPlugin::eventSearchPaths()
 std::optional<bool> OBMontaroPlugin::mostRecentEventFirst() const
 {
     return _mostRecentEventFirst;
+}
+
+std::vector<std::string> OBMontaroPlugin::preferencesDomains() const
+{
+    return { MontaroBundleIdentifier, std::string(OBHostPreferencesDomain) };
 }
 
 std::optional<double> OBMontaroPlugin::pluginVersionNumber() const

@@ -168,6 +168,7 @@ private:
     std::vector<std::string> projectSearchPaths() override;
     std::vector<std::string> eventSearchPaths() override;
     std::optional<bool> mostRecentEventFirst() const override;
+    std::vector<std::string> preferencesDomains() const override;
     std::optional<double> pluginVersionNumber() const override;
     std::optional<std::string> pluginVersionString() const override;
 

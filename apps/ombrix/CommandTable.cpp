@@ -134,6 +134,21 @@ namespace {
         { "ombrix disk-format ~/Movies", "false for a folder that does not exist, too" },
     };
 
+    constexpr OptionInfo verifyOptions[] {
+        { "--for", "", "SECONDS", "compare after so long; else when interrupted" },
+        json,
+    };
+    constexpr Example verifyExamples[] {
+        { "ombrix verify --for 3600", "follow changes for an hour, then compare" },
+        { "ombrix verify --for 0 --json | jq .equal", "whether two loads agree" },
+    };
+
+    constexpr OptionInfo doctorOptions[] { json };
+    constexpr Example doctorExamples[] {
+        { "ombrix doctor", "what is wrong, and the command that mends it" },
+        { "ombrix doctor --json | jq -r '.findings[].remedy // empty'", "only those commands" },
+    };
+
     constexpr OptionInfo pluginsOptions[] { json };
     constexpr Example pluginsExamples[] {
         { "ombrix plugins", "what was found, and what was refused and why" },
@@ -217,12 +232,25 @@ namespace {
         { "disk-format", Intent::ask, "PATH", 1, "say whether a disk is fit to hold libraries",
             "Prints \"true\" or \"false\", by the file system of the disk that PATH lies on.", {}, true,
             diskFormatExamples, runDiskFormat },
+        { "verify", Intent::ask, "", 0, "check that the followed tree equals one loaded afresh",
+            "Loads, follows changes for as long as told, waits until what was heard has been\n"
+            "taken in, and compares the tree with that of a process of its own. Exit status\n"
+            "0 when they are equal, else 1. What a followed tree cannot know is a note.",
+            verifyOptions, true, verifyExamples, runVerify },
+        { "doctor", Intent::ask, "", 0, "find what keeps the tree from being right, and its cure",
+            "Looks at the editor, the folders and disks that are searched, how they can be\n"
+            "followed, and the preferences. Changes nothing. A disk gets 2 seconds to answer.\n"
+            "Exit status 1 when a finding is a failure.",
+            doctorOptions, true, doctorExamples, runDoctor },
         { "plugins", Intent::ask, "", 0, "list the plug-ins, and why one is refused",
             "Loads every bundle that is found to see whether it works.", pluginsOptions, false, pluginsExamples,
             runPlugins },
         { "help", Intent::ask, "[COMMAND]", 1, "explain a command", "The same as \"ombrix COMMAND --help\".", {}, false,
             helpExamples, runHelp },
     };
+
+    /// Typed by the program alone.
+    constexpr CommandInfo answer { "answer", Intent::ask, "QUESTION...", anyNumber, "", "", {}, true, {}, runAnswer };
 
 } // namespace
 
@@ -237,7 +265,7 @@ const CommandInfo* commandNamed(std::string_view name)
         if (command.name == name)
             return &command;
     }
-    return nullptr;
+    return name == answer.name ? &answer : nullptr;
 }
 
 std::span<const OptionInfo> globalOptions()

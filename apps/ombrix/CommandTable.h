@@ -42,7 +42,7 @@ struct CommandInfo {
 };
 
 std::span<const CommandInfo> commands();
-/// Null when there is no such command.
+/// Null when there is no such command. Finds also what the program asks of itself, which is listed nowhere.
 const CommandInfo* commandNamed(std::string_view name);
 /// Those that every command takes, before or after its name.
 std::span<const OptionInfo> globalOptions();

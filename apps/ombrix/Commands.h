@@ -22,6 +22,10 @@ int runMenu(Program& program);
 int runOpen(Program& program);
 int runReveal(Program& program);
 int runExport(Program& program);
+int runDoctor(Program& program);
+int runVerify(Program& program);
 int runHelp(Program& program);
+/// Answers a question about a disk for another run of the program, which goes on without it when the disk is silent.
+int runAnswer(Program& program);
 
 } // namespace ombrix

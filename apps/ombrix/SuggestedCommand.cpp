@@ -19,4 +19,12 @@ std::string suggestedCommand(const Arguments& arguments, std::string_view comman
     return text;
 }
 
+std::vector<std::string> machineArguments(const Arguments& arguments)
+{
+    std::vector<std::string> words { "--source", arguments.source };
+    if (arguments.machineFile)
+        words.insert(words.end(), { "--machine", *arguments.machineFile });
+    return words;
+}
+
 } // namespace ombrix

@@ -105,6 +105,8 @@ std::string TextLine::drawn(const Piece& piece) const
         return _style.dim(piece.laidOut);
     case Look::warning:
         return _style.warning(piece.laidOut);
+    case Look::failure:
+        return _style.failure(piece.laidOut);
     case Look::plain:
         break;
     }

@@ -14,7 +14,7 @@ namespace ombrix {
 /// terminal, which has only so many columns, it is cut so that the line stays one line.
 class TextLine {
 public:
-    enum class Look { plain, bold, dim, warning };
+    enum class Look { plain, bold, dim, warning, failure };
 
     TextLine(const apps::Style& style, std::optional<int> columns)
         : _style(style)

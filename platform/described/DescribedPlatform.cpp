@@ -9,6 +9,7 @@
 #include "platform/common/FilePreferences.h"
 #include "platform/common/LexicalPath.h"
 #include "platform/common/LinkedFileSystem.h"
+#include "platform/common/UserFolders.h"
 #include "platform/common/WholeFile.h"
 #include "platform/described/DescribedVolumes.h"
 
@@ -33,7 +34,8 @@ namespace {
         const std::optional<std::string> _home;
     };
 
-    /// Knows one application at most, and no icon; what is handed to the desktop goes to the real one.
+    /// Knows one application at most, and no icon; what is handed to the desktop goes to the real one. The environment is
+    /// that of another machine, so the settings are those in the home folder.
     class DescribedWorkspace : public Workspace {
     public:
         DescribedWorkspace(std::optional<std::string> editorPath, const FileSystem& files, Workspace& desktop)
@@ -47,6 +49,11 @@ namespace {
             return identifier == describedEditorIdentifier ? _editorPath : std::nullopt;
         }
         std::optional<std::string> applicationIconFile(std::string_view) const override { return std::nullopt; }
+        std::optional<std::string> videosFolder() const override
+        {
+            const std::optional<std::string> home = _files.homeFolder();
+            return home ? userFolder(_files, pathJoined(*home, ".config"), "XDG_VIDEOS_DIR") : std::nullopt;
+        }
         void launchApplication(std::string_view identifier) override
         {
             launchProgram(applicationPath(identifier).value_or(std::string()));

@@ -4,6 +4,7 @@
 #include "platform/FileUri.h"
 #include "platform/PathText.h"
 #include "platform/Threads.h"
+#include "platform/common/UserFolders.h"
 #include "platform/formats/DesktopEntry.h"
 #include "platform/linux/DataFolders.h"
 #include "platform/linux/DetachedProgram.h"
@@ -174,6 +175,12 @@ void LinuxWorkspace::remember(std::string_view identifier) const
     if (_identifiers.size() == identifiersAtMost)
         _identifiers.erase(_identifiers.begin());
     _identifiers.emplace_back(identifier);
+}
+
+std::optional<std::string> LinuxWorkspace::videosFolder() const
+{
+    const std::vector<std::string> settings = settingsFolders(_files);
+    return settings.empty() ? std::nullopt : userFolder(_files, settings.front(), "XDG_VIDEOS_DIR");
 }
 
 void LinuxWorkspace::launchApplication(std::string_view identifier)

@@ -23,6 +23,7 @@ public:
     std::optional<std::string> applicationPath(std::string_view identifier) const override EXCLUDES(_lock);
     /// Knows the applications that `applicationPath` has been asked for.
     std::optional<std::string> applicationIconFile(std::string_view applicationPath) const override EXCLUDES(_lock);
+    std::optional<std::string> videosFolder() const override;
 
     void launchApplication(std::string_view identifier) override;
     void launchProgram(std::string_view path) override;

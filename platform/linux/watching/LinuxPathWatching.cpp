@@ -2,6 +2,8 @@
 
 #include "platform/Threads.h"
 #include "platform/linux/SignalsHeld.h"
+#include "platform/linux/watching/InotifyLimits.h"
+#include "platform/linux/watching/WatchedPlace.h"
 
 #include <ctime>
 #include <utility>
@@ -68,6 +70,20 @@ bool LinuxPathWatching::startThread()
 WatchingState LinuxPathWatching::state() const
 {
     return { _counts->watchedFolders, _counts->polledFolders, _counts->overflows };
+}
+
+FollowingMeans LinuxPathWatching::meansOfFollowing(std::string_view path) const
+{
+    const PolledMounts mounts(MountTable::read("/proc"), _roles.limits.furtherPolledTypes);
+    const WatchedPlace place = placeOfPath(_roles.files, path, mounts);
+    if (mounts.isAutomountPoint(place.path))
+        return FollowingMeans::nothing;
+    return place.isPolled || !_roles.limits.mayUseInotify ? FollowingMeans::looking : FollowingMeans::reports;
+}
+
+std::optional<WatchingLimits> LinuxPathWatching::limits(std::uint64_t furtherWatches) const
+{
+    return inotifyLimits(furtherWatches);
 }
 
 std::unique_ptr<PathWatching> LinuxPathWatching::withPathsOf(const FileSystem& files, const Volumes& volumes) const

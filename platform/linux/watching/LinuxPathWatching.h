@@ -34,6 +34,8 @@ public:
     Date timeOfChangesNow() const override;
     std::shared_ptr<void> watch(std::string_view path, Date since, PathWatchHandlers handlers) override;
     WatchingState state() const override;
+    FollowingMeans meansOfFollowing(std::string_view path) const override;
+    std::optional<WatchingLimits> limits(std::uint64_t furtherWatches) const override;
     /// Mounts of this machine are noticed as well as those that the other volumes tell of.
     std::unique_ptr<PathWatching> withPathsOf(const FileSystem& files, const Volumes& volumes) const override;
 

@@ -1,45 +1,27 @@
 #include "platform/linux/watching/WatchingProblems.h"
 
-#include "platform/linux/WholeSystemFile.h"
+#include "platform/linux/watching/InotifyLimits.h"
 
 #include <algorithm>
-#include <charconv>
 
 namespace platform {
-
-namespace {
-
-    std::uint64_t kernelLimit(const std::string& name)
-    {
-        const std::string text = readWholeSystemFile("/proc/sys/fs/inotify/" + name, 64);
-        std::uint64_t limit = 0;
-        std::from_chars(text.data(), text.data() + text.size(), limit);
-        return limit;
-    }
-
-    std::string commandFor(const std::string& name, std::uint64_t limit)
-    {
-        return "sudo sysctl fs.inotify." + name + '=' + std::to_string(limit);
-    }
-
-} // namespace
 
 WatchingProblem usedUpWatches(std::uint64_t watchesAtMost)
 {
     // What desktops set of themselves; a folder costs the kernel about a kilobyte at most.
     constexpr std::uint64_t usualLimit = 524'288;
     const std::string name = "max_user_watches";
-    const std::uint64_t limit = std::min(kernelLimit(name), watchesAtMost);
+    const std::uint64_t limit = std::min(inotifyLimit(name), watchesAtMost);
     return { {}, "the kernel's limit of watches (" + std::to_string(limit) + ") is used up",
-        commandFor(name, std::max(usualLimit, limit * 2)) };
+        commandForInotifyLimit(name, std::max(usualLimit, limit * 2)) };
 }
 
 WatchingProblem noInotifyInstance()
 {
     const std::string name = "max_user_instances";
-    const std::uint64_t limit = kernelLimit(name);
+    const std::uint64_t limit = inotifyLimit(name);
     return { {}, "the kernel's limit of inotify instances (" + std::to_string(limit) + ") is used up",
-        commandFor(name, std::max<std::uint64_t>(limit * 2, 128)) };
+        commandForInotifyLimit(name, std::max<std::uint64_t>(limit * 2, 128)) };
 }
 
 WatchingProblem changedByOthers(std::string_view fileSystemType)

@@ -1,0 +1,164 @@
+// What is known of the folders that are searched, and of the volumes, and what it means.
+
+#include "apps/common/HumanText.h"
+#include "apps/ombrix/Checkup.h"
+#include "apps/ombrix/ProblemText.h"
+#include "apps/ombrix/ShellWord.h"
+#include "platform/PathText.h"
+
+#include <algorithm>
+
+namespace ombrix {
+namespace {
+
+    using platform::FileProblem;
+    using platform::isSameOrBelow;
+    using platform::pathJoined;
+
+    constexpr const char* libraries = "libraries";
+    constexpr const char* volumes = "volumes";
+
+    std::vector<const FolderState*> searchedFolders(const CheckupFacts& facts)
+    {
+        std::vector<const FolderState*> folders;
+        for (const auto* searched : { &facts.projects, &facts.events }) {
+            for (const FolderState& folder : *searched)
+                folders.push_back(&folder);
+        }
+        return folders;
+    }
+
+    std::string silenceOf(const std::string& path)
+    {
+        return path + " does not answer within 2 seconds";
+    }
+
+    /// The volume that has to be taken off for `path` to answer again; empty for the system's own disk.
+    std::string silentVolumeOf(const CheckupFacts& facts, std::string_view path)
+    {
+        std::string found;
+        for (const FolderState& volume : facts.volumes) {
+            if (volume.path != "/" && volume.path.size() > found.size() && isSameOrBelow(path, volume.path))
+                found = volume.path;
+        }
+        return found;
+    }
+
+    std::string commandToTakeOff(const std::string& volume)
+    {
+        return volume.empty() ? std::string() : "sudo umount --lazy " + shellWord(volume);
+    }
+
+    void checkFolder(const CheckupFacts& facts, const FolderState& folder, std::vector<Finding>& findings)
+    {
+        if (folder.isSilent) {
+            findings.push_back({ Severity::fail, libraries, silenceOf(folder.path),
+                commandToTakeOff(silentVolumeOf(facts, folder.path)) });
+        } else if (folder.problem == FileProblem::notPermitted) {
+            const std::string where = folder.blockedAt == folder.path ? std::string() : " (" + folder.blockedAt + ")";
+            findings.push_back({ Severity::fail, libraries, folder.path + ": reading it is not permitted" + where,
+                "chmod u+rx " + shellWord(folder.blockedAt) });
+        } else if (folder.problem == FileProblem::notAFolder) {
+            findings.push_back({ Severity::note, libraries, folder.path + " is no folder, so nothing is searched there" });
+        } else if (folder.isThere() && folder.problem != FileProblem::none) {
+            findings.push_back(
+                { Severity::fail, libraries, folder.path + ": " + std::string(problemText(folder.problem)) });
+        }
+    }
+
+    void checkSpellings(const std::vector<FolderState>& searched, std::vector<Finding>& findings)
+    {
+        for (std::size_t index = 0; index < searched.size(); ++index) {
+            for (std::size_t before = 0; before < index; ++before) {
+                const FolderState& one = searched[before];
+                const FolderState& other = searched[index];
+                if (!one.isThere() || !other.isThere())
+                    continue;
+                if (one.realPath == other.realPath)
+                    findings.push_back({ Severity::note, libraries,
+                        one.path + " and " + other.path + " are one folder, whose content is shown twice" });
+                else if (isSameOrBelow(one.realPath, other.realPath) || isSameOrBelow(other.realPath, one.realPath))
+                    findings.push_back({ Severity::note, libraries,
+                        one.path + " and " + other.path + " lie one in the other, so some content is shown twice" });
+            }
+        }
+    }
+
+    std::string commandToBringHome(const StrayLibrary& library)
+    {
+        if (!library.movies.isThere())
+            return "ln -s " + shellWord(library.videos) + " " + shellWord(library.movies.path);
+        if (!library.sought.isThere())
+            return "mv -n " + shellWord(library.stray.path) + " " + shellWord(library.sought.path);
+        return "mv -n " + shellWord(library.stray.path) + "/* " + shellWord(library.sought.path) + "/";
+    }
+
+    void checkStrays(const CheckupFacts& facts, std::vector<Finding>& findings)
+    {
+        for (const StrayLibrary& library : facts.strays) {
+            const std::string command = commandToBringHome(library);
+            findings.push_back({ Severity::warn, libraries,
+                library.stray.path + " is not searched; " + library.sought.path + " is", command });
+        }
+    }
+
+    void tellCounts(const CheckupFacts& facts, std::vector<Finding>& findings)
+    {
+        std::size_t there = 0;
+        const std::vector<const FolderState*> folders = searchedFolders(facts);
+        for (const FolderState* folder : folders)
+            there += folder->isThere() || folder->isSilent;
+        const std::string absent
+            = there == folders.size() ? "" : "; " + apps::countText(folders.size() - there) + " do not, which is normal";
+        if (there == 0)
+            findings.push_back({ Severity::note, libraries,
+                "none of the " + apps::countText(folders.size()) + " search folders exists, so nothing is shown" });
+        else
+            findings.push_back({ Severity::ok, libraries,
+                apps::quantityText(there, "search folder") + (there == 1 ? " exists" : " exist") + absent });
+    }
+
+} // namespace
+
+void checkLibraries(const CheckupFacts& facts, std::vector<Finding>& findings)
+{
+    if (!facts.sourceAnswered) {
+        const std::string home = facts.home.empty() ? "the home folder" : facts.home;
+        findings.push_back({ Severity::fail, libraries,
+            "which folders are searched cannot be told: " + silenceOf(home),
+            commandToTakeOff(silentVolumeOf(facts, facts.home)) });
+        return;
+    }
+    tellCounts(facts, findings);
+    for (const FolderState* folder : searchedFolders(facts))
+        checkFolder(facts, *folder, findings);
+    checkSpellings(facts.projects, findings);
+    checkSpellings(facts.events, findings);
+    checkStrays(facts, findings);
+}
+
+void checkVolumes(const CheckupFacts& facts, std::vector<Finding>& findings)
+{
+    if (!facts.volumesAnswered) {
+        findings.push_back({ Severity::fail, volumes, "what is mounted cannot be told: the system does not answer" });
+        return;
+    }
+    const std::size_t before = findings.size();
+    for (const FolderState& volume : facts.volumes) {
+        if (volume.isSilent)
+            findings.push_back({ Severity::fail, volumes, silenceOf(volume.path),
+                commandToTakeOff(volume.path == "/" ? std::string() : volume.path) });
+        else if (!volume.isThere())
+            findings.push_back({ Severity::note, volumes, volume.path + " does not exist" });
+        else if (volume.problem != FileProblem::none)
+            findings.push_back({ Severity::note, volumes, volume.path + ": " + std::string(problemText(volume.problem)) });
+        else if (!volume.isFit)
+            findings.push_back({ Severity::note, volumes,
+                volume.path + " is of type " + volume.fileSystem + ": shown, but the editor keeps no libraries there" });
+    }
+    if (findings.size() == before)
+        findings.push_back({ Severity::ok, volumes,
+            apps::quantityText(facts.volumes.size(), "volume") + ", fit for libraries" });
+}
+
+} // namespace ombrix

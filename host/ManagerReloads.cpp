@@ -116,3 +116,19 @@ bool ManagerState::holdsReports() const
     std::lock_guard guard(_lock);
     return _loadActive || gate.isCancelPending();
 }
+
+bool ManagerState::isAtRest() const
+{
+    {
+        std::lock_guard guard(_lock);
+        if (_threadRuns || _loadQueued || !_postponed.empty())
+            return false;
+    }
+    return *_underWay == 0 && gate.isIdle() && core->pathWatcher().isAtRest(&_manager);
+}
+
+std::shared_ptr<void> ManagerState::countUnderWay()
+{
+    ++*_underWay;
+    return { nullptr, [count = _underWay](void*) { --*count; } };
+}

@@ -80,6 +80,9 @@ struct ManagerState {
     void performReload(std::string_view part, const std::function<void()>& reload);
     bool performAlone(const std::function<void()>& call);
     bool holdsReports() const;
+    bool isAtRest() const;
+    /// Counts something of the source that is under way, until the answer is dropped.
+    std::shared_ptr<void> countUnderWay();
     /// Notes what is being read from now on, and tells observers how far the load is, not too often.
     void beginPath(const platform::Text& path);
 
@@ -112,6 +115,7 @@ private:
     static void deliver(std::vector<Waiter> waiters, const OBLoadResult& result);
 
     OBMediaManager& _manager;
+    const std::shared_ptr<std::atomic<std::size_t>> _underWay = std::make_shared<std::atomic<std::size_t>>(0);
 
     mutable std::mutex _lock; // guards what follows
     bool _ended = false;

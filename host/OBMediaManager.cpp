@@ -261,7 +261,8 @@ void OBMediaManager::performInOrder(
 
 bool OBMediaManager::startThread(const std::string& name, std::function<void()> body)
 {
-    return _state->core->startThread(name, [manager = shared_from_this(), work = std::move(body)] { work(); });
+    return _state->core->startThread(
+        name, [manager = shared_from_this(), work = std::move(body), counted = _state->countUnderWay()] { work(); });
 }
 
 void OBMediaManager::observeNotification(
@@ -283,7 +284,8 @@ bool OBMediaManager::sleep(std::chrono::nanoseconds duration)
 void OBMediaManager::performAfterDelay(
     std::chrono::nanoseconds delay, platform::RunLoopModes modes, std::function<void()> call)
 {
-    const auto later = [manager = weak_from_this(), cause = WorkCause::current(), work = std::move(call)] {
+    const auto later = [manager = weak_from_this(), cause = WorkCause::current(), work = std::move(call),
+                           counted = _state->countUnderWay()] {
         const auto alive = manager.lock();
         if (!alive || alive->_state->ended.isRaised())
             return;
@@ -337,6 +339,11 @@ OBObservation OBMediaManager::observe(OBExecutor executor, OBManagerCallbacks ca
             alive->_state->removeObserver(observer);
     };
     return OBObservation(std::shared_ptr<void>(nullptr, takeBack));
+}
+
+bool OBMediaManager::isAtRest() const
+{
+    return _state->isAtRest();
 }
 
 OBLoadProgress OBMediaManager::loadProgress() const

@@ -204,6 +204,9 @@ public:
     /// Calls back through `executor` until the observation is dropped. Where automatic reloads are enabled, whoever
     /// observes gets a tree without asking for one.
     [[nodiscard]] OBObservation observe(OBExecutor executor, OBManagerCallbacks callbacks);
+    /// Whether nothing is under way by which another tree would be published: no load, reload or report of a change,
+    /// and no thread or delayed call of the source. What a disk has not told yet is not under way.
+    bool isAtRest() const;
     OBLoadProgress loadProgress() const;
     /// The folders that the last load could not read.
     std::vector<OBLoadProblem> loadProblems() const;

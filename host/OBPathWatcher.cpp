@@ -193,21 +193,30 @@ void OBPathWatcher::removeObserver(const OBPathWatcherObserver* observer)
 
 void OBPathWatcher::resumeReports(const OBPathWatcherObserver* observer)
 {
+    for (const auto& lane : lanesOf(observer))
+        lane->resume();
+}
+
+bool OBPathWatcher::isAtRest(const OBPathWatcherObserver* observer) const
+{
+    const std::vector<std::shared_ptr<ReportLane>> lanes = lanesOf(observer);
+    return std::all_of(lanes.begin(), lanes.end(), [](const auto& lane) { return lane->isAtRest(); });
+}
+
+/// Those that follow; they are asked without the lock.
+std::vector<std::shared_ptr<ReportLane>> OBPathWatcher::lanesOf(const OBPathWatcherObserver* observer) const
+{
     std::vector<std::shared_ptr<ReportLane>> lanes;
-    {
-        Locked guard(_lock);
-        const auto known = _registrations.find(observer);
-        if (known == _registrations.end())
-            return;
-        for (const WatchedPath& path : known->second.paths)
-            lanes.push_back(path.lane);
-        for (const WatchedQuery& query : known->second.queries)
-            lanes.push_back(query.lane);
-    }
-    for (const auto& lane : lanes) {
-        if (lane)
-            lane->resume();
-    }
+    Locked guard(_lock);
+    const auto known = _registrations.find(observer);
+    if (known == _registrations.end())
+        return lanes;
+    for (const WatchedPath& path : known->second.paths)
+        lanes.push_back(path.lane);
+    for (const WatchedQuery& query : known->second.queries)
+        lanes.push_back(query.lane);
+    std::erase(lanes, nullptr);
+    return lanes;
 }
 
 std::vector<std::string> OBPathWatcher::pathsWatchedBy(const OBPathWatcherObserver* observer) const

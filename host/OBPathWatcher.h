@@ -97,6 +97,9 @@ public:
     /// What made `observer` hold reports or refuse calls may have ended.
     void resumeReports(const OBPathWatcherObserver* observer);
 
+    /// Whether no report waits for `observer`, and none is being told to it.
+    bool isAtRest(const OBPathWatcherObserver* observer) const;
+
     /// What `observer` watches, in the order of registration.
     std::vector<std::string> pathsWatchedBy(const OBPathWatcherObserver* observer) const;
     std::vector<Query> queriesWatchedBy(const OBPathWatcherObserver* observer) const;
@@ -129,6 +132,7 @@ private:
     };
     using AllRegistrations = std::map<const OBPathWatcherObserver*, Registrations>;
 
+    std::vector<std::shared_ptr<ReportLane>> lanesOf(const OBPathWatcherObserver* observer) const;
     Registrations& registrationsOf(OBPathWatcherObserver* observer) REQUIRES(_lock);
     void startPath(WatchedPath& path, OBPathWatcherObserver& observer) REQUIRES(_lock);
     std::string startQuery(WatchedQuery& query, OBPathWatcherObserver& observer) REQUIRES(_lock);

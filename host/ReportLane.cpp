@@ -149,6 +149,12 @@ bool ReportLane::takeFirst(Pending& first)
     return true;
 }
 
+bool ReportLane::isAtRest() const
+{
+    Locked guard(_lock);
+    return _pending.empty() && _calls == 0;
+}
+
 void ReportLane::close()
 {
     Locked guard(_lock);

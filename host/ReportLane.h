@@ -30,6 +30,8 @@ public:
     void add(const std::string& report);
     /// Asks the observer again whether it takes calls.
     void resume();
+    /// Whether no report waits and no call is under way.
+    bool isAtRest() const EXCLUDES(_lock);
     /// Lets no further call begin. Waits for calls under way on other threads, unless the observer keeps itself alive
     /// during calls.
     void close() EXCLUDES(_lock);
@@ -56,7 +58,7 @@ private:
     const std::string _cause;
     const Deliver _deliver;
 
-    platform::Mutex _lock;
+    mutable platform::Mutex _lock;
     platform::Condition _callEnded;
     std::deque<Pending> _pending GUARDED_BY(_lock);
     std::size_t _workers GUARDED_BY(_lock) = 0; // threads that deliver, or are about to

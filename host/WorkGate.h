@@ -79,6 +79,13 @@ public:
 
     bool isCancelPending() const noexcept { return _cancelPending.load(std::memory_order_acquire); }
 
+    /// Whether nothing is at work, and so no cancel is pending either.
+    bool isIdle() const
+    {
+        std::lock_guard guard(_lock);
+        return _atWork == 0;
+    }
+
     /// When the first of what is at work began; absent while nothing is.
     std::optional<platform::Date> beganAt() const
     {

@@ -13,6 +13,12 @@ Output::Output(int descriptor)
 {
 }
 
+Output::Output(std::string& text)
+    : _descriptor(-1)
+    , _text(&text)
+{
+}
+
 void Output::flush()
 {
     writeAll(_block);
@@ -27,6 +33,10 @@ void Output::writeThrough(std::string_view bytes)
 
 void Output::writeAll(std::string_view bytes)
 {
+    if (_text) {
+        _text->append(bytes);
+        return;
+    }
     while (!bytes.empty() && _problem.empty()) {
         const ssize_t written = ::write(_descriptor, bytes.data(), bytes.size());
         if (written >= 0) {

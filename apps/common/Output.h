@@ -11,6 +11,8 @@ namespace apps {
 class Output {
 public:
     explicit Output(int descriptor);
+    /// Appends to `text` instead, which outlives this object.
+    explicit Output(std::string& text);
     Output(const Output&) = delete;
     Output& operator=(const Output&) = delete;
 
@@ -33,6 +35,7 @@ private:
     void writeAll(std::string_view bytes);
 
     const int _descriptor;
+    std::string* const _text = nullptr;
     std::string _block;
     std::string _problem;
 };

@@ -26,8 +26,13 @@ namespace {
     Answer tellVolumes(const platform::Platform& machine)
     {
         Answer answer;
-        addTexts(answer, "local", machine.volumes.localVolumes());
-        addTexts(answer, "removable", machine.volumes.removableMedia());
+        std::vector<std::string> volumes = machine.volumes.localVolumes();
+        for (std::string& medium : machine.volumes.removableMedia())
+            volumes.push_back(std::move(medium));
+        for (const std::string& volume : volumes) {
+            answer.emplace_back("volume", volume);
+            answer.emplace_back("name", machine.volumes.displayName(volume));
+        }
         if (const std::optional<std::string> home = machine.fileSystem.homeFolder())
             answer.emplace_back("home", *home);
         return answer;

@@ -18,12 +18,14 @@ namespace {
     {
         constexpr const char* subject = "editor";
         if (!facts.editorAnswered)
-            findings.push_back({ Severity::fail, subject, "where the editor is, the disk that would tell does not answer" });
+            findings.push_back(
+                { Severity::fail, subject, "where the editor is, the disk that would tell does not answer" });
         else if (!facts.editorPath)
             findings.push_back({ Severity::fail, subject, "it is not installed, so its libraries are not shown" });
         else if (!facts.canLoad)
             findings.push_back({ Severity::fail, subject,
-                "nothing exists at " + *facts.editorPath + ", where it is said to be, so its libraries are not shown" });
+                "nothing exists at " + *facts.editorPath
+                    + ", where it is said to be, so its libraries are not shown" });
         else
             findings.push_back({ Severity::ok, subject, *facts.editorPath });
     }
@@ -54,8 +56,8 @@ namespace {
                 instances.remedy });
         else if (wanted > room)
             findings.push_back({ Severity::warn, subject,
-                countText(wanted - room) + " of " + folderText + " would be looked at every 10 s: "
-                    + limitText(watches) + " watches that the kernel allows are in use",
+                countText(wanted - room) + " of " + folderText + " would be looked at every 10 s: " + limitText(watches)
+                    + " watches that the kernel allows are in use",
                 watches.remedy });
         else
             findings.push_back({ Severity::ok, subject,
@@ -68,8 +70,9 @@ namespace {
         for (const FolderState* folder : distinctSearchFolders(facts)) {
             if (folder->means == FollowingMeans::looking)
                 findings.push_back({ Severity::note, "watching",
-                    folder->path + " is looked at every 10 s: the kernel does not report what others change on a file "
-                                   "system of type "
+                    folder->path
+                        + " is looked at every 10 s: the kernel does not report what others change on a file "
+                          "system of type "
                         + folder->fileSystem });
             else if (folder->means == FollowingMeans::nothing)
                 findings.push_back({ Severity::note, "watching", folder->path + " is not followed" });
@@ -88,7 +91,7 @@ namespace {
             const std::string file = shellWord(preferences.file);
             const std::string remedy = preferences.file.empty() ? std::string()
                 : preferences.isNotPermitted                    ? "chmod u+r " + file
-                                                                : "mv -n " + file + " " + shellWord(preferences.file + ".damaged");
+                                             : "mv -n " + file + " " + shellWord(preferences.file + ".damaged");
             findings.push_back({ remedy.empty() ? Severity::note : Severity::warn, subject,
                 preferences.problem + "; the defaults are used", remedy });
         }

@@ -27,6 +27,17 @@ namespace {
         return states;
     }
 
+    void takeVolumes(CheckupFacts& facts, const DiskAnswer& mounted)
+    {
+        const std::vector<std::string> paths = textsIn(mounted, "volume");
+        const std::vector<std::string> names = textsIn(mounted, "name");
+        facts.volumes = statesOfPaths(paths);
+        for (FolderState& volume : facts.volumes) {
+            const auto first = std::find(paths.begin(), paths.end(), volume.path) - paths.begin();
+            volume.name = static_cast<std::size_t>(first) < names.size() ? names[static_cast<std::size_t>(first)] : "";
+        }
+    }
+
     void takeFirstRound(CheckupFacts& facts, const std::vector<DiskAnswer>& answers)
     {
         const DiskAnswer& mounted = answers[0];
@@ -36,10 +47,7 @@ namespace {
         facts.sourceAnswered = source.has_value();
         facts.editorAnswered = editor.has_value();
         facts.home = textIn(mounted, "home").value_or("");
-        std::vector<std::string> volumes = textsIn(mounted, "local");
-        for (std::string& medium : textsIn(mounted, "removable"))
-            volumes.push_back(std::move(medium));
-        facts.volumes = statesOfPaths(volumes);
+        takeVolumes(facts, mounted);
         facts.sourceName = textIn(source, "name").value_or("");
         facts.projects = statesOfPaths(textsIn(source, "project"));
         facts.events = statesOfPaths(textsIn(source, "event"));
@@ -90,7 +98,7 @@ namespace {
             questions.push_back(wordsOf(DiskQuestion::preferences, preferences.domain));
         const std::vector<DiskAnswer> answers = ask(questions);
         for (std::size_t index = 0; index < states.size(); ++index)
-            *states[index] = stateOfAnswer(states[index]->path, answers[index]);
+            *states[index] = stateOfAnswer(*states[index], answers[index]);
         for (std::size_t index = 0; index < facts.preferences.size(); ++index) {
             DamagedPreferences& preferences = facts.preferences[index];
             const DiskAnswer& answer = answers[states.size() + index];
@@ -99,9 +107,8 @@ namespace {
             preferences.file = textIn(answer, "file").value_or("");
             preferences.isNotPermitted = textIn(answer, "notPermitted").has_value();
         }
-        std::erase_if(facts.preferences, [](const DamagedPreferences& preferences) {
-            return !preferences.isSilent && preferences.problem.empty();
-        });
+        std::erase_if(facts.preferences,
+            [](const DamagedPreferences& preferences) { return !preferences.isSilent && preferences.problem.empty(); });
         std::erase_if(facts.strays, [](const StrayLibrary& library) {
             return !library.stray.isThere() || library.stray.realPath == library.sought.realPath;
         });
@@ -136,7 +143,8 @@ std::vector<const FolderState*> distinctSearchFolders(const CheckupFacts& facts)
         for (const FolderState& folder : *searched) {
             if (!folder.isThere())
                 continue;
-            const auto holdsIt = [&](const FolderState* other) { return isSameOrBelow(folder.realPath, other->realPath); };
+            const auto holdsIt
+                = [&](const FolderState* other) { return isSameOrBelow(folder.realPath, other->realPath); };
             if (std::any_of(distinct.begin(), distinct.end(), holdsIt))
                 continue;
             std::erase_if(

@@ -33,33 +33,38 @@ namespace {
         return path + " does not answer within 2 seconds";
     }
 
-    /// The volume that has to be taken off for `path` to answer again; empty for the system's own disk.
-    std::string silentVolumeOf(const CheckupFacts& facts, std::string_view path)
+    /// The volume that holds `path`, as far as the path tells; null for the system's own disk.
+    const FolderState* volumeOf(const CheckupFacts& facts, std::string_view path)
     {
-        std::string found;
+        const FolderState* found = nullptr;
         for (const FolderState& volume : facts.volumes) {
-            if (volume.path != "/" && volume.path.size() > found.size() && isSameOrBelow(path, volume.path))
-                found = volume.path;
+            const bool holdsIt = isSameOrBelow(path, volume.path)
+                || (!volume.name.empty() && isSameOrBelow(path, "/Volumes/" + volume.name));
+            if (volume.path != "/" && holdsIt && (!found || volume.path.size() > found->path.size()))
+                found = &volume;
         }
         return found;
     }
 
-    std::string commandToTakeOff(const std::string& volume)
+    /// The paths below it answer again once it is gone.
+    std::string commandToTakeOff(const FolderState* volume)
     {
-        return volume.empty() ? std::string() : "sudo umount --lazy " + shellWord(volume);
+        return volume && volume->path != "/" ? "sudo umount --lazy " + shellWord(volume->path) : std::string();
     }
 
     void checkFolder(const CheckupFacts& facts, const FolderState& folder, std::vector<Finding>& findings)
     {
         if (folder.isSilent) {
-            findings.push_back({ Severity::fail, libraries, silenceOf(folder.path),
-                commandToTakeOff(silentVolumeOf(facts, folder.path)) });
+            // A silent volume is named by itself.
+            if (const FolderState* volume = volumeOf(facts, folder.path); !volume || !volume->isSilent)
+                findings.push_back({ Severity::fail, libraries, silenceOf(folder.path), commandToTakeOff(volume) });
         } else if (folder.problem == FileProblem::notPermitted) {
             const std::string where = folder.blockedAt == folder.path ? std::string() : " (" + folder.blockedAt + ")";
             findings.push_back({ Severity::fail, libraries, folder.path + ": reading it is not permitted" + where,
                 "chmod u+rx " + shellWord(folder.blockedAt) });
         } else if (folder.problem == FileProblem::notAFolder) {
-            findings.push_back({ Severity::note, libraries, folder.path + " is no folder, so nothing is searched there" });
+            findings.push_back(
+                { Severity::note, libraries, folder.path + " is no folder, so nothing is searched there" });
         } else if (folder.isThere() && folder.problem != FileProblem::none) {
             findings.push_back(
                 { Severity::fail, libraries, folder.path + ": " + std::string(problemText(folder.problem)) });
@@ -107,10 +112,13 @@ namespace {
         std::size_t there = 0;
         const std::vector<const FolderState*> folders = searchedFolders(facts);
         for (const FolderState* folder : folders)
-            there += folder->isThere() || folder->isSilent;
+            there += folder->isThere();
+        const auto silent = static_cast<std::size_t>(
+            std::count_if(folders.begin(), folders.end(), [](const FolderState* folder) { return folder->isSilent; }));
+        const std::size_t absentCount = folders.size() - there - silent;
         const std::string absent
-            = there == folders.size() ? "" : "; " + apps::countText(folders.size() - there) + " do not, which is normal";
-        if (there == 0)
+            = absentCount == 0 ? "" : "; " + apps::countText(absentCount) + " do not, which is normal";
+        if (there == 0 && silent == 0)
             findings.push_back({ Severity::note, libraries,
                 "none of the " + apps::countText(folders.size()) + " search folders exists, so nothing is shown" });
         else
@@ -124,9 +132,8 @@ void checkLibraries(const CheckupFacts& facts, std::vector<Finding>& findings)
 {
     if (!facts.sourceAnswered) {
         const std::string home = facts.home.empty() ? "the home folder" : facts.home;
-        findings.push_back({ Severity::fail, libraries,
-            "which folders are searched cannot be told: " + silenceOf(home),
-            commandToTakeOff(silentVolumeOf(facts, facts.home)) });
+        findings.push_back({ Severity::fail, libraries, "which folders are searched cannot be told: " + silenceOf(home),
+            commandToTakeOff(volumeOf(facts, facts.home)) });
         return;
     }
     tellCounts(facts, findings);
@@ -146,19 +153,20 @@ void checkVolumes(const CheckupFacts& facts, std::vector<Finding>& findings)
     const std::size_t before = findings.size();
     for (const FolderState& volume : facts.volumes) {
         if (volume.isSilent)
-            findings.push_back({ Severity::fail, volumes, silenceOf(volume.path),
-                commandToTakeOff(volume.path == "/" ? std::string() : volume.path) });
+            findings.push_back({ Severity::fail, volumes, silenceOf(volume.path), commandToTakeOff(&volume) });
         else if (!volume.isThere())
             findings.push_back({ Severity::note, volumes, volume.path + " does not exist" });
         else if (volume.problem != FileProblem::none)
-            findings.push_back({ Severity::note, volumes, volume.path + ": " + std::string(problemText(volume.problem)) });
+            findings.push_back(
+                { Severity::note, volumes, volume.path + ": " + std::string(problemText(volume.problem)) });
         else if (!volume.isFit)
             findings.push_back({ Severity::note, volumes,
-                volume.path + " is of type " + volume.fileSystem + ": shown, but the editor keeps no libraries there" });
+                volume.path + " is of type " + volume.fileSystem
+                    + ": shown, but the editor keeps no libraries there" });
     }
     if (findings.size() == before)
-        findings.push_back({ Severity::ok, volumes,
-            apps::quantityText(facts.volumes.size(), "volume") + ", fit for libraries" });
+        findings.push_back(
+            { Severity::ok, volumes, apps::quantityText(facts.volumes.size(), "volume") + ", fit for libraries" });
 }
 
 } // namespace ombrix

@@ -237,7 +237,7 @@ namespace {
             "taken in, and compares the tree with that of a process of its own. Exit status\n"
             "0 when they are equal, else 1. What a followed tree cannot know is a note.",
             verifyOptions, true, verifyExamples, runVerify },
-        { "doctor", Intent::ask, "", 0, "find what keeps the tree from being right, and its cure",
+        { "doctor", Intent::ask, "", 0, "find what keeps the tree from being right",
             "Looks at the editor, the folders and disks that are searched, how they can be\n"
             "followed, and the preferences. Changes nothing. A disk gets 2 seconds to answer.\n"
             "Exit status 1 when a finding is a failure.",

@@ -83,10 +83,11 @@ std::vector<std::pair<std::string, std::string>> answerOfState(const FolderState
         { "means", std::to_string(static_cast<int>(state.means)) } };
 }
 
-FolderState stateOfAnswer(const std::string& path, const DiskAnswer& answer)
+FolderState stateOfAnswer(const FolderState& asked, const DiskAnswer& answer)
 {
     FolderState state;
-    state.path = path;
+    state.path = asked.path;
+    state.name = asked.name;
     state.isSilent = !answer;
     state.problem = static_cast<platform::FileProblem>(numberIn(answer, "problem"));
     state.blockedAt = textIn(answer, "blockedAt").value_or("");

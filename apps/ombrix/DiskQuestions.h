@@ -54,6 +54,7 @@ std::vector<std::string> textsIn(const DiskAnswer& answer, std::string_view name
 /// What is to be known of a folder that is searched, or of a volume.
 struct FolderState {
     std::string path {};
+    std::string name {}; ///< of a volume: what a person calls it
     bool isSilent = false; ///< its disk has not answered, and nothing else is known
     platform::FileProblem problem = platform::FileProblem::none;
     std::string blockedAt {}; ///< where reading it is not permitted: the folder that forbids it
@@ -71,7 +72,7 @@ struct FolderState {
 };
 
 std::vector<std::pair<std::string, std::string>> answerOfState(const FolderState& state);
-/// The state of the folder at `path` as it was answered; silent without an answer.
-FolderState stateOfAnswer(const std::string& path, const DiskAnswer& answer);
+/// The state of the folder that `asked` names, as it was answered; silent without an answer.
+FolderState stateOfAnswer(const FolderState& asked, const DiskAnswer& answer);
 
 } // namespace ombrix

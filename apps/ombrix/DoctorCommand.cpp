@@ -99,8 +99,8 @@ int runDoctor(Program& program)
     CheckupFacts facts = askForFacts(askThroughChildren(program));
     facts.limits = program.session()->platform().pathWatching.limits(foldersToWatch(facts));
     const std::vector<Finding> findings = findingsOf(facts);
-    const bool isHealthy = std::none_of(findings.begin(), findings.end(),
-        [](const Finding& finding) { return finding.severity == Severity::fail; });
+    const bool isHealthy = std::none_of(
+        findings.begin(), findings.end(), [](const Finding& finding) { return finding.severity == Severity::fail; });
     if (program.wantsJson())
         printJson(program, findings, isHealthy);
     else

@@ -98,8 +98,8 @@ std::optional<WatchingLimits> inotifyLimits(std::uint64_t furtherWatches)
     const InotifyUse use = inotifyUse("/proc", ::geteuid());
     limits.watches.inUse = use.watches;
     limits.instances.inUse = use.instances;
-    limits.watches.remedy = commandForInotifyLimit(watchesLimit,
-        std::max({ usualWatches, limits.watches.allowed * 2, (use.watches + furtherWatches) * 2 }));
+    limits.watches.remedy = commandForInotifyLimit(
+        watchesLimit, std::max({ usualWatches, limits.watches.allowed * 2, (use.watches + furtherWatches) * 2 }));
     limits.instances.remedy
         = commandForInotifyLimit(instancesLimit, std::max(usualInstances, limits.instances.allowed * 2));
     return limits;

@@ -71,6 +71,14 @@ struct FollowedSource : EventMachine {
     }
     /// Makes a call on a thread that may sleep.
     void callOnThread(std::function<void()> call) { _threads.emplace_back(std::move(call)); }
+    /// False when something of the source is still under way after the longest wait.
+    bool comesToRest() const
+    {
+        const auto end = std::chrono::steady_clock::now() + longestWait;
+        while (!source->isAtRest() && std::chrono::steady_clock::now() < end)
+            std::this_thread::yield();
+        return source->isAtRest();
+    }
     /// The events in the tree, in order.
     std::string eventNames() const
     {

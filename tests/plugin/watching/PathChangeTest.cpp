@@ -281,3 +281,18 @@ TEST_CASE("what is seen on disk reaches the source: a project that comes is show
     test.clock.advance(seconds(5));
     CHECK(test.published.waitFor("projects: First Events"));
 }
+
+TEST_CASE("a source is at rest when no load, report, reload or delayed call of it is under way")
+{
+    FollowedSource test;
+    CHECK(test.comesToRest());
+    test.change(test.projectsFolder());
+    CHECK_FALSE(test.source->isAtRest());
+    CHECK(test.clock.waitForSleep(seconds(5)));
+    CHECK_FALSE(test.source->isAtRest());
+    test.clock.advance(seconds(5));
+    CHECK(test.published.waitFor("projects: First Events"));
+    CHECK(test.comesToRest());
+    test.source->performAfterDelay(seconds(5), platform::RunLoopModes::common, [] {});
+    CHECK_FALSE(test.source->isAtRest());
+}

@@ -231,10 +231,12 @@ Explainer::Way Explainer::wayOutside(const std::string& path) const
             "move the library there, or mount its volume");
     else if (has([&](const std::string& folder) { return platform::isSameOrBelow(folder, path); }))
         way.end("search folder", path, "it holds folders that are searched, and is none itself", {});
+    else if (_folders.empty())
+        way.end("search folder", path, "the source tells of no folder that it searches", {});
     else
         way.end("search folder", path,
             "it lies in none of the " + std::to_string(_folders.size()) + " folders that are searched",
-            _folders.empty() ? std::string() : "move it into a library, such as " + _folders.front());
+            "move it into a library, such as " + _folders.front());
     return way;
 }
 

@@ -143,7 +143,9 @@ namespace {
         title.addBehind(
             "   " + state + manager.pluginIdentifier().string() + " " + manager.pluginBundle().manifest().version);
         program.printLine(title.text());
-        printFact(program, "editor", editorText(program, manager, canLoad));
+        // A source that loads without an editor has none.
+        if (!canLoad || manager.appInstalled())
+            printFact(program, "editor", editorText(program, manager, canLoad));
         if (OBSourceInspection* inspection = manager.inspection()) {
             printLibraries(program, manager, *inspection);
             if (const std::optional<bool> newest = inspection->mostRecentEventFirst())

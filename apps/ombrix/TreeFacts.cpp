@@ -69,6 +69,17 @@ namespace {
         return summary;
     }
 
+    /// Of a kind that only its source knows.
+    std::string groupSummary(const TreeNode& node)
+    {
+        std::string summary = apps::quantityText(node.children, "group");
+        if (node.totals.movies > 0) {
+            append(summary, apps::quantityText(node.totals.movies, "movie"));
+            append(summary, apps::sizeText(node.totals.bytes));
+        }
+        return summary;
+    }
+
     std::string summaryOf(const TreeNode& node, bool isFolded, bool isFirst)
     {
         switch (node.kind) {
@@ -86,7 +97,7 @@ namespace {
         case NodeKind::other:
             break;
         }
-        return node.children == 0 ? std::string() : apps::quantityText(node.children, "group");
+        return node.children == 0 ? std::string() : groupSummary(node);
     }
 
     std::string dateOf(const std::vector<TreeNode>& nodes, const TreeNode& node, platform::Date now)

@@ -121,7 +121,8 @@ public:
     Text defaultNoDataMessage(const OBMediaGroupRef& group) override
     {
         const bool isEmpty = group && group->childGroups().empty() && group->mediaObjects().empty();
-        return isEmpty ? localizedString(group == rootMediaGroup() ? "NoFolders" : "NoMovies") : Text();
+        const char* const reason = group && group->modificationDate() ? "NoMovies" : "NoSuchFolder";
+        return isEmpty ? localizedString(group == rootMediaGroup() ? "NoFolders" : reason) : Text();
     }
 
     OBMenuRef contextMenuForMediaObject_inMediaGroup(const OBMediaObjectRef& object, const OBMediaGroupRef&) override

@@ -1,4 +1,5 @@
 #include "tests/apps/ProgramRun.h"
+#include "tests/support/GoldenText.h"
 #include "tests/support/LibraryBuilder.h"
 #include "tests/support/TemporaryFolder.h"
 
@@ -6,21 +7,11 @@
 
 #include <algorithm>
 #include <csignal>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 using namespace tests;
 
 namespace {
-
-/// A file of this tree.
-std::string sourceText(const std::string& path)
-{
-    std::ifstream stream(OMBRIX_SOURCE_FOLDER "/" + path, std::ios::binary);
-    REQUIRE(stream.good());
-    return { std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>() };
-}
 
 /// A run of the example for a user whose home and data folders lie in `folder`.
 RunWishes exampleRun(const TemporaryFolder& folder)
@@ -65,9 +56,9 @@ TEST_CASE("the example of an application says so when there is nothing to load")
 
 TEST_CASE("what README shows of an application is a part of the example, which has at most fifty lines")
 {
-    const std::string example = sourceText("examples/host/HostExample.cpp");
+    const std::string example = contentOf(OMBRIX_SOURCE_FOLDER "/examples/host/HostExample.cpp");
     CHECK(std::count(example.begin(), example.end(), '\n') <= 50);
-    const std::string readme = sourceText("README.md");
+    const std::string readme = contentOf(OMBRIX_SOURCE_FOLDER "/README.md");
     const std::string fence = "```cpp\n";
     const std::size_t start = readme.find(fence, readme.find("## Embed")) + fence.size();
     const std::string shown = readme.substr(start, readme.find("```\n", start) - start);

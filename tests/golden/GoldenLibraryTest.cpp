@@ -1,4 +1,5 @@
 #include "tests/golden/Recipe.h"
+#include "tests/support/GoldenText.h"
 #include "tests/support/TemporaryFolder.h"
 
 #include <doctest/doctest.h>
@@ -7,8 +8,6 @@
 #include <array>
 #include <cstdio>
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <string>
 #include <vector>
 
@@ -23,12 +22,6 @@ namespace {
 /// Stands for the folder of the library in `tree.json`.
 constexpr std::string_view rootInTrees = "/ROOT";
 
-std::string contentOf(const std::filesystem::path& path)
-{
-    std::ifstream file(path, std::ios::binary);
-    return { std::istreambuf_iterator<char>(file), {} };
-}
-
 std::vector<std::filesystem::path> goldenFolders()
 {
     std::vector<std::filesystem::path> folders;
@@ -38,33 +31,6 @@ std::vector<std::filesystem::path> goldenFolders()
     }
     std::sort(folders.begin(), folders.end());
     return folders;
-}
-
-std::string replaced(std::string text, const std::string& from, std::string_view to)
-{
-    for (std::size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size()))
-        text.replace(at, from.size(), to);
-    return text;
-}
-
-/// A JSON document with its layout made uniform: one line a value, nothing else between values.
-std::string uniformLayout(std::string_view json)
-{
-    std::string text;
-    bool isInString = false;
-    for (std::size_t at = 0; at < json.size(); ++at) {
-        const char letter = json[at];
-        if (!isInString && (letter == ' ' || letter == '\n'))
-            continue;
-        if (letter == '"')
-            isInString = !isInString;
-        text.push_back(letter);
-        if (isInString && letter == '\\' && at + 1 < json.size())
-            text.push_back(json[++at]);
-        if (!isInString && letter == ',')
-            text.push_back('\n');
-    }
-    return text;
 }
 
 /// What the program prints about a machine, errors included.

@@ -11,7 +11,7 @@ namespace {
     // What the files of one folder may include beside their own folder's headers and the standard library.
     struct Layer {
         std::string_view folder;
-        Names headers; // "folder" itself, "folder/" with all below it, or one header
+        Names headers; // "folder" itself, "folder/" with all below it, "folder/Name*" by its beginning, or one header
         Names libraries; // how the name of a library's header begins
         bool systemHeaders;
         std::string_view rule;
@@ -19,6 +19,9 @@ namespace {
 
     // The orderings extend the framework's group, so their header is the one that plug-in topics share.
     constexpr std::string_view orderings = "plugin/events/MontaroSupport.h";
+
+    // What the host offers to programs and plug-ins from outside; its other headers are its own.
+    constexpr std::string_view publicHost = "host/OB*";
 
     // The first folder that a path lies in rules it, so inner folders stand before outer ones.
     const std::vector<Layer>& layers()
@@ -54,8 +57,11 @@ namespace {
                 "the window knows host/, roles, apps/common and its toolkit" },
             { "apps", { "host", "platform", "apps/common" }, {}, false,
                 "a program knows host/, roles and apps/common; machines and the system lie behind them" },
-            { "examples", { "host", "platform", "platform/linux" }, {}, true,
-                "an example knows what an application from outside does: host/, roles and the machine" },
+            { "examples/folders", { publicHost, "platform" }, {}, false,
+                "an example of a source knows what a plug-in from outside does: the host's public headers and roles" },
+            { "examples", { publicHost, "platform", "platform/linux" }, {}, true,
+                "an example knows what an application from outside does: the host's public headers, roles and the "
+                "machine" },
             { "tests/platform/linux/watching", { "platform/", "tests/support", "tests/platform/linux" }, { "doctest/" },
                 true, "a test knows public headers and tests/support" },
             { "tests",
@@ -91,6 +97,8 @@ namespace {
         if (folderOf(header) == folderOf(path))
             return true;
         return std::any_of(layer.headers.begin(), layer.headers.end(), [header](std::string_view allowed) {
+            if (allowed.ends_with('*'))
+                return header.starts_with(allowed.substr(0, allowed.size() - 1));
             return allowed.ends_with('/') ? header.starts_with(allowed)
                                           : header == allowed || folderOf(header) == allowed;
         });

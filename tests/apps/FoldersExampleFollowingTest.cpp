@@ -123,6 +123,8 @@ void checkOneReloadAnswersABurst(FollowedFolders& test)
     CHECK(test.mainThreadIsFree());
     test.change();
     test.disk.file("clips/c.mov", movieBytes(640, 480));
+    giveOthersTheirTurn();
+    CHECK(test.machine.clock.sleepers() == 1);
     test.machine.clock.advance(std::chrono::milliseconds(999));
     CHECK(test.lines() == Lines { " |  | clips: a" });
     test.machine.clock.advance(std::chrono::milliseconds(1));

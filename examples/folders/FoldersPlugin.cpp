@@ -105,7 +105,7 @@ public:
     void watchedPathChanged_fileChangedEventFlags(std::string_view, std::uint64_t) override
     {
         const auto answer = [this] {
-            if (sleep(std::chrono::seconds(1)))
+            if (sleep(std::chrono::seconds(2)))
                 performReload("folders", [this] { reload(); });
         };
         if (!_reloadIsDue.exchange(true) && !startThread("folders-reload", answer))

@@ -232,7 +232,7 @@ namespace {
         { "disk-format", Intent::ask, "PATH", 1, "say whether a disk is fit to hold libraries",
             "Prints \"true\" or \"false\", by the file system of the disk that PATH lies on.", {}, true,
             diskFormatExamples, runDiskFormat },
-        { "verify", Intent::ask, "", 0, "check that the followed tree equals one loaded afresh",
+        { "verify", Intent::follow, "", 0, "check that the followed tree equals one loaded afresh",
             "Loads, follows changes for as long as told, waits until what was heard has been\n"
             "taken in, and compares the tree with that of a process of its own. Exit status\n"
             "0 when they are equal, else 1. What a followed tree cannot know is a note.",

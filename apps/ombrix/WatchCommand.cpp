@@ -10,6 +10,7 @@
 #include "apps/ombrix/AbsolutePath.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Program.h"
+#include "apps/ombrix/Seconds.h"
 #include "apps/ombrix/WatchOutput.h"
 #include "apps/ombrix/WatchText.h"
 #include "host/OBConstants.h"
@@ -22,8 +23,6 @@
 
 #include <algorithm>
 #include <atomic>
-#include <charconv>
-#include <cmath>
 #include <utility>
 
 namespace ombrix {
@@ -40,17 +39,6 @@ namespace {
         std::string problem {};
     };
 
-    std::optional<std::chrono::nanoseconds> readSeconds(const std::string& typed)
-    {
-        constexpr double longest = 1e9; // a clock cannot tell much more
-        double seconds = 0;
-        const char* const end = typed.data() + typed.size();
-        const auto [rest, error] = std::from_chars(typed.data(), end, seconds, std::chars_format::fixed);
-        if (error != std::errc() || rest != end || !std::isfinite(seconds) || std::signbit(seconds))
-            return std::nullopt;
-        return std::chrono::nanoseconds(static_cast<std::int64_t>(std::min(seconds, longest) * 1e9));
-    }
-
     Wishes readWishes(const Arguments& arguments)
     {
         Wishes wishes;
@@ -59,7 +47,7 @@ namespace {
         else if (arguments.has("--json"))
             wishes.form = WatchForm::documents;
         if (const std::string* const typed = arguments.valueOf("--for")) {
-            wishes.limit = readSeconds(*typed);
+            wishes.limit = durationOfSeconds(*typed);
             if (!wishes.limit)
                 wishes.problem = "option --for is a number of seconds, not \"" + *typed + "\"";
         }

@@ -144,7 +144,7 @@ private:
     /// Null, which leaves the tree as it is, when somebody cancels.
     OBMediaGroupRef scan()
     {
-        const OBMediaGroupRef root = OBMediaGroup::withFields(
+        OBMediaGroupRef root = OBMediaGroup::withFields(
             { .typeIdentifier = &rootType, .name = rootMediaGroupTitle(), .ID = rootID, .icon = _icon });
         for (const std::string& folder : namedFolders()) {
             if (isCancelLoadRequestPending())
@@ -158,8 +158,8 @@ private:
     {
         const platform::FolderListing listing = listFolder(path, { .fileFacts = true });
         const std::vector<OBFileOfFolder> movies = moviesIn(listing);
-        const OBMediaGroupRef group = OBMediaGroup::withFields({ &folderType, platform::lastPathComponent(path), path,
-            rootID, path, _icon, OBMediaGroup::modDateForFile(path) });
+        OBMediaGroupRef group = OBMediaGroup::withFields({ &folderType, platform::lastPathComponent(path), path, rootID,
+            path, _icon, OBMediaGroup::modDateForFile(path) });
         group->setMediaObjects(OBMediaObjectBatch::objects(_movieKind, { path, listing.pathIsReal() }, movies));
         noteItemsFound(movies.size());
         return group;

@@ -62,16 +62,21 @@ std::string golden(const std::string& name)
     return contentOf(exampleFolder + "golden/" + name);
 }
 
-/// The text of each fenced block of a document, with the language that it names.
-std::vector<std::pair<std::string, std::string>> fencedBlocks(const std::string& document)
+/// A fenced block of a document, and the language that it names.
+struct FencedBlock {
+    std::string language;
+    std::string text;
+};
+
+std::vector<FencedBlock> fencedBlocks(const std::string& document)
 {
     constexpr std::string_view fence = "```";
-    std::vector<std::pair<std::string, std::string>> blocks;
+    std::vector<FencedBlock> blocks;
     for (std::size_t at = document.find(fence); at != std::string::npos; at = document.find(fence, at)) {
         const std::size_t start = document.find('\n', at) + 1;
         const std::size_t end = document.find("\n```\n", start) + 1;
-        blocks.emplace_back(
-            document.substr(at + fence.size(), start - 1 - at - fence.size()), document.substr(start, end - start));
+        const std::size_t language = at + fence.size();
+        blocks.push_back({ document.substr(language, start - 1 - language), document.substr(start, end - start) });
         at = end + fence.size();
     }
     return blocks;
@@ -175,11 +180,11 @@ TEST_CASE("what the guide for authors shows of a source is a part of the example
 {
     const std::string example = wholeExample();
     int parts = 0;
-    for (const auto& [language, text] : fencedBlocks(contentOf(OMBRIX_SOURCE_FOLDER "/docs/plugins.md"))) {
-        if (language == "sh")
+    for (const FencedBlock& block : fencedBlocks(contentOf(OMBRIX_SOURCE_FOLDER "/docs/plugins.md"))) {
+        if (block.language == "sh")
             continue;
-        CAPTURE(text);
-        CHECK(example.find("\n" + withoutCommand(text)) != std::string::npos);
+        CAPTURE(block.text);
+        CHECK(example.find("\n" + withoutCommand(block.text)) != std::string::npos);
         ++parts;
     }
     CHECK(parts > 10);

@@ -95,8 +95,8 @@ namespace {
     };
 
     constexpr OptionInfo watchOptions[] {
-        { "--json", "", "", "print the whole tree each time, one JSON document a line" },
-        { "--changes", "", "", "print the tree, then one JSON document a change" },
+        { "--json", "", "", "print the tree each time, a JSON document a line" },
+        { "--changes", "", "", "print the tree, then a JSON document a publication" },
         { "--for", "", "SECONDS", "end when so long has passed since the tree was printed" },
     };
     constexpr Example watchExamples[] {

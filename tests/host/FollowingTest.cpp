@@ -354,32 +354,6 @@ TEST_CASE("why folders are only looked at now and then is logged once, with what
     followed.watcher().removeObserver(&listener);
 }
 
-TEST_CASE("whoever follows changes is told when all paths are followed, and which are only looked at now and then")
-{
-    Journal told;
-    Followed followed({ .stands = [&] { told.write("stands"); },
-        .failed = [&](const platform::WatchingProblem& problem) { told.write(problem.path); } });
-    Listener listener;
-    CHECK(followed.watcher().pathsStand());
-    followed.watcher().watchPath_observer("/a", &listener);
-    followed.watcher().watchPath_observer("/b", &listener);
-    CHECK_FALSE(followed.watcher().pathsStand());
-    followed.disk().tellStanding("/a");
-    CHECK_FALSE(followed.watcher().pathsStand());
-    CHECK(told.lines().empty());
-    followed.disk().tellStanding("/b");
-    CHECK(followed.watcher().pathsStand());
-    CHECK(told.lines() == Paths { "stands" });
-    followed.disk().tellFailure("/a", { "/a/deep", "the limit is used up", "raise it" });
-    CHECK(told.lines() == Paths { "stands", "/a/deep" });
-
-    followed.watcher().watchPath_observer("/c", &listener);
-    CHECK_FALSE(followed.watcher().pathsStand());
-    followed.watcher().removeObserver(&listener);
-    CHECK(followed.watcher().pathsStand());
-    CHECK(told.lines() == Paths { "stands", "/a/deep" });
-}
-
 TEST_CASE("the threads on which observers are called are used again, and end when changes are no longer followed")
 {
     TestHost test;

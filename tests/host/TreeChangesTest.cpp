@@ -80,7 +80,7 @@ void check(const OBMediaGroupRef& before, const OBMediaGroupRef& now, const Expe
 TEST_CASE("a tree made anew of the same files has not changed")
 {
     const auto make = [] {
-        return groupWith("root", { groupOfFiles("a", { "1.mov", "2.mov" }), groupWith("b", { groupNamed("c") }) });
+        return groupWith("top", { groupOfFiles("a", { "1.mov", "2.mov" }), groupWith("b", { groupNamed("c") }) });
     };
     check(make(), make(), {});
     check(nullptr, nullptr, {});
@@ -88,21 +88,21 @@ TEST_CASE("a tree made anew of the same files has not changed")
 
 TEST_CASE("groups and objects that came or went are told in the order of the tree, a group before its objects")
 {
-    const OBMediaGroupRef before = groupWith("root", { groupOfFiles("a", { "1.mov" }), groupNamed("b") });
+    const OBMediaGroupRef before = groupWith("top", { groupOfFiles("a", { "1.mov" }), groupNamed("b") });
     const OBMediaGroupRef now
-        = groupWith("root", { groupWith("c", { groupOfFiles("d", { "1.mov", "2.mov" }) }), groupNamed("b") });
+        = groupWith("top", { groupWith("c", { groupOfFiles("d", { "1.mov", "2.mov" }) }), groupNamed("b") });
     check(before, now,
-        { { "group c in /root (0, 0)", "group d in /c (0, 2)", "object /d/1.mov in /d", "object /d/2.mov in /d" },
-            { "group a in /root (1, 0)", "object /a/1.mov in /a" }, {} });
+        { { "group c in /top (0, 0)", "group d in /c (0, 2)", "object /d/1.mov in /d", "object /d/2.mov in /d" },
+            { "group a in /top (1, 0)", "object /a/1.mov in /a" }, {} });
 }
 
 TEST_CASE("a group has changed when its own objects are others, whatever their order")
 {
-    const OBMediaGroupRef before = groupOfFiles("root", { "1.mov", "2.mov", "3.mov" });
-    check(before, groupOfFiles("root", { "3.mov", "1.mov", "2.mov" }), {});
-    check(before, groupOfFiles("root", { "1.mov", "3.mov", "4.mov", "5.mov" }),
-        { { "object /root/4.mov in /root", "object /root/5.mov in /root" }, { "object /root/2.mov in /root" },
-            { "group root (3, 4)" } });
+    const OBMediaGroupRef before = groupOfFiles("top", { "1.mov", "2.mov", "3.mov" });
+    check(before, groupOfFiles("top", { "3.mov", "1.mov", "2.mov" }), {});
+    check(before, groupOfFiles("top", { "1.mov", "3.mov", "4.mov", "5.mov" }),
+        { { "object /top/4.mov in /top", "object /top/5.mov in /top" }, { "object /top/2.mov in /top" },
+            { "group top (3, 4)" } });
 }
 
 TEST_CASE("a group has changed when its name, type, date or attributes have")
@@ -120,85 +120,84 @@ TEST_CASE("a group has changed when its name, type, date or attributes have")
     for (const auto edit : edits) {
         const OBMediaGroupRef now = groupNamed("a");
         edit(*now);
-        check(groupWith("root", { groupNamed("a") }), groupWith("root", { now }),
-            { {}, {}, { "group " + now->name().string() + " in /root (0, 0)" } });
+        check(groupWith("top", { groupNamed("a") }), groupWith("top", { now }),
+            { {}, {}, { "group " + now->name().string() + " in /top (0, 0)" } });
     }
 }
 
 TEST_CASE("a group that stands elsewhere among its siblings has not changed, one in another group has")
 {
-    const OBMediaGroupRef before = groupWith("root", { groupNamed("a"), groupNamed("b"), groupNamed("c") });
-    check(before, groupWith("root", { groupNamed("c"), groupNamed("a"), groupNamed("b") }), {});
-    check(before, groupWith("root", { groupNamed("a"), groupWith("b", { groupNamed("c") }) }),
+    const OBMediaGroupRef before = groupWith("top", { groupNamed("a"), groupNamed("b"), groupNamed("c") });
+    check(before, groupWith("top", { groupNamed("c"), groupNamed("a"), groupNamed("b") }), {});
+    check(before, groupWith("top", { groupNamed("a"), groupWith("b", { groupNamed("c") }) }),
         { {}, {}, { "group c in /b (0, 0)" } });
 }
 
 TEST_CASE("groups that cannot be told apart are as many as there are")
 {
-    check(groupWith("root", { groupNamed("a"), groupNamed("a") }), groupWith("root", { groupNamed("a") }),
-        { {}, { "group a in /root (0, 0)" }, {} });
+    check(groupWith("top", { groupNamed("a"), groupNamed("a") }), groupWith("top", { groupNamed("a") }),
+        { {}, { "group a in /top (0, 0)" }, {} });
     const OBMediaGroupRef nameless = OBMediaGroup::withFields({ .name = "x" });
     const OBMediaGroupRef other = OBMediaGroup::withFields({ .name = "y" });
-    check(groupWith("root", { nameless }), groupWith("root", { other }),
-        { { "group y in /root (0, 0)" }, { "group x in /root (0, 0)" }, {} });
+    check(groupWith("top", { nameless }), groupWith("top", { other }),
+        { { "group y in /top (0, 0)" }, { "group x in /top (0, 0)" }, {} });
 }
 
 TEST_CASE("a file that is listed twice is lost once when it is listed once")
 {
-    check(groupOfFiles("root", { "a.mov", "a.mov" }), groupOfFiles("root", { "a.mov" }),
-        { {}, { "object /root/a.mov in /root" }, { "group root (2, 1)" } });
+    check(groupOfFiles("top", { "a.mov", "a.mov" }), groupOfFiles("top", { "a.mov" }),
+        { {}, { "object /top/a.mov in /top" }, { "group top (2, 1)" } });
 }
 
 TEST_CASE("an object counts in the innermost group that it was set on")
 {
     const auto make = [](const Texts& names) {
         const OBMediaGroupRef inner = groupOfFiles("inner", names);
-        const OBMediaGroupRef root = groupWith("root", { inner });
+        const OBMediaGroupRef root = groupWith("top", { inner });
         const OBMediaObjectRef alone = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "alone");
         inner->setMediaObjects(inner->ownMediaObjects().appending(alone));
         root->setMediaObjects(inner->ownMediaObjects());
         return root;
     };
     check(make({ "1.mov" }), make({ "1.mov", "2.mov" }),
-        { { "object /inner/2.mov in /inner" }, {}, { "group inner in /root (2, 3)" } });
+        { { "object /inner/2.mov in /inner" }, {}, { "group inner in /top (2, 3)" } });
 }
 
 TEST_CASE("what a longer list repeats counts further in, and only the rest where it stands")
 {
     const auto make = [](const Texts& names) {
         const OBMediaGroupRef inner = groupNamed("inner");
-        const OBMediaGroupRef root = groupWith("root", { inner });
+        const OBMediaGroupRef root = groupWith("top", { inner });
         root->setMediaObjects(filesOf("f", names));
         inner->setMediaObjects(root->ownMediaObjects().prefix(1));
         return root;
     };
-    check(
-        make({ "1.mov" }), make({ "1.mov", "2.mov" }), { { "object /f/2.mov in /root" }, {}, { "group root (0, 1)" } });
+    check(make({ "1.mov" }), make({ "1.mov", "2.mov" }), { { "object /f/2.mov in /top" }, {}, { "group top (0, 1)" } });
 }
 
 TEST_CASE("representatives come and go unnoticed")
 {
     const auto representative = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "movie");
     representative->setAttribute_forKey(true, platform::Text(OBMediaObjectRepresentativeKey));
-    const OBMediaGroupRef now = groupNamed("root");
+    const OBMediaGroupRef now = groupNamed("top");
     now->setMediaObjects(OBMediaObjectList().appending(representative));
-    check(groupNamed("root"), now, {});
+    check(groupNamed("top"), now, {});
 }
 
 TEST_CASE("a tree that is changed in place is compared with what it was")
 {
-    const OBMediaGroupRef root = groupWith("root", { groupOfFiles("a", { "1.mov" }) });
+    const OBMediaGroupRef root = groupWith("top", { groupOfFiles("a", { "1.mov" }) });
     const OBTreeSnapshot before(root);
     root->childGroups()[0]->setMediaObjects(filesOf("a", { "1.mov", "2.mov" }));
     root->setChildGroups(root->childGroups().appending(groupNamed("b")));
-    check(before, root, { { "object /a/2.mov in /a", "group b in /root (0, 0)" }, {}, { "group a in /root (1, 2)" } });
+    check(before, root, { { "object /a/2.mov in /a", "group b in /top (0, 0)" }, {}, { "group a in /top (1, 2)" } });
 }
 
 TEST_CASE("of no tree everything comes, and to no tree everything goes")
 {
-    const OBMediaGroupRef root = groupOfFiles("root", { "1.mov" });
-    check(nullptr, root, { { "group root (0, 1)", "object /root/1.mov in /root" }, {}, {} });
-    check(root, nullptr, { {}, { "group root (1, 0)", "object /root/1.mov in /root" }, {} });
+    const OBMediaGroupRef root = groupOfFiles("top", { "1.mov" });
+    check(nullptr, root, { { "group top (0, 1)", "object /top/1.mov in /top" }, {}, {} });
+    check(root, nullptr, { {}, { "group top (1, 0)", "object /top/1.mov in /top" }, {} });
 }
 
 TEST_CASE("trees may be deeper than a thread's stack")

@@ -90,8 +90,8 @@ TEST_CASE("a watch tells people and programs in a line what came and went, and w
     REQUIRE(lines.prints(" folders (inotify)\n"));
     REQUIRE(changes.prints("]}\n"));
     home.projects().project("Draft").movie("a.mov");
-    home.projects().project("Meyer");
-    CHECK(lines.prints("  projects  + Meyer    ~ Draft: 0 → 1 movie  "));
+    home.projects().folder("Clients");
+    CHECK(lines.prints("  projects  + Clients    ~ Draft: 0 → 1 movie  "));
     CHECK(lines.prints("scanned in "));
     CHECK(lines.prints(" (changed: " + home.path("Movies/Montaro Projects")));
     const std::string library = home.path("Movies/Montaro Projects");
@@ -99,7 +99,7 @@ TEST_CASE("a watch tells people and programs in a line what came and went, and w
     CHECK(changes.prints("{\"kind\":\"object\",\"name\":\"a\",\"path\":\"" + library
         + "/Draft/Shared Items/a.mov\",\"group\":\"" + library + "/Draft\"}"));
     CHECK(changes.prints(
-        "{\"kind\":\"group\",\"name\":\"Meyer\",\"path\":\"" + library + "/Meyer\",\"group\":\"Montaro\"}"));
+        "{\"kind\":\"group\",\"name\":\"Clients\",\"path\":\"" + library + "/Clients\",\"group\":\"Montaro\"}"));
     CHECK(changes.prints(",\"removed\":[],\"changed\":[{\"kind\":\"group\",\"name\":\"Draft\","));
     CHECK(changes.prints("],\"cause\":\"changed: " + library));
     CHECK(lines.end(SIGHUP).status == 0);

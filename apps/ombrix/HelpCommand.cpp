@@ -35,7 +35,8 @@ namespace {
     {
         std::string text(title);
         for (const CommandInfo& command : commands()) {
-            if (command.intent == intent)
+            // The last line of the text says how to get help.
+            if (command.intent == intent && command.name != "help")
                 text += described(std::string(command.name), command.summary);
         }
         return text;
@@ -69,17 +70,14 @@ std::string helpText()
     text += "Options, before or after the command\n";
     for (const OptionInfo& option : globalOptions())
         text += describedOption(option);
-    text += "Examples\n";
-    for (const std::string_view name : { "tree", "objects" }) {
-        const Example& example = commandNamed(name)->examples[0];
-        text += "  " + apps::paddedAfter(example.command, 40) + " " + std::string(example.text) + "\n";
-    }
+    const Example& example = commandNamed("tree")->examples[0];
+    text += "Example\n";
+    text += "  " + apps::paddedAfter(example.command, 40) + " " + std::string(example.text) + "\n";
     text += "Environment\n";
     text += described("OMBRIX_LOG=2", "logs go to standard error");
     text += described("OMBRIX_PLUGIN_PATH", "folders that are searched for plug-ins first");
     text += described("NO_COLOR", "no colours; CLICOLOR_FORCE: also in a pipe");
-    text += "\nExit status: 0 done, 1 it could not be done, 2 wrong usage.\n";
-    text += "\"ombrix help COMMAND\" explains one command.\n";
+    text += "Exit status: 0 done, 1 not done, 2 wrong usage. More: \"ombrix help COMMAND\"\n";
     return text;
 }
 

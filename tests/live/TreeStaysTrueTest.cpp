@@ -14,7 +14,7 @@ std::uint64_t numberFromEnvironment(const char* name, std::uint64_t otherwise)
     return text ? std::strtoull(text, nullptr, 10) : otherwise;
 }
 
-constexpr std::uint64_t usualSeeds = 300;
+constexpr std::uint64_t usualSeeds = 200;
 constexpr int comparisons = 8;
 constexpr int operationsBetween = 12;
 

@@ -172,6 +172,7 @@ void OBPathWatcher::watchQuery_observer_queryScope_queryRunMode(
             known = queries.insert(known, std::move(registration));
         else if (known->query.scope != registration.query.scope || known->query.runMode != runMode)
             replaced.queries.push_back(std::exchange(*known, std::move(registration)));
+        closeLanes(replaced);
         if (_follows && !known->watch)
             problem = startQuery(*known, *observer);
     }
@@ -187,6 +188,7 @@ void OBPathWatcher::removeObserver(const OBPathWatcherObserver* observer)
         Locked guard(_lock);
         if (auto known = _registrations.extract(observer))
             removed = std::move(known.mapped());
+        closeLanes(removed);
     }
     stop(removed);
 }
@@ -206,14 +208,17 @@ bool OBPathWatcher::isAtRest(const OBPathWatcherObserver* observer) const
 /// Those that follow; they are asked without the lock.
 std::vector<std::shared_ptr<ReportLane>> OBPathWatcher::lanesOf(const OBPathWatcherObserver* observer) const
 {
-    std::vector<std::shared_ptr<ReportLane>> lanes;
     Locked guard(_lock);
     const auto known = _registrations.find(observer);
-    if (known == _registrations.end())
-        return lanes;
-    for (const WatchedPath& path : known->second.paths)
+    return known == _registrations.end() ? std::vector<std::shared_ptr<ReportLane>> {} : lanesIn(known->second);
+}
+
+std::vector<std::shared_ptr<ReportLane>> OBPathWatcher::lanesIn(const Registrations& registrations)
+{
+    std::vector<std::shared_ptr<ReportLane>> lanes;
+    for (const WatchedPath& path : registrations.paths)
         lanes.push_back(path.lane);
-    for (const WatchedQuery& query : known->second.queries)
+    for (const WatchedQuery& query : registrations.queries)
         lanes.push_back(query.lane);
     std::erase(lanes, nullptr);
     return lanes;
@@ -270,7 +275,7 @@ bool OBPathWatcher::pathsStand() const
     return !_toStand || _toStand->isEmpty();
 }
 
-/// The lanes stay registered until they are closed, so that whoever takes an observer back meanwhile waits for them too.
+/// The lanes stay registered until their calls have ended, so that whoever takes an observer back meanwhile waits for them too.
 void OBPathWatcher::stopFollowing()
 {
     AllRegistrations before;
@@ -283,6 +288,7 @@ void OBPathWatcher::stopFollowing()
                 path.watch = nullptr;
             for (WatchedQuery& query : registered.queries)
                 query.watch = nullptr;
+            closeLanes(registered);
         }
     }
     for (auto& [observer, stopped] : before)
@@ -338,6 +344,13 @@ platform::Date OBPathWatcher::changesMatterSince(const OBPathWatcherObserver& ob
     return _core ? _core->platform().pathWatching.timeOfChangesNow() : platform::Date {};
 }
 
+/// In the same moment in which the registrations change, so that nothing is told of them from then on.
+void OBPathWatcher::closeLanes(const Registrations& registrations)
+{
+    for (const auto& lane : lanesIn(registrations))
+        lane->close();
+}
+
 /// The watches first: they feed the lanes.
 void OBPathWatcher::stop(Registrations& registrations)
 {
@@ -345,12 +358,6 @@ void OBPathWatcher::stop(Registrations& registrations)
         path.watch = nullptr;
     for (WatchedQuery& query : registrations.queries)
         query.watch = nullptr;
-    for (const WatchedPath& path : registrations.paths) {
-        if (path.lane)
-            path.lane->close();
-    }
-    for (const WatchedQuery& query : registrations.queries) {
-        if (query.lane)
-            query.lane->close();
-    }
+    for (const auto& lane : lanesIn(registrations))
+        lane->waitForCalls();
 }

@@ -137,6 +137,8 @@ private:
     void startPath(WatchedPath& path, OBPathWatcherObserver& observer) REQUIRES(_lock);
     std::string startQuery(WatchedQuery& query, OBPathWatcherObserver& observer) REQUIRES(_lock);
     platform::Date changesMatterSince(const OBPathWatcherObserver& observer) const;
+    static std::vector<std::shared_ptr<ReportLane>> lanesIn(const Registrations& registrations);
+    static void closeLanes(const Registrations& registrations);
     static void stop(Registrations& registrations);
 
     FrameworkCore* const _core;

@@ -160,6 +160,11 @@ void ReportLane::close()
     Locked guard(_lock);
     _closed = true;
     _pending.clear();
+}
+
+void ReportLane::waitForCalls()
+{
+    Locked guard(_lock);
     const auto own = static_cast<std::size_t>(std::count(callingOnThisThread.begin(), callingOnThisThread.end(), this));
     while (!_keepsItselfAlive && _calls > own)
         _callEnded.wait(_lock);

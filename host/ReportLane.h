@@ -32,9 +32,10 @@ public:
     void resume();
     /// Whether no report waits and no call is under way.
     bool isAtRest() const EXCLUDES(_lock);
-    /// Lets no further call begin. Waits for calls under way on other threads, unless the observer keeps itself alive
-    /// during calls.
+    /// Lets no further call begin; what waits is forgotten. Waits for nothing.
     void close() EXCLUDES(_lock);
+    /// Waits for calls under way on other threads, unless the observer keeps itself alive during calls. Once closed.
+    void waitForCalls() EXCLUDES(_lock);
 
 private:
     struct Pending {

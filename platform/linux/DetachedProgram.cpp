@@ -26,7 +26,7 @@ namespace {
         for (int standard = 0; nowhere >= 0 && standard <= 2; ++standard)
             dup2(nowhere, standard);
         int problem = 0;
-        if (workingFolder && chdir(workingFolder) == -1)
+        if (chdir(workingFolder) == -1)
             problem = errno;
         if (problem == 0) {
             execvp(arguments[0], arguments);
@@ -58,7 +58,7 @@ std::string startDetachedProgram(const std::vector<std::string>& arguments, cons
         return std::strerror(errno);
     const Descriptor reading(ends[0]);
     Descriptor writing(ends[1]);
-    const char* const folder = workingFolder.empty() ? nullptr : workingFolder.c_str();
+    const char* const folder = workingFolder.empty() ? "/" : workingFolder.c_str();
 
     // The child ends at once, so that the program is nobody's child here and leaves no zombie.
     const pid_t child = fork();

@@ -91,8 +91,10 @@ int runPaths(Program& program)
             for (const std::string& path : *paths)
                 program.printPath(path);
         }
-    } else {
+    } else if (inspection) {
         printText(program, projects, events);
+    } else {
+        program.printLine("The source tells of no folder that it searches.");
     }
     return done;
 }

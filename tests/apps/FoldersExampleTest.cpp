@@ -154,6 +154,8 @@ TEST_CASE("a source without an editor is not said to lack one, and one that tell
         == "Folders   ready, org.ombrix.example.Folders 1.0\n"
            "    thread   load priority 0.5\n"
            "    offers   nothing\n");
+    CHECK(machine.printed({ "paths" }) == "The source tells of no folder that it searches.\n");
+    CHECK(machine.printed({ "paths", "--json" }) == "{\"projects\":[],\"events\":[]}\n");
     const std::string explained = machine.printed({ "explain", "/Clips/notes.txt", "--json" });
     CHECK(explained.find("\"the source tells of no folder that it searches\"") != std::string::npos);
     CHECK(machine.printed({ "explain", "/Clips/Beach.mov", "--json" }).find("\"listed\":true") != std::string::npos);

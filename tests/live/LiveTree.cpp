@@ -100,7 +100,6 @@ LiveTree::~LiveTree()
         _freshSources.clear();
         _source = nullptr;
         _machine.threads.waitUntilQuiet();
-        _machine.mainRunLoop.quit();
     });
 }
 

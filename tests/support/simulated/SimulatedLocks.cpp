@@ -14,17 +14,24 @@
 
 #include <dlfcn.h>
 #include <sched.h>
+#include <sys/syscall.h>
+#include <unistd.h>
 
 #if OMBRIX_SIMULATES_LOCKS
 
 namespace {
 
-/// The C library's own function called `name`. Of conditions some machines have two kinds, of which the program that is
-/// linked today uses the later one.
+/// The C library's own function called `name`.
 template <class Function> Function* original(const char* name)
 {
+    return reinterpret_cast<Function*>(::dlsym(RTLD_NEXT, name));
+}
+
+/// The same of conditions, of which some machines have two kinds; a program that is linked today uses the later one.
+template <class Function> Function* originalOfConditions(const char* name)
+{
     void* const later = ::dlvsym(RTLD_NEXT, name, "GLIBC_2.3.2");
-    return reinterpret_cast<Function*>(later ? later : ::dlsym(RTLD_NEXT, name));
+    return later ? reinterpret_cast<Function*>(later) : original<Function>(name);
 }
 
 int waitForCondition(pthread_mutex_t* mutex)
@@ -56,30 +63,30 @@ int pthread_mutex_lock(pthread_mutex_t* mutex)
 
 int pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex)
 {
-    static const auto wait = original<int(pthread_cond_t*, pthread_mutex_t*)>("pthread_cond_wait");
+    static const auto wait = originalOfConditions<int(pthread_cond_t*, pthread_mutex_t*)>("pthread_cond_wait");
     return tests::SimulatedThreads::isSimulated() ? waitForCondition(mutex) : wait(condition, mutex);
 }
 
 int pthread_cond_signal(pthread_cond_t* condition)
 {
-    static const auto signal = original<int(pthread_cond_t*)>("pthread_cond_signal");
+    static const auto signal = originalOfConditions<int(pthread_cond_t*)>("pthread_cond_signal");
     tests::SimulatedThreads::conditionSignalled();
     return signal(condition);
 }
 
 int pthread_cond_broadcast(pthread_cond_t* condition)
 {
-    static const auto broadcast = original<int(pthread_cond_t*)>("pthread_cond_broadcast");
+    static const auto broadcast = originalOfConditions<int(pthread_cond_t*)>("pthread_cond_broadcast");
     tests::SimulatedThreads::conditionSignalled();
     return broadcast(condition);
 }
 
-/// Asked for by who waits for a lock that is held for a few steps only.
+/// Asked for by who waits for a lock that is held for a few steps only: the sanitizers too, while nothing may allocate
+/// memory, which a look-up of the original would.
 int sched_yield()
 {
-    static const auto yield = original<int()>("sched_yield");
     if (!tests::SimulatedThreads::isSimulated())
-        return yield();
+        return static_cast<int>(::syscall(SYS_sched_yield));
     tests::SimulatedThreads::letOthersRun();
     return 0;
 }

@@ -40,6 +40,12 @@ SimulatedMachine::SimulatedMachine(std::uint64_t seed, void* linkedEntryPoint)
         disk.makeFolders(folder);
 }
 
+SimulatedMachine::~SimulatedMachine()
+{
+    mainRunLoop.quit();
+    threads.letAllEnd();
+}
+
 platform::Platform SimulatedMachine::platform()
 {
     return {

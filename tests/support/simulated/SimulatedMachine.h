@@ -92,6 +92,10 @@ class SimulatedMachine {
 public:
     /// `linkedEntryPoint` is the C entry point of the plug-in.
     SimulatedMachine(std::uint64_t seed, void* linkedEntryPoint);
+    /// Every thread ends while all that it may use is still there.
+    ~SimulatedMachine();
+    SimulatedMachine(const SimulatedMachine&) = delete;
+    SimulatedMachine& operator=(const SimulatedMachine&) = delete;
 
     platform::Platform platform();
 

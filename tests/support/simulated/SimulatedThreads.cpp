@@ -85,6 +85,11 @@ SimulatedThreads::SimulatedThreads(Chance& chance, platform::Date now)
 
 SimulatedThreads::~SimulatedThreads()
 {
+    letAllEnd();
+}
+
+void SimulatedThreads::letAllEnd()
+{
     _ends = true;
     while (runOne())
         continue;

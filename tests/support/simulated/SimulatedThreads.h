@@ -57,6 +57,8 @@ public:
     void after(std::chrono::nanoseconds delay, std::function<void()> call);
     /// Of the driving thread: runs `body` on a thread of an application, and all others, until it has returned.
     void perform(std::function<void()> body);
+    /// Of the driving thread, when nothing more is to come: runs every thread to its end.
+    void letAllEnd();
 
     /// Whether the caller is one of these threads.
     static bool isSimulated();

@@ -67,6 +67,9 @@ enum class MarkerAnswer : std::uint8_t {
     link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed to anything
 };
 
+class FolderListing;
+struct FolderItem;
+
 /// What a listing is to find out beside names and flags, so that a scan needs no second call an item.
 struct ListingRequest {
     /// For every item that can hold one: is there an entry of this name inside it, links followed?
@@ -81,14 +84,16 @@ struct ListingRequest {
     std::string_view subfolder {};
     /// The size and the creation date of every item that is neither a folder, nor a link, nor hidden by its name.
     bool fileFacts = false;
+    /// Of the folder that holds the listed one: is there an entry of this name in it, links followed, and what are its
+    /// facts? Not asked when empty.
+    std::string_view markerBeside {};
+    /// A listing that is needed no longer, or null. It is emptied, and the answer lies in its memory.
+    FolderListing* spare = nullptr;
     LinkPolicy links = LinkPolicy::follow;
     /// With LinkPolicy::stop: a link of the marker's name inside a folder is followed all the same where the system comes
     /// to something by it.
     bool followsMarkers = false;
 };
-
-class FolderListing;
-struct FolderItem;
 
 /// The items of a folder inside an item of a listing, in the order in which the file system lists them: names and
 /// kinds.
@@ -141,6 +146,11 @@ public:
     /// the request did not ask for them.
     const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
 
+    /// The facts, links followed, of the folder that holds the listed one. Absent where the request did not ask for the
+    /// marker beside, and where that is not there or could not be told in the same pass: then both are to be asked for by
+    /// themselves.
+    const std::optional<ItemStatus>& holderStatus() const noexcept { return _holderStatus; }
+
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
     bool pathIsReal() const noexcept { return _pathIsReal; }
     /// The folder's real path where the listing came by it on the way and it is another than the one asked for; empty
@@ -161,7 +171,8 @@ public:
         if (entry.hasFacts)
             item.facts = FileFacts { { entry.seconds, entry.nanoseconds }, entry.size };
         if (entry.hasSubfolder)
-            item.subfolder.emplace(*this, entry.subfolderFirst, entry.subfolderCount);
+            item.subfolder.emplace(
+                *this, static_cast<std::uint32_t>(entry.size >> 32), static_cast<std::uint32_t>(entry.size));
         return item;
     }
 
@@ -187,7 +198,8 @@ public:
     Iterator begin() const { return { this, 0 }; }
     Iterator end() const { return { this, _entries.size() }; }
 
-    /// For whoever makes a listing.
+    /// For whoever makes a listing: an empty one in the memory of another.
+    static FolderListing inMemoryOf(FolderListing&& spare);
     void append(const FolderItem& item);
     /// Makes room for so many more items, whose names take so many bytes; more may come.
     void reserve(std::size_t items, std::size_t bytesOfNames);
@@ -197,6 +209,7 @@ public:
     /// What has been added to the subfolder of the item that is appended next.
     SubfolderItems takeSubfolder();
     void setFolderStatus(const ItemStatus& status) { _folderStatus = status; }
+    void setHolderStatus(const ItemStatus& status) { _holderStatus = status; }
     void setProblem(FileProblem problem) { _problem = problem; }
     void setPathIsReal(bool isReal) { _pathIsReal = isReal; }
     void setOtherRealPath(std::string path) { _otherRealPath = std::move(path); }
@@ -204,6 +217,7 @@ public:
 private:
     friend class SubfolderItems;
     FolderItem adopted(const FolderItem& item);
+    void appendOwn(const FolderItem& item);
     void noteLinks(const FolderItem& item)
     {
         _hasLinks = _hasLinks || item.kind == ItemKind::symbolicLink || item.marker == MarkerAnswer::link;
@@ -213,21 +227,20 @@ private:
         std::uint32_t nameLength = 0;
         ItemKind kind = ItemKind::other;
     };
-    /// Folders have a modification date and other items have facts, so one date serves both.
+    /// Folders have a modification date and other items have facts, so one date serves both, and what a subfolder holds
+    /// may stand in place of a size. A folder of a hundred thousand items is walked twice: half the bytes are half the way.
     struct Entry {
         std::int64_t seconds = 0;
-        std::uint64_t size = 0;
+        std::uint64_t size = 0; // or where the subfolder's entries begin, and 32 bits below, how many there are
         std::uint32_t nanoseconds = 0;
         std::uint32_t nameOffset = 0;
-        std::uint32_t nameLength = 0;
-        std::uint32_t subfolderFirst = 0;
-        std::uint32_t subfolderCount = 0;
+        std::uint16_t nameLength = 0;
         ItemKind kind = ItemKind::other;
         MarkerAnswer marker = MarkerAnswer::absent;
         ItemFlags flags;
-        bool hasDate = false;
-        bool hasFacts = false;
-        bool hasSubfolder = false;
+        bool hasDate : 1 = false;
+        bool hasFacts : 1 = false;
+        bool hasSubfolder : 1 = false;
 
         void take(const FolderItem& item);
     };
@@ -237,6 +250,7 @@ private:
     std::vector<SubfolderEntry> _subfolderEntries;
     std::size_t _subfolderStart = 0; // of the item that is appended next
     std::optional<ItemStatus> _folderStatus;
+    std::optional<ItemStatus> _holderStatus;
     FileProblem _problem = FileProblem::none;
     bool _pathIsReal = false;
     bool _hasLinks = false;
@@ -249,16 +263,16 @@ inline void FolderListing::Entry::take(const FolderItem& item)
     marker = item.marker;
     flags = item.flags;
     hasDate = item.modificationDate.has_value();
-    hasFacts = !hasDate && item.facts.has_value();
+    hasSubfolder = item.subfolder.has_value();
+    hasFacts = !hasDate && !hasSubfolder && item.facts.has_value();
     if (hasDate || hasFacts) {
         const Date date = hasDate ? *item.modificationDate : item.facts->creationDate;
         seconds = date.seconds;
         nanoseconds = date.nanoseconds;
         size = hasFacts ? item.facts->size : 0;
     }
-    hasSubfolder = item.subfolder.has_value();
-    subfolderFirst = hasSubfolder ? item.subfolder->_first : 0;
-    subfolderCount = hasSubfolder ? item.subfolder->_count : 0;
+    if (hasSubfolder)
+        size = std::uint64_t { item.subfolder->_first } << 32 | item.subfolder->_count;
 }
 
 inline FolderItem SubfolderItems::operator[](std::size_t index) const
@@ -295,6 +309,18 @@ inline FolderItem FolderListing::adopted(const FolderItem& item)
     return own;
 }
 
+inline FolderListing FolderListing::inMemoryOf(FolderListing&& spare)
+{
+    FolderListing listing;
+    listing._names = std::move(spare._names);
+    listing._entries = std::move(spare._entries);
+    listing._subfolderEntries = std::move(spare._subfolderEntries);
+    listing._names.clear();
+    listing._entries.clear();
+    listing._subfolderEntries.clear();
+    return listing;
+}
+
 inline void FolderListing::reserve(std::size_t items, std::size_t bytesOfNames)
 {
     // Only the first call knows how much there is; what grows beyond doubles.
@@ -307,12 +333,16 @@ inline void FolderListing::reserve(std::size_t items, std::size_t bytesOfNames)
 inline void FolderListing::append(const FolderItem& item)
 {
     const bool isForeign = item.subfolder && item.subfolder->_listing != this;
-    const std::optional<FolderItem> own = isForeign ? std::optional(adopted(item)) : std::nullopt;
+    return isForeign ? appendOwn(adopted(item)) : appendOwn(item);
+}
+
+inline void FolderListing::appendOwn(const FolderItem& item)
+{
     Entry& entry = _entries.emplace_back();
     entry.nameOffset = static_cast<std::uint32_t>(_names.size());
-    entry.nameLength = static_cast<std::uint32_t>(item.name.size());
+    entry.nameLength = static_cast<std::uint16_t>(item.name.size());
     _names.append(item.name);
-    entry.take(own ? *own : item);
+    entry.take(item);
     noteLinks(item);
 }
 

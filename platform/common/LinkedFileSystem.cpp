@@ -142,12 +142,17 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
     LinkedPlace place = substitutedPlaceOf(folder, LastLink::followed);
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);
+    // Beside the folder as it is spelled, no matter where it lies.
+    if (_table.hasNamedLinks() || place.path != folder)
+        stopping.markerBeside = {};
     // What named links change inside the items is told by listing each by itself.
     if (_table.hasNamedLinks() && (place.path != folder || _table.hasNamedLinkBelow(folder)))
         stopping.subfolder = {};
     FolderListing listing = _real.itemsInFolder(place.path, stopping);
     bool isUnsettled = listing.problem() == FileProblem::linkOnTheWay;
     const bool pathIsReal = !isUnsettled && place.path == folder && isPlainlySpelled(folder);
+    if (listing.problem() != FileProblem::none)
+        stopping.markerBeside = {};
     if (isUnsettled && !_table.hasNamedLinks()) {
         place.path = _real.resolvedPath(place.path);
         listing = _real.itemsInFolder(place.path, stopping);
@@ -183,6 +188,8 @@ FolderListing LinkedFileSystem::listingThatStops(std::string_view folder, const 
     if (_table.mayApplyTo(path) && _table.linkAtOrAbove(path))
         return FolderListing(FileProblem::linkOnTheWay);
     ListingRequest there = request;
+    if (_table.hasNamedLinks())
+        there.markerBeside = {};
     if (_table.hasNamedLinkBelow(path))
         there.subfolder = {};
     FolderListing listing = _real.itemsInFolder(path, there);

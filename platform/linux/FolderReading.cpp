@@ -22,11 +22,14 @@ namespace {
             , _request(request)
             , _asksForMarker(!request.marker.empty() && request.marker.find('\0') == std::string_view::npos)
         {
+            if (request.spare)
+                _listing = FolderListing::inMemoryOf(std::move(*request.spare));
         }
 
         FolderListing listing();
 
     private:
+        void lookBeside();
         void takeBlock(const char* block, std::size_t length);
         void take(const dirent64& entry);
         static ItemKind kindOfItem(int folder, const dirent64& entry);
@@ -51,6 +54,8 @@ namespace {
             if (const auto status = readItemStatus(_folder, "", AT_EMPTY_PATH))
                 _listing.setFolderStatus(*status);
         }
+        if (!_request.markerBeside.empty())
+            lookBeside();
         alignas(dirent64) char block[64 * 1024];
         ssize_t length = 0;
         do {
@@ -65,6 +70,16 @@ namespace {
                 names.applyTo(_listing);
         }
         return std::move(_listing);
+    }
+
+    // The folder is open by a path without links, so what holds it is what the path says.
+    void FolderReader::lookBeside()
+    {
+        _markerPath.assign("../").append(_request.markerBeside);
+        if (uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); }) == -1)
+            return;
+        if (const auto status = readItemStatus(_folder, "..", 0))
+            _listing.setHolderStatus(*status);
     }
 
     void FolderReader::takeBlock(const char* block, std::size_t length)
@@ -82,7 +97,8 @@ namespace {
     void FolderReader::take(const dirent64& entry)
     {
         const std::string_view name = entry.d_name;
-        if (name == "." || name == "..")
+        const bool isHidden = name.front() == '.';
+        if (isHidden && (name == "." || name == ".."))
             return;
         FolderItem item;
         item.name = name;
@@ -98,7 +114,7 @@ namespace {
         }
         if (!_request.subfolder.empty() && item.marker == MarkerAnswer::present && item.kind == ItemKind::folder)
             item.subfolder = itemsOfSubfolder(entry.d_name);
-        _sawHiddenNames = _sawHiddenNames || name == HiddenNames::fileName;
+        _sawHiddenNames = _sawHiddenNames || (isHidden && name == HiddenNames::fileName);
         _listing.append(item);
     }
 

@@ -105,13 +105,16 @@ FolderListing LinuxFileSystem::itemsInFolder(std::string_view folder, const List
     const OpenedFolder opened = openFolder(folder, request.links);
     if (opened.problem != FileProblem::none)
         return FolderListing(opened.problem);
+    const bool pathIsReal
+        = request.links == LinkPolicy::stop && isLexicallyNormalised(folder) && !hasDotComponent(folder);
     // What lies too deep to be named by its whole path is not to be reached from here either.
     ListingRequest reachable = request;
+    if (!pathIsReal || folder == "/")
+        reachable.markerBeside = {};
     if (folder.size() + NAME_MAX + request.subfolder.size() + 2 >= PATH_MAX)
         reachable.subfolder = {};
     FolderListing listing = readOpenFolder(opened.descriptor.number(), reachable);
-    listing.setPathIsReal(
-        request.links == LinkPolicy::stop && isLexicallyNormalised(folder) && !hasDotComponent(folder));
+    listing.setPathIsReal(pathIsReal);
     return listing;
 }
 

@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <ctime>
 #include <string>
+#include <type_traits>
 
 using namespace tests;
 using platform::Date;
@@ -232,4 +233,46 @@ TEST_CASE("where added links lead into one another a listing tells the real path
     }
     CHECK(machine.files.itemsInFolder("/Ombrix Added/to served", {}).otherRealPath() == disk.path("served"));
     CHECK(machine.files.itemsInFolder("/Ombrix Added/to added", {}).otherRealPath() == disk.path("library/two"));
+}
+
+TEST_CASE_TEMPLATE("what a listing tells of the folder that holds it is so, and told where no link is on the way",
+    Machine, OMBRIX_ALL_FILE_MACHINES)
+{
+    const Machine machine;
+    for (const char* path : { "plain/mark", "plain/Media/a.mov", "unmarked/Media/a.mov", "linked/mark", "other/mark",
+             "other/Media/a.mov", "dead/Media/a.mov", "follows/Media/a.mov", "none/mark" })
+        machine.disk.file(path);
+    machine.disk.link("linked/Media", "../other/Media");
+    machine.disk.link("dead/mark", "missing");
+    machine.disk.link("follows/mark", "../plain/mark");
+    setModificationDate(machine.disk.path("linked"), longAgo);
+    constexpr ListingRequest request { .markerBeside = "mark" };
+    Lines told;
+    for (const char* name : { "plain", "unmarked", "linked", "dead", "follows", "none" }) {
+        CAPTURE(name);
+        const std::string holder = machine.root + "/" + name;
+        const FolderListing listing = machine.files.itemsInFolder(holder + "/Media", request);
+        if (!listing.holderStatus())
+            continue;
+        told.emplace_back(name);
+        CHECK(machine.files.exists(holder + "/mark"));
+        CHECK(listing.holderStatus()->modificationDate == machine.files.status(holder)->modificationDate);
+        CHECK(linesOf(listing) == linesOf(machine.files.itemsInFolder(holder + "/Media", {})));
+    }
+    const bool isTold = std::is_same_v<Machine, MachineWithVolumes>;
+    CHECK(told == (isTold ? Lines { "plain", "follows" } : Lines {}));
+}
+
+TEST_CASE_TEMPLATE("a listing in the memory of another tells nothing of that", Machine, OMBRIX_ALL_FILE_MACHINES)
+{
+    const Machine machine;
+    makeOneOfEachKind(machine, "scan");
+    machine.disk.file("few/b.mov");
+    FolderListing listing = machine.files.itemsInFolder(machine.root + "/scan", { .folderStatus = true });
+    listing = machine.files.itemsInFolder(machine.root + "/few", { .spare = &listing });
+    CHECK(linesOf(listing) == Lines { "b.mov" });
+    CHECK_FALSE(listing.folderStatus());
+    CHECK_FALSE(listing.hasLinks());
+    listing = machine.files.itemsInFolder(machine.root + "/scan", { .fileFacts = true, .spare = &listing });
+    CHECK(factsOf(listing) == factsOfOneOfEachKind);
 }

@@ -67,6 +67,12 @@ enum class MarkerAnswer : std::uint8_t {
     link, ///< only with LinkPolicy::stop: a link of that name is there, and was not followed to anything
 };
 
+/// The folder that holds a listed one, links followed.
+struct FolderHolder {
+    bool hasMarker = false;
+    std::optional<Date> modificationDate {}; ///< of one that has the marker
+};
+
 class FolderListing;
 struct FolderItem;
 
@@ -84,8 +90,8 @@ struct ListingRequest {
     std::string_view subfolder {};
     /// The size and the creation date of every item that is neither a folder, nor a link, nor hidden by its name.
     bool fileFacts = false;
-    /// Of the folder that holds the listed one: is there an entry of this name in it, links followed, and what are its
-    /// facts? Not asked when empty.
+    /// Of the folder that holds the listed one: is there an entry of this name in it, links followed, and since when has
+    /// it been as it is? Where there is none, nothing is listed. Not asked when empty.
     std::string_view markerBeside {};
     /// A listing that is needed no longer, or null. It is emptied, and the answer lies in its memory.
     FolderListing* spare = nullptr;
@@ -146,10 +152,9 @@ public:
     /// the request did not ask for them.
     const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
 
-    /// The facts, links followed, of the folder that holds the listed one. Absent where the request did not ask for the
-    /// marker beside, and where that is not there or could not be told in the same pass: then both are to be asked for by
-    /// themselves.
-    const std::optional<ItemStatus>& holderStatus() const noexcept { return _holderStatus; }
+    /// What the request asked of the folder that holds the listed one. Absent where it did not, and where that could not
+    /// be told in the same pass: then it is to be asked for by itself, and all items are listed.
+    const std::optional<FolderHolder>& holder() const noexcept { return _holder; }
 
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
     bool pathIsReal() const noexcept { return _pathIsReal; }
@@ -209,7 +214,7 @@ public:
     /// What has been added to the subfolder of the item that is appended next.
     SubfolderItems takeSubfolder();
     void setFolderStatus(const ItemStatus& status) { _folderStatus = status; }
-    void setHolderStatus(const ItemStatus& status) { _holderStatus = status; }
+    void setHolder(const FolderHolder& holder) { _holder = holder; }
     void setProblem(FileProblem problem) { _problem = problem; }
     void setPathIsReal(bool isReal) { _pathIsReal = isReal; }
     void setOtherRealPath(std::string path) { _otherRealPath = std::move(path); }
@@ -250,7 +255,7 @@ private:
     std::vector<SubfolderEntry> _subfolderEntries;
     std::size_t _subfolderStart = 0; // of the item that is appended next
     std::optional<ItemStatus> _folderStatus;
-    std::optional<ItemStatus> _holderStatus;
+    std::optional<FolderHolder> _holder;
     FileProblem _problem = FileProblem::none;
     bool _pathIsReal = false;
     bool _hasLinks = false;

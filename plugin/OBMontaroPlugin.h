@@ -16,7 +16,7 @@
 #include <string_view>
 #include <vector>
 
-struct EventClips;
+struct ClipScratch;
 struct EventScan;
 struct FoundFolder;
 struct ProjectScan;
@@ -197,7 +197,8 @@ private:
     OBMediaGroupRef eventGroup(
         const platform::Text& library, const FoundFolder& found, const ReadEvent& read, EventScan& scan);
     ReadEvent readEvent(const platform::Text& library, const FoundFolder& folder, const EventScan& scan);
-    EventClips clipsOfEvent(const platform::Text& event, const EventScan& scan);
+    ReadEvent readEventWith(
+        ClipScratch& scratch, const platform::Text& library, const FoundFolder& folder, const EventScan& scan);
     void groupEventsByYear(OBMediaGroup& library, const OBMediaGroupList& events, const EventScan& scan);
     void sortEventsWithinYears(const OBMediaGroup& library);
 

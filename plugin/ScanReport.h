@@ -72,7 +72,8 @@ public:
     }
 
 private:
-    void tell(const ScanRule& rule, bool passed, const platform::FolderItem& item, std::string_view folder) const
+    /// A copy, made only here: whoever walks a listing without an observer need not have its items in memory.
+    void tell(const ScanRule& rule, bool passed, platform::FolderItem item, std::string_view folder) const
     {
         std::string path = platform::pathJoined(folder, item.name);
         const ScanReason reason

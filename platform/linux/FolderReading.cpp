@@ -29,7 +29,7 @@ namespace {
         FolderListing listing();
 
     private:
-        void lookBeside();
+        bool lookBeside();
         void takeBlock(const char* block, std::size_t length);
         void take(const dirent64& entry);
         static ItemKind kindOfItem(int folder, const dirent64& entry);
@@ -54,8 +54,8 @@ namespace {
             if (const auto status = readItemStatus(_folder, "", AT_EMPTY_PATH))
                 _listing.setFolderStatus(*status);
         }
-        if (!_request.markerBeside.empty())
-            lookBeside();
+        if (!_request.markerBeside.empty() && !lookBeside())
+            return std::move(_listing);
         alignas(dirent64) char block[64 * 1024];
         ssize_t length = 0;
         do {
@@ -72,14 +72,17 @@ namespace {
         return std::move(_listing);
     }
 
-    // The folder is open by a path without links, so what holds it is what the path says.
-    void FolderReader::lookBeside()
+    // Whether the items are wanted. The folder is open by a path without links, so what holds it is what the path says.
+    bool FolderReader::lookBeside()
     {
         _markerPath.assign("../").append(_request.markerBeside);
-        if (uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); }) == -1)
-            return;
+        if (uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); }) == -1) {
+            _listing.setHolder({});
+            return false;
+        }
         if (const auto status = readItemStatus(_folder, "..", 0))
-            _listing.setHolderStatus(*status);
+            _listing.setHolder({ true, status->modificationDate });
+        return true;
     }
 
     void FolderReader::takeBlock(const char* block, std::size_t length)

@@ -1,4 +1,4 @@
-// The clips of one event, and the years that they give it.
+// What a folder of a library holds: whether it is an event, its clips, and the years that they give it.
 //
 // The one surprise: every file is a clip, whatever its extension; and a link becomes the file that it leads to, named
 // and placed as that is.
@@ -8,6 +8,7 @@
 #include "plugin/events/EventScan.h"
 
 #include "host/OBConstants.h"
+#include "host/OBMediaGroup.h"
 #include "platform/Calendar.h"
 #include "platform/PathText.h"
 
@@ -26,8 +27,9 @@ constexpr int yearOfNoDate = -1;
 constexpr int latestRecordedYear = 9999;
 constexpr std::string_view dateFormat = "%-d %b %Y"; // for people who ask about a clip
 
-/// Names and flags of the entries, and what a clip's list and an event's year need of each file.
-constexpr platform::ListingRequest clipListing { .fileFacts = true };
+/// Names and flags of the entries, what a clip's list and an event's year need of each file, and whether it is an event.
+constexpr platform::ListingRequest clipListing { .fileFacts = true,
+    .markerBeside = MontaroEventIdentifierPathComponent };
 
 /// The years of dates. Clips of one event were mostly shot in one year, so a date between two that were asked for needs
 /// no calendar.
@@ -38,10 +40,11 @@ public:
     {
     }
 
-    int yearOf(const Date& date)
+    int yearOf(Date date) { return _first <= date && date <= _last ? _year : yearByCalendar(date); }
+
+private:
+    int yearByCalendar(Date date)
     {
-        if (_first <= date && date <= _last)
-            return _year;
         const int year = _calendar.yearOfDate(date);
         if (year != _year || _last < _first) {
             _year = year;
@@ -52,7 +55,6 @@ public:
         return year;
     }
 
-private:
     const platform::Calendar& _calendar;
     int _year = 0;
     Date _first { 1, 0 };
@@ -63,7 +65,7 @@ private:
 struct FoundFile {
     std::string_view entry; ///< what the folder of clips calls it
     std::string_view path; ///< where it lies; elsewhere for a link
-    const std::optional<platform::FileFacts>& facts;
+    std::optional<platform::FileFacts> facts {};
     bool isLinked = false;
     bool isPlainFile = false;
 };
@@ -80,11 +82,13 @@ struct ClipYear {
 /// Reads the folder of one event's clips, in listing order.
 class OBMontaroPlugin::ClipReader {
 public:
-    ClipReader(OBMontaroPlugin& plugin, const EventScan& scan, const Text& folder)
+    /// The listing of `folder` lies in `scratch`, which outlives the reader.
+    ClipReader(OBMontaroPlugin& plugin, const EventScan& scan, const Text& folder, ClipScratch& scratch)
         : _plugin(plugin)
         , _scan(scan)
         , _years(plugin.platform().calendar)
-        , _listing(plugin.readFolder(folder, clipListing))
+        , _listing(scratch.listing)
+        , _plainClips(scratch.files)
     {
         _result.folder = folder;
         _result.problem = _listing.problem();
@@ -96,8 +100,9 @@ public:
 private:
     Text realFolder() const;
     std::string entryPath(std::string_view name) const { return platform::pathJoined(_result.folder, name); }
-    void takeLink(const FolderItem& link);
+    void takeLink(std::string_view name);
     void take(const FoundFile& file);
+    void explain(const FoundFile& file, const ClipYear& year) const;
     ClipYear yearOf(const FoundFile& file, const std::optional<Date>& recorded);
     std::optional<Date> fileDate(const FoundFile& file) const;
     void addClip(std::string_view name, const FoundFile& file);
@@ -106,9 +111,9 @@ private:
     OBMontaroPlugin& _plugin;
     const EventScan& _scan;
     YearsOfDates _years;
-    const platform::FolderListing _listing;
+    const platform::FolderListing& _listing;
+    std::vector<OBFileOfFolder>& _plainClips; // not yet among the clips
     Text _realFolder {};
-    std::vector<OBFileOfFolder> _plainClips {}; // not yet among the clips
     EventClips _result {};
 };
 
@@ -119,17 +124,19 @@ EventClips OBMontaroPlugin::ClipReader::read()
     _scan.report.found([&] { return findings::clipsFolder(_result.folder, _listing.size()); });
     _realFolder = realFolder();
     _plainClips.reserve(_listing.size());
-    std::string path(_realFolder);
+    const bool isElsewhere = _realFolder != _result.folder;
+    std::string path = std::string(_realFolder) + '/';
+    const std::size_t folderLength = path.size();
     for (const FolderItem item : _listing) {
         if (!_scan.report.passes(rules::nameIsNotHidden, item, _result.folder))
             continue;
         if (item.kind == ItemKind::symbolicLink) {
-            takeLink(item);
+            takeLink(item.name);
             continue;
         }
-        path.resize(_realFolder.size());
-        path.append(1, '/').append(item.name);
-        if (_realFolder != _result.folder)
+        path.resize(folderLength);
+        path.append(item.name);
+        if (isElsewhere)
             _scan.report.linkFollowed([&] { return entryPath(item.name); }, path);
         if (_scan.report.passes(rules::isVisible, item, _result.folder)
             && _scan.report.passes(rules::isNoFolder, item, _result.folder))
@@ -150,15 +157,15 @@ Text OBMontaroPlugin::ClipReader::realFolder() const
     return Text(std::string_view(path).substr(path == "/" ? 1 : 0));
 }
 
-void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
+void OBMontaroPlugin::ClipReader::takeLink(std::string_view name)
 {
     const platform::FileSystem& files = _plugin.platform().fileSystem;
-    const std::string path = files.resolvedPath(entryPath(link.name));
-    _scan.report.linkFollowed([&] { return entryPath(link.name); }, path);
-    _scan.report.found([&] { return findings::linkedClip(entryPath(link.name), path, files.exists(path)); });
+    const std::string path = files.resolvedPath(entryPath(name));
+    _scan.report.linkFollowed([&] { return entryPath(name); }, path);
+    _scan.report.found([&] { return findings::linkedClip(entryPath(name), path, files.exists(path)); });
     FolderItem target;
-    target.name = link.name;
-    target.kind = link.kind;
+    target.name = name;
+    target.kind = ItemKind::symbolicLink;
     target.flags = files.itemFlags(path);
     if (!_scan.report.passes(rules::targetIsVisible, target, _result.folder)
         || !_scan.report.passes(rules::targetIsNoFolder, target, _result.folder))
@@ -166,20 +173,30 @@ void OBMontaroPlugin::ClipReader::takeLink(const FolderItem& link)
     std::optional<platform::FileFacts> facts;
     if (const auto status = files.status(path))
         facts = { status->creationDate, status->size };
-    take({ link.name, path, facts, true });
+    take({ name, path, facts, true });
 }
 
 /// A file among the clips is named and placed as its folder says; any other is a clip by itself.
 void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
 {
     const std::optional<Date> recorded = _plugin._dateFromExtendedFileAttributeAtPath(file.path);
-    if (recorded)
+    if (recorded) {
         addClip(_plugin.platform().calendar.textOfDate(*recorded, _scan.clipNameFormat), file);
-    else if (file.isLinked)
+    } else if (file.isLinked) {
         addClip(platform::nameWithoutExtension(platform::lastPathComponent(file.path)), file);
-    else
-        _plainClips.push_back({ file.entry, file.isPlainFile, file.facts });
+    } else {
+        OBFileOfFolder& clip = _plainClips.emplace_back();
+        clip.name = file.entry;
+        clip.isPlainFile = file.isPlainFile;
+        clip.facts = file.facts;
+    }
     const ClipYear year = yearOf(file, recorded);
+    if (_scan.report.isObserved())
+        explain(file, year);
+}
+
+void OBMontaroPlugin::ClipReader::explain(const FoundFile& file, const ClipYear& year) const
+{
     const auto path = [&] { return entryPath(file.entry); };
     _scan.report.foundRecord(path, [&] {
         const platform::Calendar& calendar = _plugin.platform().calendar;
@@ -192,15 +209,20 @@ void OBMontaroPlugin::ClipReader::take(const FoundFile& file)
 /// the event.
 ClipYear OBMontaroPlugin::ClipReader::yearOf(const FoundFile& file, const std::optional<Date>& recorded)
 {
-    ClipYear found;
-    if (recorded)
-        found = { _plugin.platform().calendar.yearOfDate(*recorded), recorded, true };
-    if (found.year < 0 || found.year > latestRecordedYear) {
-        const std::optional<Date> ofFile = fileDate(file);
-        found = { ofFile ? _years.yearOf(*ofFile) : yearOfNoDate, ofFile, false };
+    if (recorded) {
+        const int year = _plugin.platform().calendar.yearOfDate(*recorded);
+        if (year >= 0 && year <= latestRecordedYear) {
+            _result.dates.take(year, recorded);
+            return { year, recorded, true };
+        }
     }
-    _result.dates.take(found.year, recorded ? recorded : found.date);
-    return found;
+    const std::optional<Date> ofFile = fileDate(file);
+    const int year = ofFile ? _years.yearOf(*ofFile) : yearOfNoDate;
+    if (recorded)
+        _result.dates.take(year, recorded);
+    else
+        _result.dates.take(year, ofFile);
+    return { year, ofFile, false };
 }
 
 std::optional<Date> OBMontaroPlugin::ClipReader::fileDate(const FoundFile& file) const
@@ -239,9 +261,36 @@ void OBMontaroPlugin::ClipReader::addPlainClips()
     _plainClips.clear();
 }
 
-EventClips OBMontaroPlugin::clipsOfEvent(const Text& event, const EventScan& scan)
+/// Looks into one folder of `library`. Any thread.
+ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& folder, const EventScan& scan)
 {
-    return ClipReader(*this, scan, Text::joined(event, "/", clipsFolder)).read();
+    ClipScratch scratch = scan.scratches->take();
+    ReadEvent event = readEventWith(scratch, library, folder, scan);
+    scan.scratches->giveBack(std::move(scratch));
+    return event;
+}
+
+/// From the open folder of clips what holds it is nearer than along the whole path. Where it is no event nothing is read.
+ReadEvent OBMontaroPlugin::readEventWith(
+    ClipScratch& scratch, const Text& library, const FoundFolder& folder, const EventScan& scan)
+{
+    const Text clips = Text::joined(folder.path, "/", clipsFolder);
+    platform::ListingRequest request = clipListing;
+    request.spare = &scratch.listing;
+    scratch.listing = readFolder(clips, request);
+    const std::optional<platform::FolderHolder>& holder = scratch.listing.holder();
+
+    FolderItem item;
+    item.name = folder.name;
+    item.kind = ItemKind::folder;
+    item.flags.container = true;
+    const bool isEvent = holder ? holder->hasMarker : _isMTEvent(folder.path);
+    item.marker = isEvent ? platform::MarkerAnswer::present : platform::MarkerAnswer::absent;
+    if (!scan.report.passes(rules::hasEventMarker, item, library))
+        return {};
+    const std::optional<Date> modificationDate
+        = holder ? holder->modificationDate : OBMediaGroup::modDateForFile(folder.path);
+    return { true, modificationDate, ClipReader(*this, scan, clips, scratch).read() };
 }
 
 /// Clips carry no date of their recording yet; whatever reads one goes here.

@@ -157,19 +157,6 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     return carrier;
 }
 
-/// Looks into one folder of `library`. Any thread.
-ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& folder, const EventScan& scan)
-{
-    FolderItem item;
-    item.name = folder.name;
-    item.kind = platform::ItemKind::folder;
-    item.flags.container = true;
-    item.marker = _isMTEvent(folder.path) ? platform::MarkerAnswer::present : platform::MarkerAnswer::absent;
-    if (!scan.report.passes(rules::hasEventMarker, item, library))
-        return {};
-    return { true, OBMediaGroup::modDateForFile(folder.path), clipsOfEvent(folder.path, scan) };
-}
-
 /// One event of `library`; null when it has no clips. The flat list shows it all the same where its folder of clips
 /// holds anything at all.
 OBMediaGroupRef OBMontaroPlugin::eventGroup(

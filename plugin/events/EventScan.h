@@ -7,11 +7,43 @@
 #include "host/OBMediaObject.h"
 #include "host/OBMediaObjectList.h"
 #include "platform/FileSystem.h"
+#include "platform/ThreadSafety.h"
 
 #include <memory>
 #include <optional>
 #include <string_view>
 #include <utility>
+#include <vector>
+
+/// Memory in which a folder of clips is read. Taken anew for each folder, it would come to lie scattered among the records
+/// that stay.
+struct ClipScratch {
+    platform::FolderListing listing {};
+    std::vector<OBFileOfFolder> files {};
+};
+
+/// What threads that read one folder after another keep between them. Any thread.
+class ClipScratches {
+public:
+    ClipScratch take()
+    {
+        platform::Locked guard(_lock);
+        if (_spare.empty())
+            return {};
+        ClipScratch scratch = std::move(_spare.back());
+        _spare.pop_back();
+        return scratch;
+    }
+    void giveBack(ClipScratch scratch)
+    {
+        platform::Locked guard(_lock);
+        _spare.push_back(std::move(scratch));
+    }
+
+private:
+    platform::Mutex _lock;
+    std::vector<ClipScratch> _spare GUARDED_BY(_lock);
+};
 
 /// What one scan of the event libraries carries through its folders. Several threads read it; the list of groups is
 /// extended by the scanning thread alone.
@@ -22,6 +54,7 @@ struct EventScan {
     platform::Text clipNameFormat; ///< of clips that carry the date of their recording
     OBImageRef eventIcon;
     OBImageRef calendarIcon;
+    std::unique_ptr<ClipScratches> scratches = std::make_unique<ClipScratches>();
 
     void addToFlatGroups(OBMediaGroupRef group)
     {

@@ -235,7 +235,8 @@ TEST_CASE("where added links lead into one another a listing tells the real path
     CHECK(machine.files.itemsInFolder("/Ombrix Added/to added", {}).otherRealPath() == disk.path("library/two"));
 }
 
-TEST_CASE_TEMPLATE("what a listing tells of the folder that holds it is so, and told where no link is on the way",
+TEST_CASE_TEMPLATE(
+    "a listing tells of the folder that holds it where no link is on the way, and is empty where that lacks the marker",
     Machine, OMBRIX_ALL_FILE_MACHINES)
 {
     const Machine machine;
@@ -250,17 +251,21 @@ TEST_CASE_TEMPLATE("what a listing tells of the folder that holds it is so, and 
     Lines told;
     for (const char* name : { "plain", "unmarked", "linked", "dead", "follows", "none" }) {
         CAPTURE(name);
-        const std::string holder = machine.root + "/" + name;
-        const FolderListing listing = machine.files.itemsInFolder(holder + "/Media", request);
-        if (!listing.holderStatus())
+        const std::string folder = machine.root + "/" + name;
+        const FolderListing listing = machine.files.itemsInFolder(folder + "/Media", request);
+        const std::optional<platform::FolderHolder>& holder = listing.holder();
+        const bool isUnmarked = holder && !holder->hasMarker;
+        CHECK(
+            linesOf(listing) == (isUnmarked ? Lines {} : linesOf(machine.files.itemsInFolder(folder + "/Media", {}))));
+        if (!holder)
             continue;
         told.emplace_back(name);
-        CHECK(machine.files.exists(holder + "/mark"));
-        CHECK(listing.holderStatus()->modificationDate == machine.files.status(holder)->modificationDate);
-        CHECK(linesOf(listing) == linesOf(machine.files.itemsInFolder(holder + "/Media", {})));
+        CHECK(machine.files.exists(folder + "/mark") == holder->hasMarker);
+        if (holder->hasMarker)
+            CHECK(holder->modificationDate == machine.files.status(folder)->modificationDate);
     }
     const bool isTold = std::is_same_v<Machine, MachineWithVolumes>;
-    CHECK(told == (isTold ? Lines { "plain", "follows" } : Lines {}));
+    CHECK(told == (isTold ? Lines { "plain", "unmarked", "dead", "follows" } : Lines {}));
 }
 
 TEST_CASE_TEMPLATE("a listing in the memory of another tells nothing of that", Machine, OMBRIX_ALL_FILE_MACHINES)

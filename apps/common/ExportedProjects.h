@@ -1,9 +1,12 @@
 #pragma once
 
+#include "apps/common/ClipboardOffer.h"
+
 #include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace platform {
 class Pasteboard;
@@ -11,9 +14,13 @@ class Pasteboard;
 
 namespace apps {
 
-/// Has `write` fill a pasteboard, and answers what it wrote of `type` as an XML property list; absent where it wrote
-/// none.
-std::optional<std::string> propertyListWritten(
-    std::string_view type, const std::function<void(platform::Pasteboard&)>& write);
+/// What a person copied.
+struct Exported {
+    std::optional<std::string> propertyList {}; ///< as XML; absent where none was written
+    std::vector<ClipboardItem> items {}; ///< all that was written, as the desktop takes it
+};
+
+/// Has `write` fill a pasteboard, and answers what it wrote, `type` being the one whose property list is wanted.
+Exported exportedBy(const std::function<void(platform::Pasteboard&)>& write, std::string_view type);
 
 } // namespace apps

@@ -76,10 +76,12 @@ namespace {
         { "--object", "", "PATH", "a movie; the first with that path counts", false, true },
         { "--in", "", "ID", "of those set on the group ID itself", false, true },
         { "--group", "", "ID", "a group; the first with that ID counts", false, true },
+        { "--clipboard", "", "", "offer it on the desktop's clipboard too, with the files" },
     };
     constexpr Example exportExamples[] {
         { "ombrix export --group ~/\"Movies/Montaro Projects/Trip\"", "one project, all that was rendered" },
         { "ombrix export --object a.mov --in Montaro --object b.mov", "two movies, one of them of the root" },
+        { "ombrix export --clipboard --object a.mov", "a movie to paste elsewhere" },
     };
 
     constexpr OptionInfo pathsOptions[] { zero, json };
@@ -204,7 +206,9 @@ namespace {
         { "export", Intent::act, "", 0, "print what copying gives the editor",
             "Loads once and prints the property list that copying or dragging the movies or\n"
             "groups would hand to the editor, as XML: the projects that they belong to, each\n"
-            "with all that was rendered of it. Prints nothing where none is written.",
+            "with all that was rendered of it. Prints nothing where none is written.\n"
+            "With --clipboard the files can be pasted in other programs as well, until\n"
+            "something else is copied; waits 2 seconds at most for the desktop.",
             exportOptions, true, exportExamples, runExport },
         { "explain", Intent::ask, "PATH...", anyNumber, "say why files and folders are or are not in the tree",
             "Loads once and prints, for each path, every rule that it met on its way, the\n"

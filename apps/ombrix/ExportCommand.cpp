@@ -1,5 +1,6 @@
-// "export": the property list that the source writes when a person copies or drags.
+// "export": what the source writes when a person copies or drags, and the desktop's clipboard for it.
 
+#include "apps/common/DesktopClipboard.h"
 #include "apps/common/ExportedProjects.h"
 #include "apps/ombrix/AbsolutePath.h"
 #include "apps/ombrix/Commands.h"
@@ -83,6 +84,44 @@ namespace {
         return true;
     }
 
+    /// Absent after having said why.
+    std::optional<apps::Exported> exported(Program& program, const Selection& selection)
+    {
+        const OBMediaGroupRef root = program.load();
+        if (!root)
+            return std::nullopt;
+        OBMediaObjectList objects;
+        for (const WantedObject& wanted : selection.objects) {
+            if (!addObject(program, root, wanted, objects))
+                return std::nullopt;
+        }
+        OBMediaGroupList groups;
+        for (const std::string& identifier : selection.groups) {
+            if (!addGroup(program, root, identifier, groups))
+                return std::nullopt;
+        }
+        const auto write = [&](platform::Pasteboard& pasteboard) {
+            if (groups.empty())
+                program.manager()->writeMediaObjects_toPasteboard(objects, pasteboard);
+            else
+                program.manager()->writeMediaGroups_toPasteboard(groups, pasteboard);
+        };
+        return apps::exportedBy(write, projectsType);
+    }
+
+    /// False after having said why.
+    bool offer(Program& program, apps::DesktopClipboard& clipboard, const std::vector<apps::ClipboardItem>& items)
+    {
+        if (items.empty()) {
+            program.warn("nothing to copy: no file of the selection is there, so the clipboard is left as it was");
+            return true;
+        }
+        const auto problem = clipboard.offer(items);
+        if (problem)
+            program.fail(problem->place, problem->what);
+        return !problem;
+    }
+
 } // namespace
 
 int runExport(Program& program)
@@ -90,27 +129,18 @@ int runExport(Program& program)
     const Selection selection = selectionOf(program.arguments());
     if (!selection.problem.empty())
         return program.failUsage("export: " + selection.problem);
-    const OBMediaGroupRef root = program.load();
-    if (!root)
+    const bool isForClipboard = program.arguments().has("--clipboard");
+    apps::DesktopClipboard clipboard;
+    if (isForClipboard) {
+        // Before the load, so that nobody waits for a large library in vain.
+        if (const auto problem = clipboard.open())
+            return program.fail(problem->place, problem->what);
+    }
+    const std::optional<apps::Exported> written = exported(program, selection);
+    if (!written || (isForClipboard && !offer(program, clipboard, written->items)))
         return failed;
-    OBMediaObjectList objects;
-    for (const WantedObject& wanted : selection.objects) {
-        if (!addObject(program, root, wanted, objects))
-            return failed;
-    }
-    OBMediaGroupList groups;
-    for (const std::string& identifier : selection.groups) {
-        if (!addGroup(program, root, identifier, groups))
-            return failed;
-    }
-    const auto written = apps::propertyListWritten(projectsType, [&](platform::Pasteboard& pasteboard) {
-        if (groups.empty())
-            program.manager()->writeMediaObjects_toPasteboard(objects, pasteboard);
-        else
-            program.manager()->writeMediaGroups_toPasteboard(groups, pasteboard);
-    });
-    if (written)
-        program.output().write(*written);
+    if (written->propertyList)
+        program.output().write(*written->propertyList);
     return done;
 }
 

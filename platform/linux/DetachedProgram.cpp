@@ -16,7 +16,7 @@ namespace {
 
     // Between fork and exec only what POSIX calls async-signal-safe may be called: another thread of the parent may
     // have held any lock.
-    [[noreturn]] void become(char* const* arguments, const char* workingFolder, int problemPipe)
+    [[noreturn]] void become(char* const* arguments, const char* workingFolder, int channel, int problemPipe)
     {
         sigset_t none;
         sigemptyset(&none);
@@ -24,7 +24,7 @@ namespace {
         signal(SIGPIPE, SIG_DFL);
         const int nowhere = open("/dev/null", O_RDWR);
         for (int standard = 0; nowhere >= 0 && standard <= 2; ++standard)
-            dup2(nowhere, standard);
+            dup2(standard < 2 && channel >= 0 ? channel : nowhere, standard);
         int problem = 0;
         if (chdir(workingFolder) == -1)
             problem = errno;
@@ -45,7 +45,8 @@ namespace {
 
 } // namespace
 
-std::string startDetachedProgram(const std::vector<std::string>& arguments, const std::string& workingFolder)
+std::string startDetachedProgram(
+    const std::vector<std::string>& arguments, const std::string& workingFolder, int channel)
 {
     if (arguments.empty())
         return "no program is named";
@@ -68,7 +69,7 @@ std::string startDetachedProgram(const std::vector<std::string>& arguments, cons
         setsid();
         const pid_t grandchild = fork();
         if (grandchild == 0)
-            become(texts.data(), folder, ends[1]);
+            become(texts.data(), folder, channel, ends[1]);
         if (grandchild == -1) {
             const int problem = errno;
             static_cast<void>(!write(ends[1], &problem, sizeof(problem)));

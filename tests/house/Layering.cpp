@@ -55,6 +55,8 @@ namespace {
                 {}, true, "apps/common knows host/, roles and the machines it chooses from" },
             { "apps/browser", { "host", "platform", "apps/common" }, { "Q" }, false,
                 "the window knows host/, roles, apps/common and its toolkit" },
+            { "apps/clipboard", { "platform", "apps/common" }, { "Q" }, true,
+                "the clipboard's program knows roles, apps/common, its toolkit and the system" },
             { "apps", { "host", "platform", "apps/common" }, {}, false,
                 "a program knows host/, roles and apps/common; machines and the system lie behind them" },
             { "examples/folders", { publicHost, "platform" }, {}, false,

@@ -76,12 +76,12 @@ namespace {
         { "--object", "", "PATH", "a movie; the first with that path counts", false, true },
         { "--in", "", "ID", "of those set on the group ID itself", false, true },
         { "--group", "", "ID", "a group; the first with that ID counts", false, true },
-        { "--clipboard", "", "", "offer it on the desktop's clipboard too, with the files" },
+        { "--clipboard", "", "", "offer it and the files on the clipboard too" },
     };
     constexpr Example exportExamples[] {
         { "ombrix export --group ~/\"Movies/Montaro Projects/Trip\"", "one project, all that was rendered" },
-        { "ombrix export --object a.mov --in Montaro --object b.mov", "two movies, one of them of the root" },
-        { "ombrix export --clipboard --object a.mov", "a movie to paste elsewhere" },
+        { "ombrix export --clipboard --object a.mov --in Montaro --object b.mov",
+            "two movies, one of them of the root, to paste elsewhere" },
     };
 
     constexpr OptionInfo pathsOptions[] { zero, json };

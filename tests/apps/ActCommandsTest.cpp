@@ -165,3 +165,14 @@ TEST_CASE("export refuses what is mixed up or not there")
         machine.project + ": no object of that group has this path");
     CHECK(machine.run({ "export", "--group", "nothing" }).status == 1);
 }
+
+TEST_CASE("export for the clipboard fails at once, and loads nothing, where there is no display")
+{
+    MachineToActOn machine;
+    const std::string problem = "clipboard: there is no display (neither DISPLAY nor WAYLAND_DISPLAY is set)";
+    checkRefused(machine.run({ "export", "--clipboard", "--group", machine.project }), 1, problem);
+    DescribedMachine().home(machine.disk.path("home")).write(machine.disk.path("machine.json"));
+    checkRefused(machine.run({ "export", "--clipboard", "--group", machine.project }), 1, problem);
+    checkRefused(machine.run({ "export", "--clipboard" }), 2,
+        "export: --object PATH or --group ID is missing (\"ombrix help export\")");
+}

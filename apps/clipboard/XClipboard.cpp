@@ -26,6 +26,8 @@ void narrowToolkit()
     ::setenv("QT_QPA_PLATFORMTHEME", "generic", 1);
     ::setenv("QT_IM_MODULE", "none", 1);
     ::setenv("QT_XCB_GL_INTEGRATION", "none", 1);
+    ::setenv("QT_NO_GLIB", "1", 1);
+    ::setenv("DBUS_SESSION_BUS_ADDRESS", "disabled:", 1);
     for (const char* const name : { "SESSION_MANAGER", "QT_LINUX_ACCESSIBILITY_ALWAYS_ON", "QT_ACCESSIBILITY" })
         ::unsetenv(name);
 }

@@ -3,4 +3,4 @@
 
 #include <xdg-shell-client-protocol.h>
 
-#include <xdg-shell-protocol.c>
+#include <xdg-shell-protocol.c> // NOLINT(bugprone-suspicious-include)

@@ -51,6 +51,7 @@ std::string startDetachedProgram(
     if (arguments.empty())
         return "no program is named";
     std::vector<char*> texts;
+    texts.reserve(arguments.size() + 1);
     for (const std::string& argument : arguments)
         texts.push_back(const_cast<char*>(argument.c_str()));
     texts.push_back(nullptr);

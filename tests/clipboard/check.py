@@ -99,9 +99,11 @@ def main():
     kind, program = sys.argv[1:]
     with exporting.machine_folder() as folder:
         exporter = Exporter(program, folder)
-        {"none": check_none, "x": check_x, "wayland": check_wayland}[kind](exporter)
-        exporter.no_helper_stays()
-        exporter.check_reports()
+        try:
+            {"none": check_none, "x": check_x, "wayland": check_wayland}[kind](exporter)
+            exporter.no_helper_stays()
+        finally:
+            exporter.check_reports()
 
 
 if __name__ == "__main__":

@@ -122,10 +122,10 @@ class Exporter:
             try:
                 program = os.readlink(f"/proc/{process}/exe")
                 with open(f"/proc/{process}/environ", "rb") as file:
-                    isOurs = self.mark.encode() in file.read().split(b"\0")
+                    is_ours = self.mark.encode() in file.read().split(b"\0")
             except OSError:
                 continue
-            if isOurs and os.path.basename(program) == HELPER:
+            if is_ours and os.path.basename(program) == HELPER:
                 found.append(int(process))
         return found
 

@@ -65,7 +65,7 @@ void ManagerState::performReload(std::string_view part, const std::function<void
         const auto again = [this, manager = _manager.shared_from_this(), cause = WorkCause::current(),
                                name = std::string(part), reload] {
             const WorkCause kept(cause);
-            performReload(name, reload);
+            callSource("reload", [&] { performReload(name, reload); });
         };
         {
             std::lock_guard guard(_lock);

@@ -7,6 +7,8 @@
 #include "host/ManagerState.h"
 
 #include "host/CurrentWork.h"
+#include "host/SourceCall.h"
+#include "platform/Console.h"
 #include "platform/Notifications.h"
 #include "platform/Threads.h"
 
@@ -14,9 +16,6 @@
 #include <cmath>
 
 namespace {
-
-/// Observers hear of progress at most ten times a second.
-constexpr std::chrono::nanoseconds progressInterval = std::chrono::milliseconds(100);
 
 /// The manager whose load runs on this thread.
 thread_local const ManagerState* loadingOnThisThread = nullptr;
@@ -35,21 +34,6 @@ ManagerState::ManagerState(OBMediaManager& manager, const OBManagerContext& cont
     , bundle(context._bundle)
     , _manager(manager)
 {
-}
-
-void ManagerState::Progress::restart()
-{
-    isLoading = true;
-    foldersDone = 0;
-    itemsFound = 0;
-    itemsSkipped = 0;
-    pathAtWork.store({});
-}
-
-OBLoadProgress ManagerState::Progress::now() const
-{
-    const auto [path, since] = pathAtWork.load();
-    return { isLoading, foldersDone, itemsFound, itemsSkipped, path, since };
 }
 
 void ManagerState::requestTree(const OBExecutor& executor, std::function<void(OBLoadResult)> completion)
@@ -148,7 +132,7 @@ void ManagerState::startLoadThread()
         ++_loadNumber;
     }
     core->log("a load could not start: the system gives no thread", 1, &_manager);
-    finishLoad(OBLoadOutcome::unavailable);
+    finishLoad({ OBLoadOutcome::unavailable });
 }
 
 void ManagerState::runLoads()
@@ -179,23 +163,46 @@ bool ManagerState::beginLoad(Job& job)
     return true;
 }
 
-OBLoadOutcome ManagerState::runLoad(Job job)
+OBLoadResult ManagerState::runLoad(Job job)
 {
     progress.restart();
     core->platform().threads.setNiceOfCurrentThread(niceForPriority(loadThreadPriority));
     loadingOnThisThread = this;
-    OBLoadOutcome outcome = OBLoadOutcome::loaded;
-    if (job == Job::performOnly)
-        performLoad();
-    else if (_manager.canLoadData())
-        _manager.loadData();
-    else
-        outcome = OBLoadOutcome::unavailable;
+    OBLoadResult result;
+    bool canLoad = true;
+    result.problem = errorThrownBy([&] { canLoad = callLoad(job); });
     loadingOnThisThread = nullptr;
-    return gate.isCancelPending() ? OBLoadOutcome::cancelled : outcome;
+    if (!result.problem.empty()) {
+        result.outcome = OBLoadOutcome::failed;
+        core->log("the load failed: " + result.problem, 1, &_manager);
+    } else if (gate.isCancelPending()) {
+        result.outcome = OBLoadOutcome::cancelled;
+    } else if (!canLoad) {
+        result.outcome = OBLoadOutcome::unavailable;
+    }
+    return result;
 }
 
-void ManagerState::finishLoad(OBLoadOutcome outcome)
+bool ManagerState::callLoad(Job job)
+{
+    if (job == Job::performOnly) {
+        performLoad();
+        return true;
+    }
+    const bool canLoad = _manager.canLoadData();
+    if (canLoad)
+        _manager.loadData();
+    return canLoad;
+}
+
+void ManagerState::callSource(std::string_view name, const std::function<void()>& call) const
+{
+    const std::string error = errorThrownBy(call);
+    if (!error.empty())
+        core->platform().console.log(bundle->identifier().string() + ": error in " + std::string(name) + ": " + error);
+}
+
+void ManagerState::finishLoad(OBLoadResult result)
 {
     progress.isLoading = false;
     progress.pathAtWork.store({});
@@ -207,7 +214,7 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
         wasActive = std::exchange(_loadActive, false);
         // Asked again, a load that gave no whole tree starts over; by itself it does not, or a cancel would never be
         // one.
-        _needsReload = _needsReload || outcome != OBLoadOutcome::loaded;
+        _needsReload = _needsReload || result.outcome != OBLoadOutcome::loaded;
         const auto later = std::stable_partition(
             _waiters.begin(), _waiters.end(), [this](const Waiter& waiter) { return waiter.load <= _loadNumber; });
         answered.assign(std::make_move_iterator(_waiters.begin()), std::make_move_iterator(later));
@@ -217,7 +224,7 @@ void ManagerState::finishLoad(OBLoadOutcome outcome)
     if (wasActive)
         endWork();
     core->pathWatcher().resumeReports(&_manager);
-    const OBLoadResult result { outcome, root.load() };
+    result.rootMediaGroup = root.load();
     deliver(std::move(answered), result);
     for (const auto& observer : listening) {
         if (observer->callbacks.loadEnded) {
@@ -286,88 +293,7 @@ void ManagerState::end()
         center->removeObserver(token);
     for (const auto& observer : listening)
         observer->takenBack = true;
-    deliver(std::move(waiting), { OBLoadOutcome::ended, nullptr });
-}
-
-std::shared_ptr<ManagerObserver> ManagerState::addObserver(OBExecutor executor, OBManagerCallbacks callbacks)
-{
-    auto observer = std::make_shared<ManagerObserver>();
-    observer->executor = std::move(executor);
-    observer->callbacks = std::move(callbacks);
-    bool start = false;
-    {
-        std::lock_guard guard(_lock);
-        if (_ended)
-            return observer;
-        _observers.push_back(observer);
-        start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
-    }
-    if (start)
-        startLoadThread();
-    return observer;
-}
-
-void ManagerState::removeObserver(const std::shared_ptr<ManagerObserver>& observer)
-{
-    observer->takenBack = true;
-    std::lock_guard guard(_lock);
-    std::erase(_observers, observer);
-}
-
-ManagerState::Observers ManagerState::observers() const
-{
-    std::lock_guard guard(_lock);
-    return _observers;
-}
-
-bool ManagerState::publishRoot(const OBMediaGroupRef& group)
-{
-    Observers listening;
-    {
-        std::lock_guard guard(_lock);
-        std::erase_if(_formerRoots, [](const std::weak_ptr<OBMediaGroup>& former) { return former.expired(); });
-        const auto isGroup = [&](const std::weak_ptr<OBMediaGroup>& former) { return former.lock() == group; };
-        if (std::any_of(_formerRoots.begin(), _formerRoots.end(), isGroup))
-            return false;
-        if (const OBMediaGroupRef before = root.exchange(group); before && before != group)
-            _formerRoots.push_back(before);
-        listening = _observers;
-    }
-    for (const auto& observer : listening) {
-        if (!observer->callbacks.rootPublished && !observer->callbacks.published)
-            continue;
-        const auto tell = [observer, manager = _manager.weak_from_this(),
-                              publication = CurrentWork::publicationOf(core->platform(), group)] {
-            // Two threads may hand over in another order than they published in: what is out of date is not told.
-            const auto alive = manager.lock();
-            if (!alive || alive->rootMediaGroup() != publication.rootMediaGroup)
-                return;
-            if (!observer->takenBack && observer->callbacks.rootPublished)
-                observer->callbacks.rootPublished(publication.rootMediaGroup);
-            if (!observer->takenBack && observer->callbacks.published)
-                observer->callbacks.published(publication);
-        };
-        observer->executor(tell);
-    }
-    return true;
-}
-
-void ManagerState::beginPath(const platform::Text& path)
-{
-    const std::chrono::nanoseconds time = core->platform().clock.monotonic();
-    progress.pathAtWork.store({ path, time });
-    const std::int64_t now = time.count();
-    std::int64_t last = progress.lastTold;
-    if (now - last < progressInterval.count() || !progress.lastTold.compare_exchange_strong(last, now))
-        return;
-    for (const auto& observer : observers()) {
-        if (observer->callbacks.progressed) {
-            observer->executor([observer, state = progress.now()] {
-                if (!observer->takenBack)
-                    observer->callbacks.progressed(state);
-            });
-        }
-    }
+    deliver(std::move(waiting), { OBLoadOutcome::ended });
 }
 
 void ManagerState::addNotification(platform::NotificationCenter& center, platform::NotificationCenter::Token token)

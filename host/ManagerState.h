@@ -81,6 +81,8 @@ struct ManagerState {
     bool performAlone(const std::function<void()>& call);
     bool holdsReports() const;
     bool isAtRest() const;
+    /// Makes a call of the source; where that throws, one line on the console names the source and `name`.
+    void callSource(std::string_view name, const std::function<void()>& call) const;
     /// Counts something of the source that is under way, until the answer is dropped.
     std::shared_ptr<void> countUnderWay();
     /// Notes what is being read from now on, and tells observers how far the load is, not too often.
@@ -103,9 +105,10 @@ private:
     bool wantsLoadByItself() const; // under _lock
     bool queueLoad(Job job); // under _lock; whether a thread is to be started
     void startLoadThread();
-    OBLoadOutcome runLoad(Job job);
+    OBLoadResult runLoad(Job job);
+    bool callLoad(Job job);
     bool beginLoad(Job& job);
-    void finishLoad(OBLoadOutcome outcome);
+    void finishLoad(OBLoadResult result);
     void performLoad();
     void runReload(std::string_view part, const std::function<void()>& reload);
     class WorkEnd;

@@ -15,6 +15,7 @@ enum class OBLoadOutcome : std::uint8_t {
     loaded, ///< the tree is complete
     cancelled, ///< somebody cancelled: the tree holds what had been gathered
     unavailable, ///< the source cannot load now: `canLoadData` answered false
+    failed, ///< the source threw an error, and the tree is as it was
     ended, ///< the manager has ended
 };
 
@@ -22,6 +23,7 @@ enum class OBLoadOutcome : std::uint8_t {
 struct OBLoadResult {
     OBLoadOutcome outcome = OBLoadOutcome::loaded;
     OBMediaGroupRef rootMediaGroup {}; ///< the installed tree; null when none was ever installed
+    std::string problem {}; ///< of a load that failed: what the source threw
 };
 
 /// How far the load at work, or the last one, has come.

@@ -8,6 +8,7 @@
 #include "platform/MainRunLoop.h"
 #include "platform/Preferences.h"
 
+#include <exception>
 #include <utility>
 
 using platform::Text;
@@ -249,7 +250,17 @@ std::shared_ptr<OBScanObserver> OBMediaManager::scanObserver() const
 
 bool OBMediaManager::performOnMainThreadAndWait(const std::function<void()>& call)
 {
-    return platform().mainRunLoop.performAndWait(call);
+    std::exception_ptr thrown; // here, where the caller can answer for it
+    const bool isDone = platform().mainRunLoop.performAndWait([&] {
+        try {
+            call();
+        } catch (...) {
+            thrown = std::current_exception();
+        }
+    });
+    if (thrown)
+        std::rethrow_exception(thrown);
+    return isDone;
 }
 
 void OBMediaManager::performInOrder(
@@ -262,7 +273,9 @@ void OBMediaManager::performInOrder(
 bool OBMediaManager::startThread(const std::string& name, std::function<void()> body)
 {
     return _state->core->startThread(
-        name, [manager = shared_from_this(), work = std::move(body), counted = _state->countUnderWay()] { work(); });
+        name, [manager = shared_from_this(), name, work = std::move(body), counted = _state->countUnderWay()] {
+            manager->_state->callSource("thread " + name, work);
+        });
 }
 
 void OBMediaManager::observeNotification(
@@ -271,7 +284,7 @@ void OBMediaManager::observeNotification(
     const auto call = [manager = weak_from_this(), work = std::move(handler)](const platform::Notification& posted) {
         const auto alive = manager.lock();
         if (alive && !alive->_state->ended.isRaised())
-            work(posted);
+            alive->_state->callSource(posted.name, [&] { work(posted); });
     };
     _state->addNotification(center, center.addObserver(name, nullptr, call));
 }
@@ -290,7 +303,7 @@ void OBMediaManager::performAfterDelay(
         if (!alive || alive->_state->ended.isRaised())
             return;
         const WorkCause kept(cause);
-        work();
+        alive->_state->callSource("a call after a delay", work);
     };
     platform().mainRunLoop.performAfterDelay(delay, modes, later);
 }

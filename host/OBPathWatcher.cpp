@@ -141,18 +141,17 @@ bool OBPathWatcher::watchPathIsUnique_observer(std::string_view path, const OBPa
     const auto known = _registrations.find(observer);
     if (known == _registrations.end())
         return true;
-    const std::vector<WatchedPath>& paths = known->second.paths;
-    return std::none_of(paths.begin(), paths.end(), [&](const WatchedPath& other) { return other.path == path; });
+    return known->second.namesOfPaths.count(std::string(path)) == 0;
 }
 
 void OBPathWatcher::watchPath_observer(std::string_view path, OBPathWatcherObserver* observer)
 {
     const platform::Date since = changesMatterSince(*observer);
     Locked guard(_lock);
-    std::vector<WatchedPath>& paths = registrationsOf(observer).paths;
-    if (std::any_of(paths.begin(), paths.end(), [&](const WatchedPath& other) { return other.path == path; }))
+    Registrations& registrations = registrationsOf(observer);
+    if (!registrations.namesOfPaths.insert(std::string(path)).second)
         return;
-    WatchedPath& added = paths.emplace_back(WatchedPath { std::string(path), since });
+    WatchedPath& added = registrations.paths.emplace_back(WatchedPath { std::string(path), since });
     if (_follows)
         startPath(added, *observer);
 }

@@ -12,6 +12,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <unordered_set>
 #include <vector>
 
 class FrameworkCore;
@@ -128,6 +129,7 @@ private:
     struct Registrations {
         OBPathWatcherObserver* observer = nullptr;
         std::vector<WatchedPath> paths {};
+        std::unordered_set<std::string> namesOfPaths {}; ///< the same, for one that is asked about
         std::vector<WatchedQuery> queries {};
     };
     using AllRegistrations = std::map<const OBPathWatcherObserver*, Registrations>;

@@ -18,14 +18,30 @@ OrderedWork::OrderedWork(
 
 void OrderedWork::perform(const Job& take)
 {
+    try {
+        takeAll(take);
+    } catch (...) {
+        std::unique_lock guard(_lock);
+        _next = _count;
+        _changed.notify_all();
+        while (_jobsAtWork != 0)
+            _changed.wait(guard);
+        throw;
+    }
+}
+
+void OrderedWork::takeAll(const Job& take)
+{
     std::unique_lock guard(_lock);
     for (std::size_t index = 0; index < _count; ++index) {
         while (!_done[index]) {
             startThreads(guard);
             if (canClaim())
                 runClaimed(guard);
-            else if (!_done[index])
+            else if (!_done[index] && !_thrown)
                 _changed.wait(guard);
+            if (_thrown)
+                std::rethrow_exception(_thrown);
         }
         guard.unlock();
         take(index);
@@ -58,15 +74,34 @@ void OrderedWork::runClaimed(std::unique_lock<std::mutex>& guard)
     const std::size_t index = _next++;
     const bool isTimed = _untimedLeft == 0;
     _untimedLeft = isTimed ? _untimedBetween : _untimedLeft - 1;
+    ++_jobsAtWork;
     guard.unlock();
-    const std::optional<Times> times = isTimed ? std::optional(runTimed(index)) : std::nullopt;
-    if (!isTimed)
-        _job(index);
+    std::exception_ptr thrown;
+    std::optional<Times> times;
+    try {
+        times = runJob(index, isTimed);
+    } catch (...) {
+        thrown = std::current_exception();
+    }
     guard.lock();
-    _done[index] = true;
+    --_jobsAtWork;
+    if (thrown) {
+        _thrown = thrown;
+        _next = _count;
+    } else {
+        _done[index] = true;
+    }
     if (times)
         noteTimes(*times);
     _changed.notify_all();
+}
+
+std::optional<OrderedWork::Times> OrderedWork::runJob(std::size_t index, bool isTimed)
+{
+    if (isTimed)
+        return runTimed(index);
+    _job(index);
+    return std::nullopt;
 }
 
 OrderedWork::Times OrderedWork::runTimed(std::size_t index)

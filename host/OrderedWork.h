@@ -5,6 +5,7 @@
 #include <chrono>
 #include <condition_variable>
 #include <cstddef>
+#include <exception>
 #include <functional>
 #include <memory>
 #include <mutex>
@@ -25,7 +26,7 @@ public:
     OrderedWork(const platform::Platform& platform, ThreadStarter startThread, std::size_t count, const Job& job);
 
     /// Calls `job` once for each index below `count`, on any of the threads, and `take` for each in order, on the
-    /// calling thread. When it returns no other thread is inside `job` or will be.
+    /// calling thread. When it returns, or throws what one of the two threw, no other thread is inside `job` or will be.
     void perform(const Job& take);
 
 private:
@@ -42,9 +43,11 @@ private:
         std::chrono::nanoseconds onProcessor {};
     };
 
+    void takeAll(const Job& take);
     bool canClaim() const; // under _lock
     void help();
     void runClaimed(std::unique_lock<std::mutex>& guard);
+    std::optional<Times> runJob(std::size_t index, bool isTimed);
     Times runTimed(std::size_t index);
     void noteTimes(const Times& times); // under _lock
     void startThreads(std::unique_lock<std::mutex>& guard);
@@ -57,8 +60,10 @@ private:
     std::mutex _lock; // guards what follows
     std::condition_variable _changed;
     std::vector<bool> _done;
+    std::exception_ptr _thrown; // by a job; no other is begun
     std::size_t _next = 0; // the first job that nobody has begun
     std::size_t _taken = 0;
+    std::size_t _jobsAtWork = 0;
     std::size_t _helpers = 0;
     std::size_t _threadsWanted = threadsAtWork;
     std::size_t _timedJobs = 0;

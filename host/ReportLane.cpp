@@ -2,8 +2,10 @@
 
 #include "host/FrameworkCore.h"
 #include "host/OBPathWatcher.h"
+#include "host/SourceCall.h"
 #include "host/WorkCause.h"
 #include "platform/Clock.h"
+#include "platform/Console.h"
 #include "platform/MainRunLoop.h"
 
 #include <algorithm>
@@ -134,8 +136,10 @@ bool ReportLane::deliverFirst()
         return false;
     const WorkCause cause({ _cause.empty() ? "changed: " + first.report : _cause, first.heardAt });
     callingOnThisThread.push_back(this);
-    _deliver(first.report);
+    const std::string error = errorThrownBy([&] { _deliver(first.report); });
     callingOnThisThread.pop_back();
+    if (!error.empty())
+        _core.platform().console.log(first.report + ": error while this change was told: " + error);
     return true;
 }
 

@@ -20,6 +20,8 @@ namespace {
         if (!facts.editorAnswered)
             findings.push_back(
                 { Severity::fail, subject, "where the editor is, the disk that would tell does not answer" });
+        else if (!facts.editorPath && facts.canLoad)
+            return; // a source that loads without an editor has none
         else if (!facts.editorPath)
             findings.push_back({ Severity::fail, subject, "it is not installed, so its libraries are not shown" });
         else if (!facts.canLoad)

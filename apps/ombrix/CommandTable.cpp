@@ -196,12 +196,12 @@ namespace {
             "action. Prints \"null\" where there is no such movie or group.",
             menuOptions, true, menuExamples, runMenu },
         { "open", Intent::act, "[PATH]", 1, "open the editor",
-            "Performs the first action of a movie's menu. Loads nothing, and waits 4 seconds\n"
+            "Opens what a movie's menu opens: the editor. Loads nothing, and waits 4 seconds\n"
             "at most until the desktop has taken over.",
             {}, true, openExamples, runOpen },
         { "reveal", Intent::act, "PATH", 1, "show a file in the file manager",
-            "Performs the second action of a movie's menu on any file or folder. Loads\n"
-            "nothing, and waits 4 seconds at most until the desktop has taken over.",
+            "Shows any file or folder as a movie's menu does. Loads nothing, and waits 4\n"
+            "seconds at most until the desktop has taken over.",
             {}, true, revealExamples, runReveal },
         { "export", Intent::act, "", 0, "print what copying gives the editor",
             "Loads once and prints the property list that copying or dragging the movies or\n"

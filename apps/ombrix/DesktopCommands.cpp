@@ -9,6 +9,7 @@
 #include "platform/Notifications.h"
 #include "platform/Workspace.h"
 
+#include <algorithm>
 #include <chrono>
 #include <future>
 #include <memory>
@@ -17,6 +18,19 @@ namespace ombrix {
 namespace {
 
     constexpr std::chrono::seconds longestWait { 4 };
+
+    /// False where `menu` has no such item.
+    bool chooseItem(const OBMenuRef& menu, std::string_view action)
+    {
+        if (!menu)
+            return false;
+        const auto item = std::find_if(menu->items.begin(), menu->items.end(),
+            [action](const OBMenuItem& each) { return each.action->name == action; });
+        if (item == menu->items.end())
+            return false;
+        item->choose();
+        return true;
+    }
 
     /// Chooses the item called `action` of the menu for the file at `path`, and waits for what becomes of it. `place`
     /// and `notAttempted` say what is wrong where nothing was attempted.
@@ -36,15 +50,12 @@ namespace {
         std::future<platform::HandOver> handedOver = answer->get_future();
         machine.workspace.observeHandOvers([answer](const platform::HandOver& outcome) { answer->set_value(outcome); });
 
-        if (const OBMenuRef menu = manager->contextMenuForMediaObject_inMediaGroup(object, nullptr)) {
-            for (const OBMenuItem& item : menu->items) {
-                if (item.action->name == action)
-                    item.choose();
-            }
-        }
+        const bool isOffered = chooseItem(manager->contextMenuForMediaObject_inMediaGroup(object, nullptr), action);
         machine.notifications.removeObserver(token);
         int status = done;
-        if (!isAttempted)
+        if (!isOffered)
+            status = program.fail(place, "the menu of " + manager->displayName().string() + " does not offer this");
+        else if (!isAttempted)
             status = program.fail(place, notAttempted);
         else if (handedOver.wait_for(longestWait) != std::future_status::ready)
             status = program.fail(place, "the desktop did not answer within 4 seconds");

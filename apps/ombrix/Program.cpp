@@ -20,6 +20,8 @@ namespace {
     {
         const std::string source = manager.displayName().string();
         const platform::Text path = manager.getAppPath();
+        if (path.isAbsent() && !manager.inspection())
+            return { source, "it cannot load now" };
         if (path.isAbsent())
             return { source, "the editor is not installed, so its libraries are not shown" };
         return { source, "the editor is not installed: nothing exists at " + apps::escapedText(path) };
@@ -140,13 +142,15 @@ std::shared_ptr<OBMediaManager> Program::loadableManager()
     std::shared_ptr<OBMediaManager> source = manager();
     if (!source || source->canLoadData())
         return source;
-    failLoad(*source, OBLoadOutcome::unavailable);
+    failLoad(*source, { OBLoadOutcome::unavailable });
     return nullptr;
 }
 
-int Program::failLoad(OBMediaManager& manager, OBLoadOutcome outcome) const
+int Program::failLoad(OBMediaManager& manager, const OBLoadResult& result) const
 {
-    if (outcome != OBLoadOutcome::unavailable)
+    if (result.outcome == OBLoadOutcome::failed)
+        return fail(manager.displayName(), "the load failed: " + result.problem);
+    if (result.outcome != OBLoadOutcome::unavailable)
         return fail(manager.displayName(), "the load ended without a tree");
     const auto [place, what] = whyNothingLoads(manager);
     return fail(place, what);
@@ -163,7 +167,7 @@ OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
     _loadDuration = load.duration;
     if (load.result.outcome != OBLoadOutcome::unavailable && load.result.rootMediaGroup)
         return load.result.rootMediaGroup;
-    failLoad(*source, load.result.outcome);
+    failLoad(*source, load.result);
     return nullptr;
 }
 

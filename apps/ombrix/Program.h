@@ -60,7 +60,7 @@ public:
     /// Loads the tree once, with `observer` told what the scan decides; null after having said why there is none.
     OBMediaGroupRef load(const std::shared_ptr<OBScanObserver>& observer = nullptr);
     /// Says why a load by `manager` gave no tree; answers the exit status.
-    int failLoad(OBMediaManager& manager, OBLoadOutcome outcome) const;
+    int failLoad(OBMediaManager& manager, const OBLoadResult& result) const;
     /// Where `load` has been: how long it took.
     std::chrono::nanoseconds loadDuration() const { return _loadDuration; }
     /// A group, or the exit status after having said why there is none.

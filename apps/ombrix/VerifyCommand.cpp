@@ -106,17 +106,23 @@ namespace {
                     return;
                 self->_platform.mainRunLoop.post([self] {
                     self->_held.reset();
-                    self->_isToCompare = true;
-                    if (self->_isLoaded)
-                        self->settle();
+                    self->interrupted();
                 });
             });
+        }
+
+        void interrupted()
+        {
+            if (_isLoaded)
+                return settle();
+            _status = _program.fail(_program.arguments().source, "interrupted before there was a tree to compare");
+            _platform.mainRunLoop.quit();
         }
 
         void loaded(const OBLoadResult& result)
         {
             if (!result.rootMediaGroup) {
-                _status = _program.failLoad(_tree->manager(), result.outcome);
+                _status = _program.failLoad(_tree->manager(), result);
                 return _platform.mainRunLoop.quit();
             }
             _isLoaded = true;
@@ -124,9 +130,7 @@ namespace {
                 _program.printLine("following changes; Ctrl-C compares and ends");
                 _program.output().flush();
             }
-            if (_isToCompare)
-                settle();
-            else if (_limit)
+            if (_limit)
                 _platform.mainRunLoop.performAfterDelay(
                     *_limit, platform::RunLoopModes::common, [self = shared_from_this()] { self->settle(); });
         }
@@ -248,7 +252,6 @@ namespace {
         const std::optional<std::chrono::nanoseconds> _limit;
         std::optional<apps::EndingSignalsHeld> _held {};
         bool _isLoaded = false;
-        bool _isToCompare = false;
         bool _isSettling = false;
         std::optional<Verification> _last {};
         std::uint64_t _publicationsCompared = 0;

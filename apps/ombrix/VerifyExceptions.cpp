@@ -207,7 +207,8 @@ Reason VerifyExceptions::reasonForPath(const std::string& path)
     std::vector<std::string> folders = _source.projectFolders;
     folders.insert(folders.end(), _source.eventFolders.begin(), _source.eventFolders.end());
     const std::string folder = folderHolding(folders, path);
-    if (path.empty())
+    // Of a source that does not tell where it looks, nothing is known that it may miss.
+    if (path.empty() || folders.empty())
         return std::nullopt;
     if (folder.empty())
         return "the folders that are searched are listed once; a restart lists " + path;

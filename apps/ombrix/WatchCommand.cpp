@@ -102,13 +102,13 @@ namespace {
                   } });
             _manager->requestRootMediaGroup(atOnce, [watch = shared_from_this()](const OBLoadResult& result) {
                 if (!result.rootMediaGroup)
-                    watch->failLoad(result.outcome);
+                    watch->failLoad(result);
             });
         }
 
-        void failLoad(OBLoadOutcome outcome)
+        void failLoad(const OBLoadResult& result)
         {
-            _status = _program.failLoad(*_manager, outcome);
+            _status = _program.failLoad(*_manager, result);
             _platform.mainRunLoop.quit();
         }
 

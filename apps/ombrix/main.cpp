@@ -5,6 +5,7 @@
 #include "apps/ombrix/Help.h"
 #include "apps/ombrix/Program.h"
 
+#include <exception>
 #include <string_view>
 #include <utility>
 #include <vector>
@@ -23,6 +24,18 @@ int run(ombrix::Program& program)
     return ombrix::done;
 }
 
+// What a source throws is said in one line.
+int runGuarded(ombrix::Program& program)
+{
+    try {
+        return run(program);
+    } catch (const std::exception& error) {
+        return program.fail(program.arguments().source, error.what());
+    } catch (...) {
+        return program.fail(program.arguments().source, "an unknown error");
+    }
+}
+
 } // namespace
 
 int main(int count, char** words)
@@ -37,7 +50,7 @@ int main(int count, char** words)
         apps::endProcess(ombrix::wrongUsage);
     }
     ombrix::Program program(std::move(parsed.arguments));
-    const int status = run(program);
+    const int status = runGuarded(program);
     // A thread may still wait for a disk that does not answer, so nothing is torn down.
     apps::endProcess(program.finish(status));
 }

@@ -31,11 +31,17 @@ namespace {
             cannotArrange(what, path);
     }
 
-    std::vector<fs::directory_entry> entriesOf(const std::string& folder)
+    /// A folder that a test took the permissions from can be neither emptied nor moved by an ordinary user.
+    void giveBackPermissions(const fs::path& folder)
     {
-        // A folder that a test took the permissions from cannot be emptied by an ordinary user.
         std::error_code error;
         fs::permissions(folder, fs::perms::owner_all, fs::perm_options::add | fs::perm_options::nofollow, error);
+    }
+
+    std::vector<fs::directory_entry> entriesOf(const std::string& folder)
+    {
+        giveBackPermissions(folder);
+        std::error_code error;
         std::vector<fs::directory_entry> entries;
         for (const fs::directory_entry& entry : fs::directory_iterator(folder, error))
             entries.push_back(entry);
@@ -57,10 +63,12 @@ namespace {
             for (const fs::directory_entry& entry : entries) {
                 for (const fs::directory_entry& inner :
                     isFolder(entry) ? entriesOf(entry.path()) : decltype(entries)()) {
-                    if (isFolder(inner))
-                        fs::rename(inner.path(), fs::path(folder) / ("moved up " + std::to_string(++moved)), error);
-                    else
+                    if (!isFolder(inner)) {
                         fs::remove(inner.path(), error);
+                        continue;
+                    }
+                    giveBackPermissions(inner.path());
+                    fs::rename(inner.path(), fs::path(folder) / ("moved up " + std::to_string(++moved)), error);
                 }
                 fs::remove(entry.path(), error);
             }

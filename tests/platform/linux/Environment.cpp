@@ -1,12 +1,12 @@
 #include "tests/platform/linux/Environment.h"
 
+#include "tests/support/OwnMounts.h"
+
 #include <cstdlib>
 #include <filesystem>
 #include <iterator>
 
 #include <grp.h>
-#include <sched.h>
-#include <sys/mount.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -77,9 +77,7 @@ ChildAnswer askAsOrdinaryUser(const std::function<bool()>& check)
 
 ChildAnswer askWithOwnMounts(const std::function<bool()>& check)
 {
-    const auto leaveMounts
-        = [] { return unshare(CLONE_NEWNS) == 0 && mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0; };
-    return askInChild(leaveMounts, check);
+    return askInChild(enterOwnMounts, check);
 }
 
 int openDescriptors()

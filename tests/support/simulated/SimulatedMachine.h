@@ -7,10 +7,10 @@
 #include "platform/common/LinkTable.h"
 #include "platform/common/LinkedFileSystem.h"
 #include "platform/common/LocalNotificationCenter.h"
-#include "platform/linux/LinuxBundles.h"
 #include "platform/linux/LinuxCalendar.h"
 #include "platform/linux/LinuxFileSystem.h"
 #include "tests/support/FaultyFileSystem.h"
+#include "tests/support/LinkedBundles.h"
 #include "tests/support/RecordingConsole.h"
 #include "tests/support/simulated/SimulatedFileSystem.h"
 #include "tests/support/simulated/SimulatedMainLoop.h"
@@ -176,18 +176,6 @@ private:
             return _machine.toldVolumes ? *_machine.toldVolumes : mounted;
         }
         const SimulatedMachine& _machine;
-    };
-    class LinkedBundles : public platform::LinuxBundles {
-    public:
-        LinkedBundles(const platform::FileSystem& kernel, void* entryPoint)
-            : LinuxBundles(kernel)
-            , _entryPoint(entryPoint)
-        {
-        }
-        platform::LibraryAnswer loadLibrary(const std::string&, const char*) override { return { _entryPoint, {} }; }
-
-    private:
-        void* const _entryPoint;
     };
     class NoLanguages : public platform::Languages {
     public:

@@ -1,5 +1,6 @@
 #include "tests/platform/linux/Environment.h"
 #include "tests/platform/linux/watching/Listener.h"
+#include "tests/support/OwnMounts.h"
 
 #include <doctest/doctest.h>
 
@@ -12,13 +13,9 @@
 using tests::Changes;
 using tests::FollowedDisk;
 using tests::Listener;
+using tests::mountMemory;
 
 namespace {
-
-bool mountMemory(const std::string& path)
-{
-    return mount("memory", path.c_str(), "tmpfs", 0, nullptr) == 0;
-}
 
 /// Runs `check` with mounts of its own; says so where the system refuses them.
 void checkWithOwnMounts(const std::function<bool()>& check)

@@ -1,6 +1,5 @@
 #include "tests/live/LiveTree.h"
 
-#include "host/OBMediaManagerClass.h"
 #include "host/OBSourceInspection.h"
 #include "platform/PathText.h"
 
@@ -9,8 +8,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <utility>
-
-extern "C" const OBMediaManagerClass* OBPluginMediaManagerClass();
 
 namespace tests {
 
@@ -64,22 +61,18 @@ namespace {
 
 } // namespace
 
-LiveTree::LiveTree(std::uint64_t seed)
-    : _machine(seed, reinterpret_cast<void*>(&OBPluginMediaManagerClass))
+LiveTree::LiveTree(LiveMachine& machine)
+    : _machine(machine)
     , _operations(_machine)
 {
-    _machine.threads.perform([this] { prepare(); });
+    _machine.perform([this] { prepare(); });
 }
 
 void LiveTree::prepare()
 {
-    Chance& chance = _machine.chance;
-    _machine.pathWatching.dropsOneIn = chance.oneIn(3) ? 150 : 0;
-    _machine.pathWatching.pollsOneIn = chance.oneIn(4) ? 3 : 0;
+    _machine.drawWatching();
     _operations.makeEditor();
     _operations.prepare();
-    // The bundle's own files are real; that there is one, the simulated disk tells.
-    _machine.disk.makeFolders(OMBRIX_PLUGIN_FOLDER "/Montaro.obplugin");
     OBHostOptions options;
     options.pluginFolders = { OMBRIX_PLUGIN_FOLDER };
     _host = std::make_unique<OBMediaHost>(_machine.platform(), std::move(options));
@@ -94,12 +87,13 @@ void LiveTree::prepare()
 
 LiveTree::~LiveTree()
 {
-    _machine.threads.perform([this] {
+    _machine.perform([this] {
         _observation = {};
         _following = {};
         _freshSources.clear();
         _source = nullptr;
-        _machine.threads.waitUntilQuiet();
+        waitUntilQuiet();
+        _machine.end();
     });
 }
 
@@ -117,17 +111,18 @@ std::shared_ptr<OBMediaManager> LiveTree::makeSource()
 void LiveTree::follow()
 {
     _observation = _source->observe(inPlace, { .published = [this](const OBPublication& publication) {
+        ++_publications;
         _operations.log("published " + publication.part + ": " + publication.cause.text);
     } });
-    const bool followsFirst = _machine.chance.oneIn(2);
-    const OBFollowOptions options { .callsOnMainThread = _machine.chance.oneIn(5) };
+    const bool followsFirst = _machine.chance().oneIn(2);
+    const OBFollowOptions options { .callsOnMainThread = _machine.chance().oneIn(5) };
     if (followsFirst)
         _following = _host->followChanges(options);
-    _machine.threads.pause(followsFirst ? std::chrono::seconds(0) : std::chrono::hours(1));
+    _machine.pause(followsFirst ? std::chrono::seconds(0) : std::chrono::hours(1));
     load(*_source);
     if (!followsFirst)
         _following = _host->followChanges(options);
-    _host->pathWatcher().watchPath_observer(sharedPreferences, _source.get());
+    _host->pathWatcher().watchPath_observer(_machine.spelled(sharedPreferences), _source.get());
 }
 
 void LiveTree::load(OBMediaManager& manager)
@@ -138,34 +133,34 @@ void LiveTree::load(OBMediaManager& manager)
 
 void LiveTree::live(int operations)
 {
-    Chance& chance = _machine.chance;
     for (; operations != 0; --operations) {
         _operations.perform();
-        if (!chance.oneIn(3))
-            _machine.threads.pause(chance.time(chance.oneIn(10) ? std::chrono::hours(2) : std::chrono::seconds(20)));
+        if (!_machine.chance().oneIn(3))
+            _machine.pauseBetweenOperations();
     }
-    _machine.threads.waitUntilQuiet();
+    waitUntilQuiet();
 }
 
 /// What changed unseen is seen with the next reload of its half, whatever brings that about.
 void LiveTree::reloadUnseen()
 {
     if (std::exchange(_operations.preferenceChanged, false)) {
-        _machine.disk.writeFile(sharedPreferences, "shared");
-        _machine.threads.waitUntilQuiet();
+        _machine.disk().writeFile(sharedPreferences, "shared");
+        waitUntilQuiet();
         _operations.unseen.note(UnseenChanges::Reason::preference, "/Users/ann/Movies/Montaro Events");
     }
     if (std::exchange(_operations.editorWasMissing, false)) {
         load(*_source);
-        _machine.threads.waitUntilQuiet();
+        waitUntilQuiet();
     }
-    for (const std::string folder : { "/Users/ann/Movies/Montaro Projects", "/Users/ann/Movies/Montaro Events" }) {
+    for (const char* const name : { "Montaro Projects", "Montaro Events" }) {
+        const std::string folder = _machine.spelled(std::string("/Users/ann/Movies/") + name);
         if (folder.ends_with("Projects") ? _operations.unseen.projects() : _operations.unseen.events())
-            _machine.pathWatching.tell(
+            _machine.tell(
                 folder, { platform::PathChange::Kind::folderChanged, true, false, folder + "/no such folder" });
     }
     _operations.unseen.forget();
-    _machine.threads.waitUntilQuiet();
+    waitUntilQuiet();
 }
 
 /// The volumes that are searched for events, and for projects not.
@@ -182,14 +177,14 @@ std::vector<std::string> LiveTree::laterVolumes() const
 /// Has a new source build the list of folders with events that the open tree has by now.
 void LiveTree::tellVolumesInSearchOrder()
 {
-    _toldVolumes = {};
+    ListedVolumes told;
     const std::vector<std::string> volumes = volumesOf(_source->inspection()->eventSearchPaths());
     const auto boot = std::find(volumes.begin(), volumes.end(), "/");
     for (auto volume = volumes.begin() + 1; volume < boot; ++volume)
-        _toldVolumes.local.push_back({ *volume, std::string(platform::lastPathComponent(*volume)) });
+        told.local.push_back({ *volume, std::string(platform::lastPathComponent(*volume)) });
     for (auto volume = boot + 1; volume < volumes.end(); ++volume)
-        _toldVolumes.removable.push_back({ *volume, *volume });
-    _machine.toldVolumes = &_toldVolumes;
+        told.removable.push_back({ *volume, *volume });
+    _machine.tellVolumes(&told);
 }
 
 OBMediaGroupRef LiveTree::freshTree()
@@ -198,21 +193,35 @@ OBMediaGroupRef LiveTree::freshTree()
     _freshSources.push_back(makeSource());
     OBMediaManager& fresh = *_freshSources.back();
     load(fresh);
-    _machine.threads.waitUntilQuiet();
+    _machine.waitUntil([&] { return fresh.isAtRest(); });
     _host->pathWatcher().removeObserver(&fresh);
-    _machine.threads.waitUntilQuiet();
-    _machine.toldVolumes = nullptr;
+    _machine.waitUntil([&] { return fresh.isAtRest(); });
+    _machine.tellVolumes(nullptr);
     return fresh.rootMediaGroup();
 }
 
 std::string LiveTree::differenceAfter(int operations)
 {
     std::string found;
-    _machine.threads.perform([&] {
+    _machine.perform([&] {
         live(operations);
         found = difference();
     });
     return found;
+}
+
+void LiveTree::waitUntilQuiet()
+{
+    _machine.waitUntilQuiet([this] { return isAtRest(); });
+}
+
+bool LiveTree::isAtRest()
+{
+    const std::uint64_t publications = _publications;
+    if (std::exchange(_publicationsSeen, publications) != publications)
+        return false;
+    return (!_source || _source->isAtRest())
+        && std::all_of(_freshSources.begin(), _freshSources.end(), [](const auto& fresh) { return fresh->isAtRest(); });
 }
 
 std::string LiveTree::difference()

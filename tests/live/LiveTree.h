@@ -1,9 +1,10 @@
 #pragma once
 
 #include "host/OBMediaHost.h"
+#include "tests/live/LiveMachine.h"
 #include "tests/live/RandomOperations.h"
-#include "tests/support/simulated/SimulatedMachine.h"
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -11,10 +12,11 @@
 
 namespace tests {
 
-/// A tree that an application leaves open on a simulated machine while anything happens to the disks.
+/// A tree that an application leaves open on a machine while anything happens to the disks.
 class LiveTree {
 public:
-    explicit LiveTree(std::uint64_t seed);
+    /// `machine` outlives this object.
+    explicit LiveTree(LiveMachine& machine);
     ~LiveTree();
     LiveTree(const LiveTree&) = delete;
     LiveTree& operator=(const LiveTree&) = delete;
@@ -35,15 +37,18 @@ private:
     std::shared_ptr<OBMediaManager> makeSource();
     OBMediaGroupRef freshTree();
     void tellVolumesInSearchOrder();
+    void waitUntilQuiet();
+    bool isAtRest();
     std::vector<std::string> laterVolumes() const;
 
-    SimulatedMachine _machine;
+    LiveMachine& _machine;
     RandomOperations _operations;
     std::unique_ptr<OBMediaHost> _host;
     std::shared_ptr<OBMediaManager> _source {};
     OBObservation _observation {};
     OBObservation _following {};
-    ListedVolumes _toldVolumes {};
+    std::atomic<std::uint64_t> _publications { 0 };
+    std::uint64_t _publicationsSeen = 0;
     std::vector<std::shared_ptr<OBMediaManager>> _freshSources {}; // the end of one would empty what all share
 };
 

@@ -25,29 +25,32 @@ namespace {
 
 } // namespace
 
-RandomOperations::RandomOperations(SimulatedMachine& machine)
+RandomOperations::RandomOperations(LiveMachine& machine)
     : _machine(machine)
-    , _chance(machine.chance)
-    , _disk(machine.disk)
+    , _chance(machine.chance())
+    , _disk(machine.disk())
     , _places(machine)
     , _mayBeUnseen(_chance.oneIn(3))
 {
-    _places.volumes.push_back(machine.makeVolume("/media/ann/Stick", "Stick", true));
-    _places.volumes.push_back(machine.makeVolume("/media/ann/disk-1", "Disk 1"));
-    _places.volumes.push_back(machine.makeVolume("/media/ann/Late", "Late"));
-    _disk.changed = [this](const SimulatedDisk::Change& change) { diskChanged(change); };
-    machine.files.whenListing = [this](std::string_view folder) {
-        const SimulatedThreads::Undisturbed here;
-        if (!_failing.contains(std::string(folder)))
-            return platform::FileProblem::none;
-        unseen.note(Reason::failedListing, folder);
-        return platform::FileProblem::readError;
-    };
+    machine.makeVolume({ "/media/ann/Stick", "Stick", true });
+    machine.makeVolume({ "/media/ann/disk-1", "Disk 1" });
+    machine.makeVolume({ "/media/ann/Late", "Late" });
+    _disk.changed = [this](Kind kind, const std::string& path) { diskChanged(kind, path); };
+    machine.setWhenListing([this](std::string_view folder) {
+        platform::FileProblem problem = platform::FileProblem::none;
+        _machine.alone([&] {
+            if (!_failing.contains(std::string(folder)))
+                return;
+            unseen.note(Reason::failedListing, folder);
+            problem = platform::FileProblem::readError;
+        });
+        return problem;
+    });
 }
 
 RandomOperations::~RandomOperations()
 {
-    _machine.files.whenListing = nullptr;
+    _machine.setWhenListing(nullptr);
     _disk.changed = nullptr;
 }
 
@@ -80,7 +83,7 @@ const std::vector<RandomOperations::Operation>& RandomOperations::operations()
 
 void RandomOperations::prepare()
 {
-    for (SimulatedMachine::Volume& volume : _places.volumes) {
+    for (LiveMachine::Volume& volume : _machine.volumes) {
         if (volume.displayName != "Late" && !_chance.oneIn(4))
             _machine.mount(volume);
     }
@@ -91,7 +94,7 @@ void RandomOperations::prepare()
         makeEvent();
         makeFolder();
     }
-    _machine.threads.pause(std::chrono::hours(1));
+    _machine.pause(std::chrono::hours(1));
     unseen.forget();
 }
 
@@ -99,7 +102,6 @@ void RandomOperations::makeEditor()
 {
     _disk.makeFolders("/opt");
     _disk.writeFile("/opt/montaro", "");
-    _machine.workspace.applications = { { MontaroBundleIdentifier, "/opt/montaro" } };
 }
 
 void RandomOperations::perform()
@@ -117,32 +119,37 @@ void RandomOperations::perform()
 
 void RandomOperations::log(const std::string& line)
 {
-    const SimulatedThreads::Undisturbed here;
-    std::array<char, 32> time {};
-    std::snprintf(
-        time.data(), time.size(), "%12.6f  ", std::chrono::duration<double>(_machine.threads.monotonic()).count());
-    _lines.push_back(time.data() + line);
+    _machine.alone([&] {
+        std::array<char, 32> time {};
+        std::snprintf(time.data(), time.size(), "%12.6f  ", std::chrono::duration<double>(_machine.passed()).count());
+        _lines.push_back(time.data() + line);
+    });
+}
+
+void RandomOperations::diskChanged(Kind kind, const std::string& path)
+{
+    noteLinksThrough(path);
+    _machine.alone([&] {
+        if (path.find("/Montaro Events/") != std::string::npos && path.find("/Montaro Projects") != std::string::npos)
+            unseen.note(Reason::ambiguousPath, path);
+        if ((kind == Kind::contentChanged || kind == Kind::arrivalEnded) && _machine.somethingIsPolled())
+            unseen.note(Reason::polledContents, path);
+    });
 }
 
 /// A change behind a link is told by nobody, unless a library itself is the link.
-void RandomOperations::diskChanged(const SimulatedDisk::Change& change)
+void RandomOperations::noteLinksThrough(const std::string& path)
 {
-    const std::string path = change.name.empty() ? change.folder : pathJoined(change.folder, change.name);
     for (const std::uint64_t number : _links) {
-        const SimulatedDisk::Item* const link = _disk.itemWithNumber(number);
-        if (!link)
+        const std::string link = _disk.pathOf(number);
+        if (link.empty())
             continue;
-        const std::string target = _disk.placeOf(link->text).path;
+        const std::string text = _disk.linkTarget(link);
+        const std::string target = _disk.realPath(text);
         if (platform::isSameOrBelow(path, target) || platform::isSameOrBelow(target, path)
-            || platform::isSameOrBelow(link->text, path))
-            unseen.note(Reason::behindLink, link->path());
+            || platform::isSameOrBelow(text, path))
+            _machine.alone([&] { unseen.note(Reason::behindLink, link); });
     }
-    if (path.find("/Montaro Events/") != std::string::npos && path.find("/Montaro Projects") != std::string::npos)
-        unseen.note(Reason::ambiguousPath, path);
-    if ((change.kind == Kind::contentChanged || change.kind == Kind::arrivalEnded)
-        && _machine.pathWatching.somethingIsPolled())
-        unseen.note(Reason::polledContents, path);
-    _machine.pathWatching.diskChanged(change);
 }
 
 /// One step now, the others a little later each.
@@ -154,7 +161,7 @@ void RandomOperations::performSlowly(std::vector<std::function<void()>> steps)
         if (delay.count() == 0)
             step();
         else
-            _machine.threads.after(delay, std::move(step));
+            _machine.after(delay, std::move(step));
         if (isSlow)
             delay += _chance.time(longestStep);
     }
@@ -167,7 +174,7 @@ void RandomOperations::writeSlowly(const std::string& path, const std::string& t
         date = { 1'200'000'000 + static_cast<std::int64_t>(_chance.below(400'000'000)), 0 };
     const auto end = [this, number = _disk.beginFile(path), text, date] { _disk.endFile(number, text, date); };
     if (_chance.oneIn(3))
-        _machine.threads.after(_chance.time(longestWriting), end);
+        _machine.after(_chance.time(longestWriting), end);
     else
         end();
 }
@@ -270,23 +277,22 @@ void RandomOperations::makeLink()
     if (!_disk.makeLink(path, target))
         return;
     log("link " + path + " to " + target);
-    _links.push_back(_disk.itemAt(path)->number);
+    _links.push_back(_disk.numberOf(path));
 }
 
 void RandomOperations::closeFolder()
 {
     const std::string path = _places.anyFolder();
-    const SimulatedDisk::Item* const folder = _disk.itemAt(path);
-    if (!folder || folder->kind != ItemKind::folder || path == "/elsewhere")
+    if (_disk.kindOf(path) != ItemKind::folder || path == "/elsewhere")
         return;
-    const std::uint64_t number = folder->number;
+    const std::uint64_t number = _disk.numberOf(path);
     log("close " + path);
     _disk.setOpen(path, false);
     if (!_chance.oneIn(4)) {
-        _machine.threads.after(_chance.time(longestFault), [this, number] {
-            const SimulatedDisk::Item* const closed = _disk.itemWithNumber(number);
-            if (closed && _disk.setOpen(closed->path(), true))
-                log("open " + closed->path());
+        _machine.after(_chance.time(longestFault), [this, number] {
+            const std::string closed = _disk.pathOf(number);
+            if (!closed.empty() && _disk.setOpen(closed, true))
+                log("open " + closed);
         });
     }
 }
@@ -294,8 +300,7 @@ void RandomOperations::closeFolder()
 void RandomOperations::dateFolder()
 {
     const std::string path = _places.anyFolder();
-    const SimulatedDisk::Item* const folder = _disk.itemAt(path);
-    if (!folder || folder->kind != ItemKind::folder)
+    if (_disk.kindOf(path) != ItemKind::folder)
         return;
     log("date " + path);
     _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
@@ -305,33 +310,32 @@ void RandomOperations::dateFolder()
 void RandomOperations::hideNames()
 {
     std::string folder = _places.anyFolder();
-    for (int attempt = 0; attempt < 4 && !_disk.itemAt(folder + "/.hidden"); ++attempt)
+    for (int attempt = 0; attempt < 4 && !_disk.kindOf(folder + "/.hidden"); ++attempt)
         folder = _places.anyFolder();
-    const SimulatedDisk::Item* const item = _disk.itemAt(folder);
-    const std::string name = item && !item->items.empty() ? _chance.of(item->items)->name : _places.newName();
+    const std::vector<LiveDisk::Item> items = _disk.itemsIn(folder);
+    const std::string name = items.empty() ? _places.newName() : _chance.of(items).name;
     log("write " + folder + "/.hidden: " + name);
     _disk.writeFile(folder + "/.hidden", name + "\n" + _places.newName());
 }
 
 void RandomOperations::mountOrUnmount()
 {
-    SimulatedMachine::Volume& volume = _chance.of(_places.volumes);
+    LiveMachine::Volume& volume = _chance.of(_machine.volumes);
     log((volume.isMounted ? "unmount " : "mount ") + volume.mountPoint);
-    if (volume.isMounted)
-        _machine.unmount(volume);
-    else
-        _machine.mount(volume);
+    const bool isDone = volume.isMounted ? _machine.unmount(volume) : _machine.mount(volume);
+    if (!isDone)
+        log("refused: " + volume.mountPoint);
     for (const std::uint64_t number : _links) {
-        const SimulatedDisk::Item* const link = _disk.itemWithNumber(number);
-        if (link && platform::isSameOrBelow(link->text, volume.mountPoint))
-            unseen.note(Reason::behindLink, link->path());
+        const std::string link = _disk.pathOf(number);
+        if (!link.empty() && platform::isSameOrBelow(_disk.linkTarget(link), volume.mountPoint))
+            _machine.alone([&] { unseen.note(Reason::behindLink, link); });
     }
 }
 
 void RandomOperations::dropReports()
 {
     log("drop reports");
-    _machine.pathWatching.beginDropping();
+    _machine.dropReports();
 }
 
 void RandomOperations::askForLoad()
@@ -362,7 +366,7 @@ void RandomOperations::takeEditor()
     log("take the editor away for a while");
     _disk.remove("/opt/montaro");
     editorWasMissing = true;
-    _machine.threads.after(_chance.time(longestFault), [this] {
+    _machine.after(_chance.time(longestFault), [this] {
         log("put the editor back");
         makeEditor();
     });
@@ -371,11 +375,10 @@ void RandomOperations::takeEditor()
 void RandomOperations::rewriteFile()
 {
     const std::string path = _places.anyItem();
-    const SimulatedDisk::Item* const file = _disk.itemAt(path);
-    if (!_mayBeUnseen || !file || file->kind != ItemKind::file)
+    if (!_mayBeUnseen || _disk.kindOf(path) != ItemKind::file)
         return;
     log("rewrite " + path);
-    unseen.note(Reason::rewrittenInPlace, path);
+    _machine.alone([&] { unseen.note(Reason::rewrittenInPlace, path); });
     _disk.writeFile(path, _places.movie());
     _disk.setModified(path, { static_cast<std::int64_t>(_chance.below(1'500'000'000)), 0 });
     _disk.setOpen(path, !_chance.oneIn(4));
@@ -383,14 +386,14 @@ void RandomOperations::rewriteFile()
 
 void RandomOperations::failFolder()
 {
-    const std::string path = _places.anyFolder();
+    const std::string path = _machine.spelled(_places.anyFolder());
     if (!_mayBeUnseen || _failing.contains(path))
         return;
     log("fail to list " + path);
-    _failing.insert(path);
-    _machine.threads.after(_chance.time(longestFault), [this, path] {
+    _machine.alone([&] { _failing.insert(path); });
+    _machine.after(_chance.time(longestFault), [this, path] {
         log("list again " + path);
-        _failing.erase(path);
+        _machine.alone([&] { _failing.erase(path); });
     });
 }
 

@@ -1,8 +1,8 @@
 #pragma once
 
+#include "tests/live/LiveMachine.h"
 #include "tests/live/RandomPlaces.h"
 #include "tests/live/UnseenChanges.h"
-#include "tests/support/simulated/SimulatedMachine.h"
 
 #include <cstdint>
 #include <functional>
@@ -14,12 +14,12 @@
 
 namespace tests {
 
-/// What happens to the disks of a simulated machine while a tree is open: one operation after the other, drawn from the
+/// What happens to the disks of a machine while a tree is open: one operation after the other, drawn from the
 /// seed, with a line in the log for each.
 class RandomOperations {
 public:
     /// `machine` outlives this object.
-    explicit RandomOperations(SimulatedMachine& machine);
+    explicit RandomOperations(LiveMachine& machine);
     ~RandomOperations();
     RandomOperations(const RandomOperations&) = delete;
     RandomOperations& operator=(const RandomOperations&) = delete;
@@ -33,6 +33,7 @@ public:
     /// Asks the application of the tree for a load, after a cancel at times.
     std::function<void(bool cancelsFirst)> load {};
 
+    /// Any thread.
     void log(const std::string& line);
     const std::vector<std::string>& lines() const { return _lines; }
 
@@ -70,11 +71,12 @@ private:
 
     void performSlowly(std::vector<std::function<void()>> steps);
     void writeSlowly(const std::string& path, const std::string& text);
-    void diskChanged(const SimulatedDisk::Change& change);
+    void diskChanged(platform::PathChange::Kind kind, const std::string& path);
+    void noteLinksThrough(const std::string& path);
 
-    SimulatedMachine& _machine;
+    LiveMachine& _machine;
     Chance& _chance;
-    SimulatedDisk& _disk;
+    LiveDisk& _disk;
     RandomPlaces _places;
     std::vector<std::uint64_t> _links {};
     std::set<std::string> _failing {};

@@ -13,12 +13,12 @@ namespace {
     constexpr const char* projects = MontaroProjectsFolderName;
     constexpr const char* events = MontaroEventsFolderName;
 
-    std::vector<std::string> foldersIn(const SimulatedDisk::Item& folder)
+    std::vector<std::string> foldersIn(const LiveDisk& disk, const std::string& folder)
     {
         std::vector<std::string> names;
-        for (const auto& item : folder.items) {
-            if (item->kind == ItemKind::folder)
-                names.push_back(item->name);
+        for (const LiveDisk::Item& item : disk.itemsIn(folder)) {
+            if (item.kind == ItemKind::folder)
+                names.push_back(item.name);
         }
         return names;
     }
@@ -28,7 +28,7 @@ namespace {
 std::string RandomPlaces::library(std::string_view kind)
 {
     std::vector<std::string> places { "/Users/ann/Movies", "/Users/ann/Movies", "/" };
-    for (const SimulatedMachine::Volume& volume : volumes) {
+    for (const LiveMachine::Volume& volume : _machine.volumes) {
         if (volume.isMounted)
             places.push_back(volume.mountPoint);
     }
@@ -38,13 +38,11 @@ std::string RandomPlaces::library(std::string_view kind)
 std::string RandomPlaces::anyFolder()
 {
     std::string path = _chance.oneIn(8) ? "/elsewhere" : library(_chance.oneIn(2) ? projects : events);
-    const SimulatedDisk::Item* item = _disk.itemAt(path);
-    while (item && !_chance.oneIn(3)) {
-        std::vector<std::string> folders = foldersIn(*item);
+    while (_disk.kindOf(path) && !_chance.oneIn(3)) {
+        std::vector<std::string> folders = foldersIn(_disk, path);
         if (folders.empty())
             break;
         path = pathJoined(path, _chance.of(folders));
-        item = _disk.itemAt(path);
     }
     return path;
 }
@@ -53,10 +51,10 @@ std::string RandomPlaces::anyFolder()
 std::string RandomPlaces::anyItem()
 {
     const std::string folder = anyFolder();
-    const SimulatedDisk::Item* const item = _disk.itemAt(folder);
-    if (!item || item->items.empty() || _chance.oneIn(20))
+    const std::vector<LiveDisk::Item> items = _disk.itemsIn(folder);
+    if (items.empty() || _chance.oneIn(20))
         return folder;
-    return pathJoined(folder, _chance.of(item->items)->name);
+    return pathJoined(folder, _chance.of(items).name);
 }
 
 std::string RandomPlaces::newName()

@@ -1,25 +1,22 @@
 #pragma once
 
-#include "tests/support/simulated/SimulatedMachine.h"
+#include "tests/live/LiveMachine.h"
 
 #include <string>
 #include <string_view>
-#include <vector>
 
 namespace tests {
 
-/// Where on the disks of a simulated machine something is to happen, drawn from the seed.
+/// Where on the disks of a machine something is to happen, drawn from the seed.
 class RandomPlaces {
 public:
     /// `machine` outlives this object.
-    explicit RandomPlaces(SimulatedMachine& machine)
-        : _chance(machine.chance)
-        , _disk(machine.disk)
+    explicit RandomPlaces(LiveMachine& machine)
+        : _machine(machine)
+        , _chance(machine.chance())
+        , _disk(machine.disk())
     {
     }
-
-    /// All there are, mounted or not.
-    std::vector<SimulatedMachine::Volume> volumes {};
 
     /// A folder called `kind` where libraries may lie, whether or not it exists.
     std::string library(std::string_view kind);
@@ -36,8 +33,9 @@ public:
     std::string movie();
 
 private:
+    const LiveMachine& _machine;
     Chance& _chance;
-    SimulatedDisk& _disk;
+    const LiveDisk& _disk;
 };
 
 } // namespace tests

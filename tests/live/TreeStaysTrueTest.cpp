@@ -1,22 +1,31 @@
+#include "host/OBMediaManagerClass.h"
 #include "tests/live/LiveTree.h"
+#include "tests/live/NumberFromEnvironment.h"
+#include "tests/live/SimulatedLiveMachine.h"
 
 #include <doctest/doctest.h>
 
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 
-namespace {
+extern "C" const OBMediaManagerClass* OBPluginMediaManagerClass();
 
-std::uint64_t numberFromEnvironment(const char* name, std::uint64_t otherwise)
-{
-    const char* const text = std::getenv(name);
-    return text ? std::strtoull(text, nullptr, 10) : otherwise;
-}
+namespace {
 
 constexpr std::uint64_t usualSeeds = 200;
 constexpr int comparisons = 8;
 constexpr int operationsBetween = 12;
+
+/// A tree that is left open on a simulated machine.
+struct SimulatedTree {
+    explicit SimulatedTree(std::uint64_t seed)
+        : machine(seed, reinterpret_cast<void*>(&OBPluginMediaManagerClass), OMBRIX_PLUGIN_FOLDER "/Montaro.obplugin")
+    {
+    }
+
+    tests::SimulatedLiveMachine machine;
+    tests::LiveTree tree { machine };
+};
 
 } // namespace
 
@@ -24,17 +33,17 @@ constexpr int operationsBetween = 12;
 TEST_CASE("a tree left open equals a fresh load, whatever happened to the disks in between"
     * doctest::skip(!tests::simulatesLocks))
 {
-    const std::uint64_t first = numberFromEnvironment("OMBRIX_FIRST_SEED", 1);
-    const std::uint64_t count = numberFromEnvironment("OMBRIX_SEEDS", usualSeeds);
+    const std::uint64_t first = tests::numberFromEnvironment("OMBRIX_FIRST_SEED", 1);
+    const std::uint64_t count = tests::numberFromEnvironment("OMBRIX_SEEDS", usualSeeds);
     // What a process does once is done before, so that a seed replays exactly by itself.
-    tests::LiveTree(0).differenceAfter(operationsBetween);
+    SimulatedTree(0).tree.differenceAfter(operationsBetween);
     for (std::uint64_t seed = first; seed != first + count; ++seed) {
-        tests::LiveTree tree(seed);
+        SimulatedTree simulated(seed);
         std::string difference;
         for (int comparison = 0; comparison < comparisons && difference.empty(); ++comparison) {
-            difference = tree.differenceAfter(1 + (comparison * 7) % operationsBetween);
+            difference = simulated.tree.differenceAfter(1 + (comparison * 7) % operationsBetween);
         }
         REQUIRE_MESSAGE(difference.empty(), "seed ", seed, ", again with OMBRIX_FIRST_SEED=", seed, " OMBRIX_SEEDS=1\n",
-            tree.history(), difference);
+            simulated.tree.history(), difference);
     }
 }

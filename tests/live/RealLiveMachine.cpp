@@ -63,6 +63,13 @@ void RealVolumes::list(const ListedVolumes& volumes)
 {
     const std::lock_guard guard(_lock);
     _listed = volumes;
+    ++_timesListed;
+}
+
+std::uint64_t RealVolumes::generation() const
+{
+    const std::lock_guard guard(_lock);
+    return _mounts.generation() + _timesListed;
 }
 
 std::vector<std::string> RealVolumes::localVolumes() const

@@ -44,6 +44,7 @@ public:
     std::vector<std::string> removableMedia() const override;
     std::string displayName(std::string_view path) const override;
     std::optional<std::string> fileSystemType(std::string_view path) const override;
+    std::uint64_t generation() const override;
     std::shared_ptr<void> watchMounts(const std::function<void()>& changed) const override
     {
         return _mounts.watchMounts(changed);
@@ -53,6 +54,7 @@ private:
     const platform::Volumes& _mounts;
     mutable std::mutex _lock;
     ListedVolumes _listed {};
+    std::uint64_t _timesListed = 0;
 };
 
 /// This machine as one on which a tree is left open: real files, reports, mounts, threads and delays. Its disks lie

@@ -19,6 +19,7 @@ LinuxPathWatching::LinuxPathWatching(
 LinuxPathWatching::LinuxPathWatching(WatcherRoles roles)
     : _roles(std::move(roles))
     , _counts(std::make_shared<WatchingCounts>())
+    , _mountsSeen(std::make_shared<MountsSeen>(_roles.volumes))
 {
 }
 
@@ -36,7 +37,9 @@ Date LinuxPathWatching::timeOfChangesNow() const
 {
     timespec now {};
     clock_gettime(CLOCK_REALTIME_COARSE, &now);
-    return { now.tv_sec, static_cast<std::uint32_t>(now.tv_nsec) };
+    const Date date { now.tv_sec, static_cast<std::uint32_t>(now.tv_nsec) };
+    _mountsSeen->look(date);
+    return date;
 }
 
 std::shared_ptr<void> LinuxPathWatching::watch(std::string_view path, Date since, PathWatchHandlers handlers)
@@ -58,10 +61,11 @@ bool LinuxPathWatching::startThread()
 {
     _counts->threads.add();
     const SignalsHeld inherited;
-    const bool isStarted = _roles.threads.startDetached("watching", [roles = _roles, queue = _queue, counts = _counts] {
-        PathWatcher(roles, queue, counts).run();
-        counts->threads.remove();
-    });
+    const bool isStarted = _roles.threads.startDetached(
+        "watching", [roles = _roles, queue = _queue, counts = _counts, mounts = _mountsSeen] {
+            PathWatcher(roles, queue, counts, *mounts).run();
+            counts->threads.remove();
+        });
     if (!isStarted)
         _counts->threads.remove();
     return isStarted;

@@ -3,6 +3,7 @@
 #include "platform/PathWatching.h"
 #include "platform/ThreadSafety.h"
 #include "platform/linux/watching/LinuxWatchingLimits.h"
+#include "platform/linux/watching/MountsSeen.h"
 #include "platform/linux/watching/PathWatcher.h"
 
 #include <cstdint>
@@ -30,7 +31,8 @@ public:
     LinuxPathWatching(const LinuxPathWatching&) = delete;
     LinuxPathWatching& operator=(const LinuxPathWatching&) = delete;
 
-    /// The clock by which the kernel stamps files, which stands still between its ticks.
+    /// By the clock with which the kernel stamps files, which stands still between its ticks. What is mounted is noted
+    /// with it.
     Date timeOfChangesNow() const override;
     std::shared_ptr<void> watch(std::string_view path, Date since, PathWatchHandlers handlers) override;
     WatchingState state() const override;
@@ -46,6 +48,7 @@ private:
 
     const WatcherRoles _roles;
     const std::shared_ptr<WatchingCounts> _counts;
+    const std::shared_ptr<MountsSeen> _mountsSeen;
     Mutex _lock; ///< taken before the queue's own
     std::shared_ptr<WatchingQueue> _queue GUARDED_BY(_lock);
     std::uint64_t _lastNumber GUARDED_BY(_lock) = 0;

@@ -24,12 +24,12 @@ namespace {
 
 } // namespace
 
-PathWatcher::PathWatcher(
-    const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue, std::shared_ptr<WatchingCounts> counts)
+PathWatcher::PathWatcher(const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue,
+    std::shared_ptr<WatchingCounts> counts, const MountsSeen& mountsSeen)
     : _limits(roles.limits)
     , _queue(std::move(queue))
     , _counts(std::move(counts))
-    , _context(roles.files, _limits, *_queue, partsOfPolling(roles, _queue, _counts))
+    , _context(roles.files, _limits, mountsSeen, *_queue, partsOfPolling(roles, _queue, _counts))
 {
     watchMounts(roles);
 }

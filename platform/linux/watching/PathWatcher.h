@@ -29,8 +29,9 @@ struct WatcherRoles {
 /// What the watcher's thread does from the first watch to the last.
 class PathWatcher {
 public:
-    PathWatcher(
-        const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue, std::shared_ptr<WatchingCounts> counts);
+    /// `mountsSeen` outlives this object.
+    PathWatcher(const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue, std::shared_ptr<WatchingCounts> counts,
+        const MountsSeen& mountsSeen);
 
     /// Returns once nothing is watched any more.
     void run();

@@ -144,7 +144,7 @@ void RootPlacing::arrive(WatchedRoot& root, WatchedPlace place)
     const Date since = isFirst ? root.watch->since : FolderFollowing::never;
     const FolderFollowing::Look look = lookThroughPlace(root, since);
     _context.countWatches();
-    if (!isFirst || look.hasChangedSince || root.place.changed >= since)
+    if (!isFirst || look.hasChangedSince || root.place.changed >= since || _context.mountsSeen.haveChangedSince(since))
         _context.roots.tellAnything(root);
     if (root.awaitedLook.empty())
         _context.roots.tellStanding(root);

@@ -4,6 +4,7 @@
 #include "platform/linux/watching/FolderPolling.h"
 #include "platform/linux/watching/InotifyInstance.h"
 #include "platform/linux/watching/LinuxWatchingLimits.h"
+#include "platform/linux/watching/MountsSeen.h"
 #include "platform/linux/watching/PolledMounts.h"
 #include "platform/linux/watching/UntoldContents.h"
 #include "platform/linux/watching/WatchedFolders.h"
@@ -17,10 +18,11 @@ class FileSystem;
 
 /// What the parts of the watcher share. The watcher's thread.
 struct WatchingContext {
-    WatchingContext(const FileSystem& fileSystem, const LinuxWatchingLimits& theLimits, WatchingQueue& queue,
-        FolderPolling::Parts parts)
+    WatchingContext(const FileSystem& fileSystem, const LinuxWatchingLimits& theLimits, const MountsSeen& seen,
+        WatchingQueue& queue, FolderPolling::Parts parts)
         : files(fileSystem)
         , limits(theLimits)
+        , mountsSeen(seen)
         , inotify(theLimits.mayUseInotify)
         , roots(folders, queue)
         , arrivals(theLimits.arrivalsAtMost)
@@ -31,6 +33,7 @@ struct WatchingContext {
 
     const FileSystem& files;
     const LinuxWatchingLimits& limits;
+    const MountsSeen& mountsSeen;
     InotifyInstance inotify;
     WatchedFolders folders {};
     WatchedRoots roots;

@@ -112,3 +112,27 @@ TEST_CASE("a folder that is mounted in two places is followed in both")
         return umount(other.c_str()) == 0 && isRight;
     });
 }
+
+TEST_CASE("a mount between the time that matters and the watch is told, though no folder there has changed since")
+{
+    checkWithOwnMounts([] {
+        FollowedDisk machine;
+        const std::string store = machine.disk.folder("store");
+        const std::string place = machine.disk.folder("place");
+        bool isRight = mountMemory(store);
+        tests::makeFolder(store + "/library");
+        const platform::Date made = machine.watching.timeOfChangesNow();
+        while (machine.watching.timeOfChangesNow() == made) { }
+        const platform::Date since = machine.watching.timeOfChangesNow();
+        {
+            Listener before(machine.watching, place, since);
+            isRight = isRight && tests::changesSoFar(before, place).empty();
+        }
+        isRight = isRight && mount(store.c_str(), place.c_str(), nullptr, MS_BIND, nullptr) == 0;
+        {
+            Listener after(machine.watching, place + "/library", since);
+            isRight = isRight && after.hears("anythingChanged .");
+        }
+        return umount(place.c_str()) == 0 && umount(store.c_str()) == 0 && isRight;
+    });
+}

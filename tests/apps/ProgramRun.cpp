@@ -241,6 +241,18 @@ std::string RunningProgram::workingFolder() const
     return std::filesystem::read_symlink("/proc/" + std::to_string(_child) + "/cwd").string();
 }
 
+void RunningProgram::stop() const
+{
+    ::kill(_child, SIGSTOP);
+    int status = 0;
+    while (::waitpid(_child, &status, WUNTRACED) < 0 && errno == EINTR) { }
+}
+
+void RunningProgram::goOn() const
+{
+    ::kill(_child, SIGCONT);
+}
+
 void RunningProgram::stopReading()
 {
     ::close(std::exchange(_output, -1));

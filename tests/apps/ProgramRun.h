@@ -57,6 +57,9 @@ public:
     /// What it has printed so far, as far as it was read.
     const std::string& output() const { return _run.output; }
     std::string workingFolder() const;
+    /// Keeps it from doing anything, until `goOn`.
+    void stop() const;
+    void goOn() const;
     /// Closes the reading end of its standard output.
     void stopReading();
     /// Sends a signal, none for 0, and waits for the end.

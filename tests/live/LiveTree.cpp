@@ -7,6 +7,7 @@
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <iterator>
 #include <utility>
 
 namespace tests {
@@ -163,15 +164,16 @@ void LiveTree::reloadUnseen()
     waitUntilQuiet();
 }
 
-/// The volumes that are searched for events, and for projects not.
-std::vector<std::string> LiveTree::laterVolumes() const
+/// The folders with projects that only one of both searches.
+std::vector<std::string> LiveTree::foldersOfOneTree() const
 {
-    const std::vector<std::string> projects = volumesOf(_source->inspection()->projectSearchPaths());
-    std::vector<std::string> volumes = volumesOf(_source->inspection()->eventSearchPaths());
-    std::erase_if(volumes, [&](const std::string& volume) {
-        return std::find(projects.begin(), projects.end(), volume) != projects.end();
-    });
-    return volumes;
+    std::vector<std::string> open = _source->inspection()->projectSearchPaths();
+    std::vector<std::string> fresh = _freshSources.back()->inspection()->projectSearchPaths();
+    std::sort(open.begin(), open.end());
+    std::sort(fresh.begin(), fresh.end());
+    std::vector<std::string> folders;
+    std::set_symmetric_difference(open.begin(), open.end(), fresh.begin(), fresh.end(), std::back_inserter(folders));
+    return folders;
 }
 
 /// Has a new source build the list of folders with events that the open tree has by now.
@@ -228,8 +230,8 @@ std::string LiveTree::difference()
 {
     reloadUnseen();
     const OBMediaGroupRef freshRoot = freshTree();
-    const std::string open = comparableTree(_source->rootMediaGroup(), laterVolumes());
-    const std::string fresh = comparableTree(freshRoot, laterVolumes());
+    const std::string open = comparableTree(_source->rootMediaGroup(), foldersOfOneTree());
+    const std::string fresh = comparableTree(freshRoot, foldersOfOneTree());
     return open == fresh ? std::string() : differenceOf(open, fresh);
 }
 

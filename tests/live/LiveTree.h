@@ -39,7 +39,7 @@ private:
     void tellVolumesInSearchOrder();
     void waitUntilQuiet();
     bool isAtRest();
-    std::vector<std::string> laterVolumes() const;
+    std::vector<std::string> foldersOfOneTree() const;
 
     LiveMachine& _machine;
     RandomOperations _operations;

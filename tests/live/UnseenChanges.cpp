@@ -54,11 +54,11 @@ namespace {
         return children;
     }
 
-    bool isOnLaterVolume(const Child& child, const std::vector<std::string>& laterVolumes)
+    bool isOfOneTree(const Child& child, const std::vector<std::string>& foldersOfOneTree)
     {
         const platform::Text path = child.group->path();
-        return path && std::any_of(laterVolumes.begin(), laterVolumes.end(), [&](const std::string& volume) {
-            return platform::isSameOrBelow(path, volume);
+        return path && std::any_of(foldersOfOneTree.begin(), foldersOfOneTree.end(), [&](const std::string& folder) {
+            return platform::isSameOrBelow(path, folder);
         });
     }
 
@@ -107,14 +107,14 @@ void UnseenChanges::note(Reason, std::string_view path)
     _events = _events || isBelowFolderCalled(path, MontaroEventsFolderName);
 }
 
-std::string comparableTree(const OBMediaGroupRef& root, const std::vector<std::string>& laterVolumes)
+std::string comparableTree(const OBMediaGroupRef& root, const std::vector<std::string>& foldersOfOneTree)
 {
     if (!root)
         return "no tree";
     OBMediaObjectList ofNoChild;
     std::vector<Child> children = childrenOf(*root, ofNoChild);
     std::erase_if(children,
-        [&](const Child& child) { return isEmptyEventLibrary(child) || isOnLaterVolume(child, laterVolumes); });
+        [&](const Child& child) { return isEmptyEventLibrary(child) || isOfOneTree(child, foldersOfOneTree); });
     std::stable_sort(children.begin(), children.end(), standsBefore);
     const OBMediaGroupRef ordered = root->copy();
     std::vector<OBMediaGroupRef> groups;

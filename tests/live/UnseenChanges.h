@@ -14,8 +14,9 @@ namespace tests {
 //
 // Differences that the comparison takes out of both trees, or asks for in neither:
 // - The lists of folders to search are built once. The projects of a volume that was mounted later are not searched for,
-//   and its events are searched for after all others. The fresh load is told of the volumes in that order, and the
-//   projects of later ones are taken out of its tree.
+//   and its events are searched for after all others; of a volume that went between the two lists, only one knows.
+//   The fresh load is told of the volumes in the order of the events, and projects in folders that only one of the two
+//   searches are taken out of both trees.
 // - An events library without clips leaves the tree with a reload and stays in it with a load: it is taken out of both.
 //
 // Differences that last until the tree is loaded again:
@@ -49,7 +50,7 @@ private:
 /// The tree as a text that is equal for a tree that was left open and for one that was loaded now: JSON with the root's
 /// children in the order of a reload, ties by ID, and its media objects in the order of its children.
 ///
-/// `laterVolumes` are the volumes that were mounted after the lists were built.
-std::string comparableTree(const OBMediaGroupRef& root, const std::vector<std::string>& laterVolumes);
+/// `foldersOfOneTree` are the folders with projects that are searched for only one of the two.
+std::string comparableTree(const OBMediaGroupRef& root, const std::vector<std::string>& foldersOfOneTree);
 
 } // namespace tests

@@ -83,7 +83,7 @@ void SimulatedPathWatching::stand(Root& root)
 {
     root.stands = true;
     takePlace(root);
-    if (hasChangedSince(root))
+    if (hasChangedSince(root) || _mountsChanged >= root.since)
         root.handlers.changed({ Kind::anythingChanged, true, false, root.path });
     if (root.handlers.stands)
         root.handlers.stands();
@@ -182,6 +182,7 @@ void SimulatedPathWatching::tellContents(
 
 void SimulatedPathWatching::mountsChanged(const std::string& path)
 {
+    _mountsChanged = _threads.now();
     lookAtPlaces();
     for (const RootRef& root : std::vector(*_roots)) {
         if (root->stands && isOnTheWay(path, root->place))

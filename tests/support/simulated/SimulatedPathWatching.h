@@ -66,6 +66,7 @@ private:
     const SimulatedDisk& _disk;
     const platform::FileSystem& _files;
     bool _drops = false;
+    platform::Date _mountsChanged {}; // the last time
     const std::shared_ptr<std::vector<RootRef>> _roots = std::make_shared<std::vector<RootRef>>();
 };
 

@@ -147,12 +147,14 @@ bool ManagerState::beginLoad(Job& job)
 {
     const bool open = gate.begin(changeTime());
     std::unique_lock guard(_lock);
-    if (!open || _ended || !_loadQueued) {
-        _threadRuns = false;
+    const bool hasNext = open && !_ended && _loadQueued;
+    // Who cancelled before this load was taken may have asked for it since: it is not the one that was meant.
+    if (!hasNext || gate.isCancelPending()) {
+        _threadRuns = hasNext;
         guard.unlock();
         if (open)
             endWork();
-        return false;
+        return hasNext && beginLoad(job);
     }
     job = _queuedJob;
     _loadQueued = false;

@@ -180,7 +180,7 @@ namespace {
             const TreeNode& node = _nodes[line.node];
             const NodeFacts facts = factsOf(_nodes, line, _wishes.now);
             if (node.isUnreadable) {
-                text.add(_columns.countStart(), "unreadable", TextLine::Look::warning);
+                addUnreadable(text, node);
             } else if (!facts.count.empty()) {
                 addColumns(text, facts);
             } else if (const platform::Text message = _wishes.emptyMessage(node.group); !message.empty()) {
@@ -192,6 +192,16 @@ namespace {
                 text.add(_summaryStart, summaryThatFits(facts), TextLine::Look::dim);
             }
             text.addName(_columns.noteStart(), _wishes.style.name(facts.note), TextLine::Look::dim);
+        }
+
+        /// Of a group that only its source knows, the source may know why.
+        void addUnreadable(TextLine& text, const TreeNode& node) const
+        {
+            text.add(_columns.countStart(), "unreadable", TextLine::Look::warning);
+            const platform::Text message
+                = node.kind == NodeKind::other ? _wishes.emptyMessage(node.group) : platform::Text();
+            if (!message.empty())
+                text.addBehind(": " + _wishes.style.name(message), TextLine::Look::dim);
         }
 
         std::string summaryThatFits(const NodeFacts& facts) const

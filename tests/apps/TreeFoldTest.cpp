@@ -58,7 +58,9 @@ std::vector<std::string> textOf(
     look.isTerminal = columns.has_value();
     const apps::Style style(look);
     TreeTextWishes wishes { style, columns, { 1794657600, 0 } };
-    wishes.emptyMessage = [](const OBMediaGroupRef&) { return platform::Text(); };
+    wishes.emptyMessage = [](const OBMediaGroupRef& group) {
+        return group->path() ? platform::Text("nothing in " + group->path().string()) : platform::Text();
+    };
     wishes.unfoldingCommand = [](const OBMediaGroupRef& group) { return "unfold " + group->name().string(); };
     wishes.linkTarget = [](std::string_view path) { return std::string(path); };
     std::vector<std::string> text;
@@ -275,4 +277,23 @@ TEST_CASE("the root tells of an unreadable library, for which no group stands")
     const std::vector<TreeNode> nodes
         = nodesOf(makeTree(1, 1), { { "/home/Montaro Projects", platform::FileProblem::notPermitted } });
     CHECK(textOf(nodes, unfoldedLines(nodes), std::nullopt)[0].find("1 folder unreadable") != std::string::npos);
+}
+
+TEST_CASE("of an unreadable group that only its source knows the source's own text is told, if it has one")
+{
+    static constexpr OBTypeIdentifier listType("ListGroup");
+    const OBMediaGroupRef root = makeTree(1, 1);
+    root->childGroups()[0]->setPath("/list");
+    for (const char* path : { "/list", "/mute" }) {
+        const OBMediaGroupRef group = makeGroup(&listType, path);
+        group->setPath(path);
+        root->addChildGroup(group);
+    }
+    const std::vector<TreeNode> nodes = nodesOf(
+        root, { { "/list", platform::FileProblem::readError }, { "/mute", platform::FileProblem::readError } });
+    nodes.back().group->setPath({});
+    const std::vector<std::string> text = textOf(nodes, unfoldedLines(nodes), std::nullopt);
+    CHECK(text[1].ends_with("Folder 0       unreadable"));
+    CHECK(text[4].ends_with("/list          unreadable: nothing in /list"));
+    CHECK(text[5].ends_with("/mute          unreadable"));
 }

@@ -21,8 +21,9 @@ struct OBScanDecision {
 class OBScanObserver {
 public:
     virtual ~OBScanObserver() = default;
-    /// The scan turns to a library; decisions about what is in it follow. A library that is searched twice is told of
-    /// twice.
+    /// The scan turns to a library, a folder that it searches; decisions about what is in it follow, until the next. A
+    /// library that is searched twice is told of twice. A source without libraries need not call it: what it decides
+    /// may be about any path.
     virtual void libraryBegan(const std::string& path) { (void)path; }
     virtual void scanDecided(const OBScanDecision& decision) = 0;
     /// Whether the last word on an entry that became a record is wanted, which takes a while to put into words.

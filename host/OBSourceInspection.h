@@ -4,6 +4,12 @@
 #include <string>
 #include <vector>
 
+/// Why a source does not search a place.
+struct OBUnsearchedPlace {
+    std::string text {};
+    std::string remedy {}; ///< what would have it searched; empty when nothing would
+};
+
 /// What a source may tell about itself beside its tree, for programs that answer an operator's questions.
 /// Optional: a manager without it answers null for its inspection. Any thread; may block while a disk does not answer.
 class OBSourceInspection {
@@ -18,4 +24,11 @@ public:
     virtual std::vector<std::string> preferencesDomains() const { return {}; }
     virtual std::optional<double> pluginVersionNumber() const = 0;
     virtual std::optional<std::string> pluginVersionString() const = 0;
+    /// Of a path that lies in none of the folders that are searched: the rule that would have it searched elsewhere, as
+    /// one for folders of a certain name; absent where the source has none that speaks of it.
+    virtual std::optional<OBUnsearchedPlace> whyUnsearched(const std::string& path) const
+    {
+        (void)path;
+        return std::nullopt;
+    }
 };

@@ -8,6 +8,15 @@
 
 using platform::Text;
 
+namespace {
+
+bool liesInFolderCalled(const std::string& path, const std::string& name)
+{
+    return (path + "/").find("/" + name + "/") != std::string::npos;
+}
+
+} // namespace
+
 OBSourceInspection* OBMontaroPlugin::inspection()
 {
     return this;
@@ -44,4 +53,13 @@ std::optional<double> OBMontaroPlugin::pluginVersionNumber() const
 std::optional<std::string> OBMontaroPlugin::pluginVersionString() const
 {
     return std::string(reinterpret_cast<const char*>(OBMBMontaroPluginVersionString));
+}
+
+std::optional<OBUnsearchedPlace> OBMontaroPlugin::whyUnsearched(const std::string& path) const
+{
+    if (!liesInFolderCalled(path, MontaroProjectsFolderName) && !liesInFolderCalled(path, MontaroEventsFolderName))
+        return std::nullopt;
+    return OBUnsearchedPlace { "its volume or folder is not searched; folders of that name are searched in the home "
+                               "folder's Movies and at the top of local volumes and removable media",
+        "move the library there, or mount its volume" };
 }

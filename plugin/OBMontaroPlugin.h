@@ -171,6 +171,7 @@ private:
     std::vector<std::string> preferencesDomains() const override;
     std::optional<double> pluginVersionNumber() const override;
     std::optional<std::string> pluginVersionString() const override;
+    std::optional<OBUnsearchedPlace> whyUnsearched(const std::string& path) const override;
 
     void registerQueries();
     OBMediaObjectList mediaObjectsOfRoot(const OBMediaGroupList& children);

@@ -128,7 +128,7 @@ namespace {
         const TreePlaces places(root, { paths.begin(), paths.end() }, objectsOf(*record));
         const std::shared_ptr<OBMediaManager> manager = program.manager();
         const Paths folders = searchedFolders(*manager);
-        const Explainer explainer(manager->platform().fileSystem, folders, *record, places);
+        const Explainer explainer(manager->platform().fileSystem, folders, *record, places, manager->inspection());
         Answers answers(program, paths.size());
         for (const std::string& path : paths)
             answers.print(explainer.explain(path));

@@ -5,6 +5,7 @@
 
 #include "apps/ombrix/Explanation.h"
 
+#include "host/OBSourceInspection.h"
 #include "platform/PathText.h"
 
 #include <algorithm>
@@ -25,12 +26,6 @@ namespace {
         return platform::pathJoined(folder, below.substr(0, below.find('/')));
     }
 
-    bool bearsNameOf(const std::string& path, const std::string& folder)
-    {
-        const std::string name = "/" + std::string(platform::lastPathComponent(folder)) + "/";
-        return (path + "/").find(name) != std::string::npos;
-    }
-
 } // namespace
 
 /// The steps from a library to a path, and whether they end in a record.
@@ -48,11 +43,12 @@ struct Explainer::Way {
 };
 
 Explainer::Explainer(const platform::FileSystem& fileSystem, const std::vector<std::string>& folders,
-    const ScanRecord& record, const TreePlaces& places)
+    const ScanRecord& record, const TreePlaces& places, const OBSourceInspection* inspection)
     : _fileSystem(fileSystem)
     , _folders(folders)
     , _record(record)
     , _places(places)
+    , _inspection(inspection)
 {
     for (const ScanRecord::Library& library : record.libraries()) {
         DecisionIndex& index = _decisions.emplace_back();
@@ -98,7 +94,7 @@ Explainer::Way Explainer::chosenWay(const Explanation& explanation) const
 {
     std::vector<Way> ways;
     for (std::size_t library = 0; library < _decisions.size(); ++library) {
-        if (!platform::isSameOrBelow(explanation.path, _record.libraries()[library].path))
+        if (!speaksOf(library, explanation.path))
             continue;
         Way way = wayThrough(library, explanation.path, explanation.isListed());
         if (way.passes)
@@ -108,6 +104,14 @@ Explainer::Way Explainer::chosenWay(const Explanation& explanation) const
     if (explanation.isListed())
         return wayByLink(explanation.path);
     return ways.empty() ? wayOutside(explanation.path) : std::move(ways.front());
+}
+
+/// Whether the way through `library` is one to `path`. The whole disk as a library only is where something was decided.
+bool Explainer::speaksOf(std::size_t library, const std::string& path) const
+{
+    const std::string& top = _record.libraries()[library].path;
+    return platform::isSameOrBelow(path, top)
+        && (top != ScanRecord::wholeDisk || !decisionsOnWay(library, path).empty());
 }
 
 /// The way of the link that leads to a path which no library lists where it lies.
@@ -224,11 +228,8 @@ Explainer::Way Explainer::wayOutside(const std::string& path) const
         }
     }
     const auto has = [&](auto&& isSo) { return std::any_of(_folders.begin(), _folders.end(), isSo); };
-    if (has([&](const std::string& folder) { return bearsNameOf(path, folder); }))
-        way.end("search folder", path,
-            "its volume or folder is not searched; folders of that name are searched in the home folder's Movies and "
-            "at the top of local volumes and removable media",
-            "move the library there, or mount its volume");
+    if (auto place = _inspection ? _inspection->whyUnsearched(path) : std::nullopt)
+        way.end("search folder", path, std::move(place->text), std::move(place->remedy));
     else if (has([&](const std::string& folder) { return platform::isSameOrBelow(folder, path); }))
         way.end("search folder", path, "it holds folders that are searched, and is none itself", {});
     else if (_folders.empty())

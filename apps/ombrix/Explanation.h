@@ -10,6 +10,8 @@
 #include <unordered_map>
 #include <vector>
 
+class OBSourceInspection;
+
 namespace ombrix {
 
 /// One rule that was met on the way to a path.
@@ -33,9 +35,10 @@ struct Explanation {
 /// Explains paths by what a scan told of them and by the tree that it made, which therefore never disagree.
 class Explainer {
 public:
-    /// All that is handed over outlives this object. `folders` are those that are searched.
+    /// All that is handed over outlives this object. `folders` are those that are searched; `inspection` is that of
+    /// their source, and may be null.
     Explainer(const platform::FileSystem& fileSystem, const std::vector<std::string>& folders, const ScanRecord& record,
-        const TreePlaces& places);
+        const TreePlaces& places, const OBSourceInspection* inspection = nullptr);
 
     Explanation explain(const std::string& path) const;
 
@@ -46,6 +49,7 @@ private:
     struct Way;
 
     std::vector<TreePlace> placesOf(const std::string& path) const;
+    bool speaksOf(std::size_t library, const std::string& path) const;
     Way chosenWay(const Explanation& explanation) const;
     Way wayByLink(const std::string& path) const;
     Way wayThrough(std::size_t library, const std::string& path, bool isListed) const;
@@ -61,6 +65,7 @@ private:
     const std::vector<std::string>& _folders;
     const ScanRecord& _record;
     const TreePlaces& _places;
+    const OBSourceInspection* const _inspection;
     std::vector<DecisionIndex> _decisions {}; // one for each library of the record
     std::unordered_map<std::string_view, std::vector<const ScanRecord::Made*>> _madeByEntry {};
     std::unordered_map<std::string, const ScanRecord::Made*> _madeByTarget {}; // the first of each

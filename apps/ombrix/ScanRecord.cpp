@@ -39,7 +39,7 @@ void ScanRecord::scanDecided(const OBScanDecision& decision)
 {
     platform::Locked guard(_lock);
     if (_libraries.empty())
-        return;
+        _libraries.push_back({ wholeDisk, {} });
     if (isOfInterest(decision.path) || decision.path == _libraries.back().path)
         _libraries.back().decisions.push_back(decision);
     else

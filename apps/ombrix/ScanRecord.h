@@ -25,6 +25,9 @@ public:
     void linkFollowed(const std::string& path, const std::string& target) override;
     void objectMade(const std::string& path, const OBMediaObjectRef& object) override;
 
+    /// The library of a source that decides before it tells of one, and so may search anywhere.
+    static constexpr const char* wholeDisk = "/";
+
     /// A library, as often as it was searched.
     struct Library {
         std::string path;

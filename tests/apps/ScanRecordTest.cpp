@@ -52,7 +52,6 @@ Explanation explanationOf(const ScanRecord& record, const std::string& path)
 TEST_CASE("what is decided of other paths is not kept")
 {
     ScanRecord record(Paths { "/lib/event/clips/a" });
-    record.scanDecided(decision("/lib"));
     record.libraryBegan("/lib");
     for (const char* path : { "/lib", "/lib/other", "/lib/event", "/lib/other/clips", "/lib/event/clips",
              "/lib/event/clips/a", "/lib/event/clips/b" })
@@ -111,6 +110,29 @@ TEST_CASE("a scan that was stopped before a library says so")
     REQUIRE(explanation.steps.size() == 1);
     CHECK(explanation.steps[0].text == "the scan was stopped before it came here");
     CHECK(explanation.remedy == "load again");
+}
+
+TEST_CASE("what a source decides without telling of a library is told of the paths that it speaks of, and of no others")
+{
+    ScanRecord record(Paths { "/a/clips/text", "/a/other", "/b" });
+    record.scanDecided(decision("/a/clips"));
+    record.scanDecided(decision("/a/clips/text", false));
+    record.scanDecided(decision("/a/clips/movie"));
+    const Explanation rejected = explanationOf(record, "/a/clips/text");
+    REQUIRE(rejected.steps.size() == 2);
+    CHECK(rejected.steps[1].text == "of /a/clips/text");
+    CHECK(rejected.remedy == "mend it");
+    for (const char* path : { "/a/other", "/b" })
+        CHECK(explanationOf(record, path).steps.back().text == "it lies in none of the 1 folders that are searched");
+}
+
+TEST_CASE("a source that calls the whole disk its library is told of in the same way")
+{
+    ScanRecord record(Paths { "/a", "/b" });
+    record.libraryBegan("/");
+    record.scanDecided(decision("/a", false));
+    CHECK(explanationOf(record, "/a").steps.back().text == "of /a");
+    CHECK(explanationOf(record, "/b").steps.back().text == "it lies in none of the 1 folders that are searched");
 }
 
 TEST_CASE("nothing is claimed of a path in a folder that may not be searched")

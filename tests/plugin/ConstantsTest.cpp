@@ -76,6 +76,21 @@ TEST_CASE("the source reports its build version to whoever inspects it")
     CHECK(inspection->pluginVersionString() == "@(#)PROGRAM:OBMBMontaroPlugin  PROJECT:OBMBMontaroPlugin-288.2.12\n");
 }
 
+TEST_CASE("the source says where folders of its names are searched, of paths that lie in one, and of no others")
+{
+    SourceMachine machine;
+    const auto source = machine.makeSource();
+    const OBSourceInspection& inspection = *source->inspection();
+    for (const char* path : { "/x/Montaro Projects", "/x/Montaro Events/Coast/a.mov" }) {
+        const auto place = inspection.whyUnsearched(path);
+        REQUIRE(place);
+        CHECK(place->text.find("in the home folder's Movies and at the top of local volumes") != std::string::npos);
+        CHECK(place->remedy == "move the library there, or mount its volume");
+    }
+    for (const char* path : { "/x/Montaro Projects 2/a.mov", "/x/My Montaro Events/a.mov", "/", "" })
+        CHECK_FALSE(inspection.whyUnsearched(path));
+}
+
 TEST_CASE("the identity of the source is constant")
 {
     SourceMachine machine;

@@ -55,6 +55,9 @@ inline constexpr int OBMediaSourceTypePlugin = 4; ///< media source type of an o
 inline constexpr int OBMediaTypesMovies = 4; ///< what `mediaTypesSupported` answers for movies
 inline constexpr int OBQueryRunModeLive = 4; ///< a query that keeps reporting after it has gathered
 
+/// What the name of a bundle's folder ends with, behind a full stop.
+inline constexpr std::string_view OBBundleExtension = "obplugin";
+
 /// The version of the interface between this host and its plug-ins; a bundle names the range it was made for.
 inline constexpr int OBHostInterfaceVersion = 1;
 /// Grows when the interface gains something and keeps everything: it refuses no bundle.

@@ -4,6 +4,7 @@
 
 #include "host/PluginLibrary.h"
 
+#include "host/OBConstants.h"
 #include "platform/Bundles.h"
 #include "platform/FileSystem.h"
 #include "platform/Languages.h"
@@ -18,7 +19,6 @@ using platform::Value;
 
 namespace {
 
-constexpr std::string_view bundleExtension = "obplugin";
 constexpr std::string_view fallbackLanguage = "en";
 
 /// Ends its manager when the application has dropped the last reference.
@@ -71,7 +71,7 @@ std::vector<std::string> bundlesIn(const platform::FileSystem& fileSystem, const
     std::vector<std::string> paths;
     const platform::FolderListing listing = fileSystem.itemsInFolder(folder, {});
     for (const platform::FolderItem item : listing) {
-        if (platform::extensionOfName(item.name) == bundleExtension)
+        if (platform::extensionOfName(item.name) == OBBundleExtension)
             paths.push_back(platform::pathJoined(folder, item.name));
     }
     std::sort(paths.begin(), paths.end());

@@ -1,12 +1,13 @@
 #include "apps/common/Session.h"
 
 #include "apps/common/HostileNames.h"
+#include "apps/common/PluginPath.h"
 #include "apps/common/StandardError.h"
 #include "apps/common/Terminal.h"
 
+#include <algorithm>
 #include <charconv>
-#include <filesystem>
-#include <system_error>
+#include <cstddef>
 #include <utility>
 #include <vector>
 
@@ -34,25 +35,22 @@ namespace {
         printError(name + "[" + std::to_string(level) + "]: " + escapedText(message));
     }
 
-    /// Bundles are read from when something of them is needed, and the working folder may be another one then.
-    std::string absoluteFolder(std::string_view folder)
+    /// What there is instead of a source that was not found, and what keeps bundles from being found.
+    std::string whyNotFound(OBMediaHost& host, const platform::FileSystem& fileSystem)
     {
-        std::error_code error;
-        const std::filesystem::path absolute = std::filesystem::absolute(folder, error);
-        return error ? std::string(folder) : absolute.string();
-    }
-
-    std::vector<std::string> foldersOfPluginPath()
-    {
-        std::vector<std::string> folders;
-        std::string_view rest = environmentVariable("OMBRIX_PLUGIN_PATH");
-        while (!rest.empty()) {
-            const std::string_view folder = rest.substr(0, rest.find(':'));
-            rest.remove_prefix(std::min(rest.size(), folder.size() + 1));
-            if (!folder.empty())
-                folders.push_back(absoluteFolder(folder));
+        constexpr std::size_t mostNamed = 3;
+        std::vector<std::string> found;
+        for (const OBPluginInfo& plugin : host.plugins()) {
+            if (!plugin.identifier.empty() && std::find(found.begin(), found.end(), plugin.identifier) == found.end())
+                found.push_back(plugin.identifier);
         }
-        return folders;
+        std::string text = "there is no such plug-in";
+        for (std::size_t index = 0; index < std::min(found.size(), mostNamed); ++index)
+            text += (index == 0 ? "; found: " : ", ") + found[index];
+        if (found.size() > mostNamed)
+            text += " and " + std::to_string(found.size() - mostNamed) + " more";
+        const std::vector<std::string> problems = problemsOfPluginPath(fileSystem);
+        return problems.empty() ? text : text + "; " + problems.front();
     }
 
     OBHostOptions hostOptions()
@@ -83,9 +81,17 @@ std::shared_ptr<OBMediaManager> Session::manager()
         OBManagerResult result = _host.createManager(_source);
         _manager = std::move(result.manager);
         if (!_manager)
-            _problem = result.problem.empty() ? _source + ": there is no such plug-in" : std::move(result.problem);
+            _problem = knows(_source) ? std::move(result.problem)
+                                      : _source + ": " + whyNotFound(_host, _platform.fileSystem);
     }
     return _manager;
+}
+
+bool Session::knows(const std::string& source)
+{
+    const std::vector<OBPluginInfo> plugins = _host.plugins();
+    return std::any_of(
+        plugins.begin(), plugins.end(), [&](const OBPluginInfo& plugin) { return plugin.identifier == source; });
 }
 
 SessionResult openSession(const SessionWishes& wishes)

@@ -33,6 +33,8 @@ public:
     const std::string& problem() const { return _problem; }
 
 private:
+    bool knows(const std::string& source);
+
     const std::unique_ptr<Machine> _machine;
     const platform::Platform _platform;
     OBMediaHost _host;

@@ -1,6 +1,7 @@
 // "plugins": every bundle that was found, and whether it works.
 
 #include "apps/common/DisplayWidth.h"
+#include "apps/common/PluginPath.h"
 #include "apps/common/RecordJson.h"
 #include "apps/ombrix/Commands.h"
 #include "apps/ombrix/Program.h"
@@ -69,6 +70,9 @@ int runPlugins(Program& program)
         printJson(program, plugins);
     else
         printText(program, plugins);
+    program.output().flush();
+    for (const std::string& problem : apps::problemsOfPluginPath(session->platform().fileSystem))
+        program.warn(problem);
     return done;
 }
 

@@ -201,5 +201,5 @@ TEST_CASE("a disk's format is refused without a path and for an unknown source")
     checkRefused(
         runProgram({ { "disk-format" }, {}, {} }), 2, "disk-format: PATH is missing (\"ombrix help disk-format\")");
     checkRefused(runProgram({ { "disk-format", "/", "--source", "org.example.None" }, {}, {} }), 1,
-        "org.example.None: there is no such plug-in");
+        "org.example.None: there is no such plug-in; found: org.ombrix.OBMontaroPlugin");
 }

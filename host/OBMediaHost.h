@@ -32,6 +32,7 @@ struct OBPluginInfo {
     std::string path; ///< the bundle's folder
     bool loaded = false;
     std::string reason; ///< why it is refused, one line; empty when it is not
+    std::string flaw {}; ///< what is amiss in one that is used all the same, one line: texts that cannot be read
 };
 
 /// A manager, or why there is none.

@@ -158,6 +158,7 @@ void PluginLibrary::load(Plugin& plugin, std::vector<std::string>& toLog)
     if (plugin.info.loaded) {
         plugin.bundle = std::make_shared<const OBBundle>(
             _core.platform().bundles, plugin.info.path, plugin.manifest, stringTable(plugin, toLog));
+        plugin.info.flaw = toLog.empty() ? std::string() : toLog.front();
     }
 }
 

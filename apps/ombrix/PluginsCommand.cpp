@@ -19,13 +19,19 @@ namespace {
         return text.empty() ? Value() : Value(std::string_view(text));
     }
 
+    /// Why it is refused, else what is amiss in it; empty when all is well.
+    const std::string& remarkOn(const OBPluginInfo& plugin)
+    {
+        return plugin.reason.empty() ? plugin.flaw : plugin.reason;
+    }
+
     void printJson(Program& program, const std::vector<OBPluginInfo>& plugins)
     {
         Value::List list;
         for (const OBPluginInfo& plugin : plugins) {
             list.emplace_back(Value::Dictionary { { "identifier", textOrNull(plugin.identifier) },
                 { "version", textOrNull(plugin.version) }, { "path", textOrNull(plugin.path) },
-                { "loaded", plugin.loaded }, { "reason", textOrNull(plugin.reason) } });
+                { "loaded", plugin.loaded }, { "reason", textOrNull(remarkOn(plugin)) } });
         }
         apps::printValue(program.output(), std::move(list));
     }
@@ -53,8 +59,8 @@ namespace {
             program.printLine(line.text());
             if (!isBeside)
                 program.printLine(TextLine(style, program.columns()).addName(4, path, TextLine::Look::dim).text());
-            if (!plugin.reason.empty())
-                program.printWrapped(TextLine(style, program.columns()), 4, style.name(plugin.reason));
+            if (const std::string& remark = remarkOn(plugin); !remark.empty())
+                program.printWrapped(TextLine(style, program.columns()), 4, style.name(remark));
         }
     }
 

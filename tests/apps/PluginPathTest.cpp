@@ -3,6 +3,7 @@
 
 #include <doctest/doctest.h>
 
+#include <filesystem>
 #include <string>
 
 using namespace tests;
@@ -65,4 +66,18 @@ TEST_CASE("a source that is not found is told by the first few that are, each na
     CHECK(errorsFor(folder.path("plugins"))
         == "ombrix: " + std::string(missing) + "; found: org.test.A, org.test.B, org.test.C and 2 more\n");
     CHECK(run(folder.path("plugins"), { "plugins" }).errors == "");
+}
+
+TEST_CASE("a plug-in is loaded and listed with its table of texts that cannot be read")
+{
+    const TemporaryFolder folder;
+    const std::string bundle = folder.path("plugins/Waiting.obplugin");
+    folder.folder("plugins");
+    std::filesystem::copy(WAITING_PLUGINS "/Waiting.obplugin", bundle, std::filesystem::copy_options::recursive);
+    const std::string table = folder.file("plugins/Waiting.obplugin/resources/en.strings.plist", "no list");
+    const ProgramRun listed = run(folder.path("plugins"), { "plugins", "--json" });
+    CAPTURE(listed.output);
+    CHECK(listed.output.find("\"path\":\"" + bundle + "\",\"loaded\":true,\"reason\":\"" + table + ": ")
+        != std::string::npos);
+    CHECK(run(folder.path("plugins"), { "plugins" }).output.find("\n    " + table + ": ") != std::string::npos);
 }

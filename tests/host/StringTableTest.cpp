@@ -38,6 +38,7 @@ TEST_CASE("no text for a key is told from an empty text")
     TestHost test;
     test.bundle().tables["en"] = tableWith("Events");
     const auto manager = test.manager();
+    CHECK(test.host().plugins().front().flaw == "");
     CHECK(manager->localizedString("title") == "Events");
     CHECK_FALSE(manager->localizedString("empty").isAbsent());
     CHECK(manager->localizedString("empty").empty());
@@ -68,6 +69,7 @@ TEST_CASE("a damaged table is logged, and the next language is used, or else Eng
     TestHost test;
     test.bundle().tables["ar"] = { {}, "ar.strings.plist: cut short" };
     CHECK(titleIn(test, { "ar", "de" }) == "Ereignisse");
+    CHECK(test.host().plugins().front().flaw == "ar.strings.plist: cut short");
     CHECK(test.log->lines() == Lines { "2 - ar.strings.plist: cut short" });
 
     TestHost alone;
@@ -82,6 +84,11 @@ TEST_CASE("a plug-in whose only table is damaged has no texts and works")
     test.bundle().tables["en"] = { {}, "en.strings.plist: no property list" };
     CHECK(test.manager()->localizedString("title").isAbsent());
     CHECK(test.log->lines() == Lines { "2 - en.strings.plist: no property list" });
+    const auto plugins = test.host().plugins();
+    REQUIRE(plugins.size() == 1);
+    CHECK(plugins[0].loaded);
+    CHECK(plugins[0].reason == "");
+    CHECK(plugins[0].flaw == "en.strings.plist: no property list");
 }
 
 TEST_CASE("the log is written outside of the host's locks when a damaged table is met")

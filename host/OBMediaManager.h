@@ -46,7 +46,7 @@ private:
     std::shared_ptr<const OBBundle> _bundle;
 };
 
-/// Declares that a class is a complete source plug-in.
+/// Declares that a class is a complete source plug-in. Asks for no operation, and the framework does not look for it.
 class OBMediaManagerPlugin_MustImplement {
 protected:
     ~OBMediaManagerPlugin_MustImplement() = default;
@@ -101,13 +101,17 @@ public:
     virtual OBMediaGroupList movieGroups();
 
     virtual platform::Text displayName();
+    /// The source's picture in a list of sources, as a rule that of the root; null for none.
     virtual OBImageRef displayImage();
+    /// What tells this source from others in what an application keeps; the plug-in's identifier unless overridden.
     virtual platform::Text uniqueID();
     virtual platform::Text rootMediaGroupTitle();
     virtual OBImageRef rootMediaGroupIcon();
     virtual int mediaTypesSupported();
 
+    /// Of the application that the source's media come from, for people; absent where it has none or none is known.
     virtual platform::Text applicationVersion();
+    /// Unless overridden: whether `getAppPath` answers a path.
     virtual bool appInstalled();
     /// Absent when the source's application is not installed.
     virtual platform::Text getAppPath();
@@ -139,6 +143,8 @@ public:
     bool isCancelLoadRequestPending() const noexcept;
     /// True until the first `loadData` has returned.
     bool firstTimeCallingLoadData() const;
+    /// Whether whoever asks next gets a load in place of the installed tree; a load that begins clears it. Where
+    /// automatic reloads are enabled and somebody observes, true starts that load.
     void setNeedsReload(bool needsReload);
     void setAutoReloadEnabled(bool enabled);
     /// 0.5 and above is normal priority; below, the load thread becomes nicer, up to the nicest at 0.0.

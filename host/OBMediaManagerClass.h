@@ -21,7 +21,7 @@ class OB_EXPORT OBMediaManagerClass {
 public:
     virtual ~OBMediaManagerClass();
 
-    /// Whether the framework itself manages the media of this source.
+    /// Whether the framework itself manages the media of this source. For applications; no load depends on it.
     virtual bool isManagedMediaSource() const;
     /// A list of the pasteboard types that this source can write.
     virtual platform::Value supportedPasteboardTypes() const;

@@ -30,7 +30,8 @@ struct WatchingProblem;
 class OB_EXPORT OBPathWatcherObserver {
 public:
     virtual ~OBPathWatcherObserver();
-    /// Something at or below a watched path changed. `path` is spelled as it was watched.
+    /// Something at or below a watched path changed. `path` is spelled as it was watched. `flags` are 0: what happened
+    /// there is not told.
     virtual void watchedPathChanged_fileChangedEventFlags(std::string_view path, std::uint64_t flags);
     /// The result of a query changed, or it finished gathering: the notification's name tells which.
     virtual void watchedQueryChanged_queryScope(

@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -38,7 +39,7 @@ struct MachineOfFolders {
     {
         words.insert(words.end(), { "--machine", disk.path("machine.json") });
         RunWishes wishes { std::move(words) };
-        wishes.environment = { { "OMBRIX_PLUGIN_PATH", OMBRIX_EXAMPLE_PLUGINS }, { "OMBRIX_FOLDERS", folders },
+        wishes.environment = { { "OMBRIX_PLUGIN_PATH", plugins }, { "OMBRIX_FOLDERS", folders },
             { "PATH", disk.path("bin") + ":/usr/bin:/bin" },
             { "DBUS_SESSION_BUS_ADDRESS", "unix:path=" + disk.path("no-bus") } };
         return runProgram(wishes);
@@ -54,8 +55,23 @@ struct MachineOfFolders {
     /// A folder twice, one that is no absolute path, and one that is missing too.
     static constexpr const char* allFolders = "/Clips:/Volumes/Stick/Films/:/Clips:here:/Clips/Empty::/missing";
 
+    std::string plugins = OMBRIX_EXAMPLE_PLUGINS;
     TemporaryFolder disk {};
 };
+
+/// Copies the headers that a source may include, and no other.
+void copyPublicHeaders(const std::string& folder)
+{
+    for (const char* name : { "host", "platform" }) {
+        makeFolder(folder + "/" + name);
+        for (const auto& entry : std::filesystem::directory_iterator(OMBRIX_SOURCE_FOLDER "/" + std::string(name))) {
+            const std::string file = entry.path().filename();
+            const bool isPublic = file.ends_with(".h") && (name == std::string("platform") || file.starts_with("OB"));
+            if (isPublic)
+                std::filesystem::copy(entry.path(), folder + "/" + name);
+        }
+    }
+}
 
 std::string golden(const std::string& name)
 {
@@ -169,6 +185,41 @@ TEST_CASE("the example of a source is found beside the installed one, which is n
     CHECK(found.output.find("org.ombrix.OBMontaroPlugin") != std::string::npos);
     const ProgramRun other = machine.run(MachineOfFolders::allFolders, { "tree" });
     CHECK(other.errors == "ombrix: Montaro: the editor is not installed, so its libraries are not shown\n");
+}
+
+TEST_CASE("the example of a source is built outside of this tree with the public headers and the library alone")
+{
+    MachineOfFolders machine;
+    copyPublicHeaders(machine.disk.path("headers"));
+    machine.plugins = machine.disk.folder("plugins");
+    RunWishes build { { machine.disk.path("headers"), OMBRIX_LIBRARIES, machine.plugins + "/Folders.obplugin" } };
+    build.program = exampleFolder + "build.sh";
+    build.environment
+        = { { "PATH", "/usr/bin:/bin" }, { "CXX", OMBRIX_COMPILER }, { "CXXFLAGS", OMBRIX_COMPILER_FLAGS } };
+    const ProgramRun built = runProgram(build);
+    REQUIRE(built.errors == "");
+    REQUIRE(built.status == 0);
+    CHECK(machine.printed({ "tree" }) == golden("tree.txt"));
+}
+
+TEST_CASE("a public header includes no header that is not public")
+{
+    const TemporaryFolder headers;
+    copyPublicHeaders(headers.path());
+    int includes = 0;
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(headers.path())) {
+        std::istringstream lines(entry.is_regular_file() ? contentOf(entry.path()) : std::string());
+        for (std::string line; std::getline(lines, line);) {
+            constexpr std::string_view include = "#include \"";
+            if (!line.starts_with(include))
+                continue;
+            CAPTURE(entry.path());
+            CAPTURE(line);
+            CHECK(std::filesystem::exists(headers.path(line.substr(include.size(), line.rfind('"') - include.size()))));
+            ++includes;
+        }
+    }
+    CHECK(includes > 50);
 }
 
 TEST_CASE("the example of a source has fewer than two hundred lines")

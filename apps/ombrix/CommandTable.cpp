@@ -14,7 +14,7 @@ namespace {
 
     constexpr OptionInfo global[] {
         { "--machine", "", "FILE", "use the machine that FILE describes, not this one" },
-        { "--source", "", "IDENTIFIER", "the plug-in whose tree is meant" },
+        { "--source", "", "IDENTIFIER", "the plug-in meant; not with plugins, query or help" },
         { "--color", "", "WHEN", "auto, always or never", false, true },
         { "--hyperlink", "", "WHEN", "names as links to their folders: auto, always, never", false, true },
         { "--help", "-h", "", "this text, or that of a command" },

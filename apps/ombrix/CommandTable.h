@@ -44,7 +44,7 @@ struct CommandInfo {
 std::span<const CommandInfo> commands();
 /// Null when there is no such command. Finds also what the program asks of itself, which is listed nowhere.
 const CommandInfo* commandNamed(std::string_view name);
-/// Those that every command takes, before or after its name.
+/// Those that every command takes, before or after its name; --source only where it asks one source.
 std::span<const OptionInfo> globalOptions();
 
 } // namespace ombrix

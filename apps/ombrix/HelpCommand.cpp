@@ -94,7 +94,8 @@ std::string helpText(const CommandInfo& command)
         text += "  " + std::string(example.command) + "\n";
         text += "      " + std::string(example.text) + "\n";
     }
-    text += "\nOptions of every command: \"ombrix --help\".\n";
+    text += command.takesSource ? "\nOptions of every command" : "\nOptions of every command, without --source";
+    text += ": \"ombrix --help\".\n";
     return text;
 }
 

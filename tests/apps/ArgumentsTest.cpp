@@ -88,6 +88,18 @@ TEST_CASE("an option that a command cannot do without is missed, and stands with
     CHECK(helpText(*commandNamed("tree")).find(" [--all] ") != std::string::npos);
 }
 
+TEST_CASE("help tells of the commands to which no source can be named, each by itself and all together")
+{
+    const std::string all = helpText();
+    const std::string line = all.substr(all.find("  --source"), all.find("  --color") - all.find("  --source"));
+    for (const CommandInfo& command : commands()) {
+        CAPTURE(command.name);
+        const bool isExcepted = !command.takesSource;
+        CHECK((line.find(" " + std::string(command.name)) != std::string::npos) == isExcepted);
+        CHECK((helpText(command).find("without --source") != std::string::npos) == isExcepted);
+    }
+}
+
 TEST_CASE("a mistake is told in one line with a suggestion")
 {
     CHECK(parse({ "tre" }).problem == "unknown command \"tre\" (did you mean \"tree\"?)");

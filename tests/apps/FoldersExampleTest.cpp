@@ -233,7 +233,9 @@ TEST_CASE("what the guide for authors shows of a source is a part of the example
 {
     const std::string example = wholeExample();
     int parts = 0;
-    for (const FencedBlock& block : fencedBlocks(contentOf(OMBRIX_SOURCE_FOLDER "/docs/plugins.md"))) {
+    const std::string guide = contentOf(OMBRIX_SOURCE_FOLDER "/docs/plugins.md");
+    const std::string reference = contentOf(OMBRIX_SOURCE_FOLDER "/docs/plugins-reference.md");
+    for (const FencedBlock& block : fencedBlocks(guide + reference)) {
         if (block.language == "sh")
             continue;
         CAPTURE(block.text);

@@ -28,12 +28,14 @@ public:
         _farthestAhead = std::max(_farthestAhead, index - std::min(index, _taken));
         return ++_inside;
     }
-    /// Lets a millisecond pass, on the processor or not, and ends the job.
+    /// Lets time pass, on the processor or not, and ends the job.
     void end(Need need)
     {
         std::lock_guard guard(_lock);
+        // Threads share both clocks here. So much that what other threads do between a look at one and a look at the
+        // other is nothing against it.
         if (need == Need::processor)
-            host.machine.threads.processorTime = host.machine.threads.processorTime.load() + 1ms;
+            host.machine.threads.processorTime = host.machine.threads.processorTime.load() + 100ms;
         host.machine.bare.clock.advance(1ms);
         --_inside;
     }

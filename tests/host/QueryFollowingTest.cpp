@@ -52,12 +52,13 @@ struct QueryOfFolder {
     {
         disk().tell(folder, { kind, isFolder, heldMore, folder + "/" + name });
     }
-    /// Whether a change is told as an update. What comes after it shows that nothing is on its way any more.
+    /// Whether a change is told as an update.
     bool updates(Kind kind, const std::string& name, bool isFolder = false, bool heldMore = false)
     {
         tell(kind, name, isFolder, heldMore);
         disk().tellStanding(folder);
         CHECK(listener.journal.waitFor(finished));
+        CHECK(waitUntil([this] { return watcher().isAtRest(&listener); })); // the two may overtake one another
         return listener.journal.count(updated) != 0;
     }
 

@@ -99,13 +99,19 @@ void SourceMachine::waitForThreads()
         cannotGoOn("a thread of the source does not end");
 }
 
-OBLoadResult SourceMachine::load(OBMediaManager& manager)
+std::future<OBLoadResult> SourceMachine::beginLoad(OBMediaManager& manager)
 {
     const auto answer = std::make_shared<std::promise<OBLoadResult>>();
     std::future<OBLoadResult> result = answer->get_future();
     manager.setNeedsReload(true);
     manager.requestRootMediaGroup([](const std::function<void()>& call) { call(); },
         [answer](OBLoadResult loaded) { answer->set_value(std::move(loaded)); });
+    return result;
+}
+
+OBLoadResult SourceMachine::load(OBMediaManager& manager)
+{
+    std::future<OBLoadResult> result = beginLoad(manager);
     if (result.wait_for(longestWait) != std::future_status::ready)
         cannotGoOn("a load does not end");
     return result.get();
@@ -170,7 +176,7 @@ HeldLoad::HeldLoad(SourceMachine& machine, OBMediaManager& manager)
     : _machine(machine)
 {
     _machine.workspace.whenAsked = [this] { _stop.stopHere(); };
-    _load = std::thread([&machine, &manager] { machine.load(manager); });
+    _load = machine.beginLoad(manager);
     if (!_stop.waitUntilReached())
         cannotGoOn("a load does not begin");
 }
@@ -178,7 +184,8 @@ HeldLoad::HeldLoad(SourceMachine& machine, OBMediaManager& manager)
 HeldLoad::~HeldLoad()
 {
     _stop.release();
-    _load.join();
+    if (_load.wait_for(longestWait) != std::future_status::ready)
+        cannotGoOn("a load does not end");
     _machine.waitForThreads();
     _machine.workspace.whenAsked = nullptr;
 }

@@ -21,6 +21,7 @@
 #include "tests/support/TemporaryFolder.h"
 #include "tests/support/VirtualClock.h"
 
+#include <future>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -63,6 +64,8 @@ public:
 
     /// Runs one load, also where a tree is installed already.
     OBLoadResult load(OBMediaManager& manager);
+    /// Asks for the same, and waits for nothing.
+    std::future<OBLoadResult> beginLoad(OBMediaManager& manager);
     /// Tells observers that a volume was mounted at `path`, and lets time pass until what they do has ended.
     void tellOfVolume(const char* path);
     /// Runs `call` on the main thread and waits.
@@ -146,7 +149,7 @@ public:
 private:
     SourceMachine& _machine;
     Stop _stop;
-    std::thread _load;
+    std::future<OBLoadResult> _load;
 };
 
 } // namespace tests

@@ -252,12 +252,15 @@ bool ManagerState::firstLoadData() const
 
 void ManagerState::loadDataCalled()
 {
+    // Also of a load that throws: what the first one sets up stands.
+    const std::shared_ptr<void> wasFirst(nullptr, [this](void*) {
+        std::lock_guard guard(_lock);
+        _firstLoadData = false;
+    });
     if (loadingOnThisThread == this)
         performLoad();
     else
         requestLoad(Job::performOnly);
-    std::lock_guard guard(_lock);
-    _firstLoadData = false;
 }
 
 void ManagerState::performLoad()

@@ -61,4 +61,4 @@ inline constexpr std::string_view OBBundleExtension = "obplugin";
 /// The version of the interface between this host and its plug-ins; a bundle names the range it was made for.
 inline constexpr int OBHostInterfaceVersion = 1;
 /// Grows when the interface gains something and keeps everything: it refuses no bundle.
-inline constexpr int OBHostInterfaceMinorVersion = 0;
+inline constexpr int OBHostInterfaceMinorVersion = 1;

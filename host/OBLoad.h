@@ -15,8 +15,8 @@ enum class OBLoadOutcome : std::uint8_t {
     loaded, ///< the tree is complete
     cancelled, ///< somebody cancelled: the tree holds what had been gathered
     unavailable, ///< the source cannot load now: `canLoadData` answered false
-    failed, ///< the source threw an error, and the tree is as it was
     ended, ///< the manager has ended
+    failed, ///< the source threw an error; the tree is the one that was installed last
 };
 
 /// The answer to a request for a tree.

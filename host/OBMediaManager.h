@@ -175,7 +175,7 @@ public:
     /// Runs `call` on the main thread and waits; false, with `call` not run, when the main loop has ended.
     bool performOnMainThreadAndWait(const std::function<void()>& call);
     /// Calls `job` once for each index below `count`, on this thread and a few others, and `take` for each in order, on
-    /// this thread alone. When it returns no thread is inside `job` any more. The calls must not throw.
+    /// this thread alone. When it returns, or throws what one of the calls threw, no thread is inside `job` any more.
     void performInOrder(std::size_t count, const std::function<void(std::size_t index)>& job,
         const std::function<void(std::size_t index)>& take);
     /// Runs `body` on a thread of its own, which keeps this manager alive. False when there is none to be had.

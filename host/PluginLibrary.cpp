@@ -5,6 +5,7 @@
 #include "host/PluginLibrary.h"
 
 #include "host/OBConstants.h"
+#include "host/SourceCall.h"
 #include "platform/Bundles.h"
 #include "platform/FileSystem.h"
 #include "platform/Languages.h"
@@ -46,24 +47,11 @@ struct Deallocate {
     }
 };
 
-std::string onOneLine(std::string text)
-{
-    std::replace_if(
-        text.begin(), text.end(), [](unsigned char letter) { return letter < ' '; }, ' ');
-    return text;
-}
-
-/// Calls code of a plug-in; the text of what it throws, or nothing.
+/// Calls code of a plug-in; what it throws, or nothing.
 template <class Call> std::string textOfThrown(const Call& call)
 {
-    try {
-        call();
-        return {};
-    } catch (const std::exception& error) {
-        return onOneLine(std::string("it threw: ") + error.what());
-    } catch (...) {
-        return "it threw";
-    }
+    const std::string error = errorThrownBy(call);
+    return error.empty() ? error : "it threw: " + error;
 }
 
 std::vector<std::string> bundlesIn(const platform::FileSystem& fileSystem, const std::string& folder)

@@ -11,6 +11,7 @@ class PendingReads {
 public:
     /// Gives `bytes`, which stay where they are, to the pipe, and closes it behind them.
     void add(int pipe, std::string_view bytes);
+    bool isEmpty() const { return _reads.empty(); }
     /// What to wait for.
     std::vector<pollfd> sides() const;
     /// Goes on with every pipe that takes something.

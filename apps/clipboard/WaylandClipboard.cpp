@@ -34,6 +34,7 @@ private:
     void takeClipboard();
     void hearOfSelection(wl_data_offer* selection);
     void give(std::string_view type, int pipe);
+    void lose() { _isLost = true; }
 
     static const wl_seat_listener seatListener;
     static const wl_keyboard_listener keyboardListener;
@@ -51,6 +52,7 @@ private:
     wl_data_source* _source = nullptr;
     bool _isAsked = false; ///< since the focus came
     bool _isOwner = false;
+    bool _isLost = false; ///< another program has the clipboard; who reads already gets the rest
     PendingReads _reads {};
 };
 
@@ -96,7 +98,7 @@ const wl_data_device_listener WaylandClipboard::deviceListener {
 const wl_data_source_listener WaylandClipboard::sourceListener {
     .target = [](void*, wl_data_source*, const char*) {},
     .send = [](void* self, wl_data_source*, const char* type, int32_t pipe) { clipboardOf(self).give(type, pipe); },
-    .cancelled = [](void*, wl_data_source*) { endNow(0); },
+    .cancelled = [](void* self, wl_data_source*) { clipboardOf(self).lose(); },
     .dnd_drop_performed = nullptr,
     .dnd_finished = nullptr,
     .action = nullptr,
@@ -114,8 +116,9 @@ WaylandClipboard::WaylandClipboard(const WaylandDisplay& display, OfferChannel& 
 
 void WaylandClipboard::run()
 {
-    for (;;)
+    while (!_isLost || !_reads.isEmpty())
         attend();
+    endNow(0);
 }
 
 // Reading comes between preparing and dispatching, as wl_display_prepare_read(3) wants it.

@@ -86,7 +86,9 @@ std::optional<Problem> DesktopClipboard::open()
 std::optional<Problem> DesktopClipboard::offer(const std::vector<ClipboardItem>& items)
 {
     // Where the program has ended meanwhile, the wait for its answer says so.
-    static_cast<void>(send(writtenOffer(items), steady_clock::now() + _patience));
+    const Time began = steady_clock::now();
+    static_cast<void>(send(writtenOffer(items), began + _patience));
+    _patience = std::max(_patience - (steady_clock::now() - began), decltype(_patience)());
     if (std::optional<Problem> trouble = waitFor(ClipboardWord::owned, "did not hand it over"))
         return trouble;
     static_cast<void>(send({ &keepClipboard, 1 }, steady_clock::now() + _patience));

@@ -10,21 +10,28 @@
 namespace ombrix {
 namespace {
 
+    platform::Text actionOf(const OBMenuItem& item)
+    {
+        return item.action ? platform::Text(item.action->name) : platform::Text();
+    }
+
     platform::Value valueOf(const OBMenu& menu)
     {
         platform::Value::List items;
         for (const OBMenuItem& item : menu.items) {
-            items.emplace_back(platform::Value::Dictionary { { "title", item.title },
-                { "action", platform::Text(item.action->name) }, { "keyEquivalent", item.keyEquivalent } });
+            items.emplace_back(platform::Value::Dictionary {
+                { "title", item.title }, { "action", actionOf(item) }, { "keyEquivalent", item.keyEquivalent } });
         }
         return platform::Value::Dictionary { { "title", menu.title }, { "items", std::move(items) } };
     }
 
     void print(Program& program, const OBMenu& menu)
     {
-        program.printLine(menu.title);
-        for (const OBMenuItem& item : menu.items)
-            program.printLine("  " + item.title.string() + "  (" + std::string(item.action->name) + ")");
+        program.printLine(program.style().name(menu.title));
+        for (const OBMenuItem& item : menu.items) {
+            const std::string action = item.action ? "  (" + std::string(item.action->name) + ")" : std::string();
+            program.printLine("  " + program.style().name(item.title) + action);
+        }
     }
 
 } // namespace

@@ -165,7 +165,8 @@ OBMediaGroupRef Program::load(const std::shared_ptr<OBScanObserver>& observer)
         source->setScanObserver(observer);
     const apps::TreeLoad load = apps::loadTree(source);
     _loadDuration = load.duration;
-    if (load.result.outcome != OBLoadOutcome::unavailable && load.result.rootMediaGroup)
+    const bool hasLoaded = load.result.problem.empty() && load.result.outcome != OBLoadOutcome::unavailable;
+    if (hasLoaded && load.result.rootMediaGroup)
         return load.result.rootMediaGroup;
     failLoad(*source, load.result);
     return nullptr;

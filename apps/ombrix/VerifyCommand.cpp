@@ -106,17 +106,11 @@ namespace {
                     return;
                 self->_platform.mainRunLoop.post([self] {
                     self->_held.reset();
-                    self->interrupted();
+                    self->_isToCompare = true;
+                    if (self->_isLoaded)
+                        self->settle();
                 });
             });
-        }
-
-        void interrupted()
-        {
-            if (_isLoaded)
-                return settle();
-            _status = _program.fail(_program.arguments().source, "interrupted before there was a tree to compare");
-            _platform.mainRunLoop.quit();
         }
 
         void loaded(const OBLoadResult& result)
@@ -130,7 +124,9 @@ namespace {
                 _program.printLine("following changes; Ctrl-C compares and ends");
                 _program.output().flush();
             }
-            if (_limit)
+            if (_isToCompare)
+                settle();
+            else if (_limit)
                 _platform.mainRunLoop.performAfterDelay(
                     *_limit, platform::RunLoopModes::common, [self = shared_from_this()] { self->settle(); });
         }
@@ -252,6 +248,7 @@ namespace {
         const std::optional<std::chrono::nanoseconds> _limit;
         std::optional<apps::EndingSignalsHeld> _held {};
         bool _isLoaded = false;
+        bool _isToCompare = false;
         bool _isSettling = false;
         std::optional<Verification> _last {};
         std::uint64_t _publicationsCompared = 0;

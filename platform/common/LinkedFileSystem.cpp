@@ -136,23 +136,23 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
 {
     if (request.links == LinkPolicy::stop)
         return listingThatStops(folder, request);
+    // Beside the folder as it is spelled, no matter where it lies.
+    if (!request.markerBeside.empty() && (_table.hasNamedLinks() || _table.mayApplyTo(folder)))
+        return listingBesideMarker(folder, request);
     ListingRequest stopping = request;
     stopping.links = LinkPolicy::stop;
     stopping.followsMarkers = !_table.hasNamedLinks();
     LinkedPlace place = substitutedPlaceOf(folder, LastLink::followed);
     if (place.problem != FileProblem::none)
         return FolderListing(place.problem);
-    // Beside the folder as it is spelled, no matter where it lies.
-    if (_table.hasNamedLinks() || place.path != folder)
-        stopping.markerBeside = {};
     // What named links change inside the items is told by listing each by itself.
     if (_table.hasNamedLinks() && (place.path != folder || _table.hasNamedLinkBelow(folder)))
         stopping.subfolder = {};
     FolderListing listing = _real.itemsInFolder(place.path, stopping);
     bool isUnsettled = listing.problem() == FileProblem::linkOnTheWay;
     const bool pathIsReal = !isUnsettled && place.path == folder && isPlainlySpelled(folder);
-    if (listing.problem() != FileProblem::none)
-        stopping.markerBeside = {};
+    if (listing.problem() != FileProblem::none && !request.markerBeside.empty())
+        return listingBesideMarker(folder, request);
     if (isUnsettled && !_table.hasNamedLinks()) {
         place.path = _real.resolvedPath(place.path);
         listing = _real.itemsInFolder(place.path, stopping);
@@ -165,6 +165,23 @@ FolderListing LinkedFileSystem::itemsInFolder(std::string_view folder, const Lis
         listing.setOtherRealPath(place.path);
     if (!listing.empty())
         lookThroughLinks(listing, { pathWithoutTrailingSlashes(folder), place.path }, request);
+    return listing;
+}
+
+/// The same where what holds `folder` has to be asked for by its path; first, so that nothing is listed in vain.
+FolderListing LinkedFileSystem::listingBesideMarker(std::string_view folder, const ListingRequest& request) const
+{
+    const std::string_view holder = pathByRemovingLastComponent(folder);
+    if (!exists(pathJoined(holder, request.markerBeside))) {
+        FolderListing nothing;
+        nothing.setHolder({});
+        return nothing;
+    }
+    ListingRequest rest = request;
+    rest.markerBeside = {};
+    FolderListing listing = itemsInFolder(folder, rest);
+    if (const auto status = this->status(holder))
+        listing.setHolder({ true, status->modificationDate });
     return listing;
 }
 

@@ -43,6 +43,7 @@ private:
     template <class Answer>
     Answer askFollowingLinks(std::string_view path, Answer (*ask)(const FileSystem&, const std::string&),
         Answer (*failure)(FileProblem)) const;
+    FolderListing listingBesideMarker(std::string_view folder, const ListingRequest& request) const;
     FolderListing listingOfWalkedFolder(
         std::string_view folder, const ListingRequest& request, LinkedPlace& place) const;
     FolderListing listingThatStops(std::string_view folder, const ListingRequest& request) const;

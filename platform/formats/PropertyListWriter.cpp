@@ -1,12 +1,11 @@
 #include "platform/formats/PropertyList.h"
 
+#include "platform/NumberText.h"
 #include "platform/formats/Base64.h"
 #include "platform/formats/Dates.h"
 #include "platform/formats/Unicode.h"
 
 #include <algorithm>
-#include <charconv>
-#include <cmath>
 
 namespace platform {
 namespace {
@@ -48,17 +47,6 @@ namespace {
         }
     }
 
-    std::string realText(double real)
-    {
-        if (std::isnan(real))
-            return "nan";
-        if (std::isinf(real))
-            return real < 0 ? "-infinity" : "+infinity";
-        char digits[40];
-        const std::to_chars_result end = std::to_chars(std::begin(digits), std::end(digits), real);
-        return std::string(digits, end.ptr);
-    }
-
     /// Writes one value a call, and calls itself for what is inside; values are no deeper than what made them.
     class XmlWriter {
     public:
@@ -81,7 +69,7 @@ namespace {
             case Value::Kind::integer:
                 return writeElement("integer", std::to_string(*value.integer()), level);
             case Value::Kind::real:
-                return writeElement("real", realText(*value.real()), level);
+                return writeElement("real", numberText(*value.real()), level);
             case Value::Kind::text:
                 return writeElement("string", value.text()->view(), level);
             case Value::Kind::date:
@@ -132,7 +120,7 @@ namespace {
 
         static std::string sizeText(Size size)
         {
-            return "{" + realText(size.width) + ", " + realText(size.height) + "}";
+            return "{" + numberText(size.width) + ", " + numberText(size.height) + "}";
         }
 
         std::string _xml;

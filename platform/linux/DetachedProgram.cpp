@@ -21,10 +21,13 @@ namespace {
         sigset_t none;
         sigemptyset(&none);
         sigprocmask(SIG_SETMASK, &none, nullptr);
-        signal(SIGPIPE, SIG_DFL);
+        for (int number = 1; number < NSIG; ++number)
+            signal(number, SIG_DFL);
         const int nowhere = open("/dev/null", O_RDWR);
         for (int standard = 0; nowhere >= 0 && standard <= 2; ++standard)
             dup2(standard < 2 && channel >= 0 ? channel : nowhere, standard);
+        // Nobody here may be kept waiting by what the program holds. Without the call an older kernel leaves it so.
+        close_range(STDERR_FILENO + 1, ~0U, CLOSE_RANGE_CLOEXEC);
         int problem = 0;
         if (chdir(workingFolder) == -1)
             problem = errno;

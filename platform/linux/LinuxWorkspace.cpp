@@ -190,9 +190,10 @@ void LinuxWorkspace::launchApplication(std::string_view identifier)
         if (!application)
             return name + ": no such application";
         if (application->isActivatedByBus) {
-            std::string problem = activateApplicationOnBus(name, busLimit);
-            if (problem.empty() || application->command.empty())
-                return problem;
+            const BusAnswer answer = activateApplicationOnBus(name, busLimit);
+            // One that is slow to start must not be started twice.
+            if (answer.problem.empty() || answer.mayStillHappen || application->command.empty())
+                return answer.problem;
         }
         return startDetachedProgram(application->command, application->workingFolder);
     });
@@ -206,7 +207,7 @@ void LinuxWorkspace::launchProgram(std::string_view path)
 void LinuxWorkspace::revealFile(std::string_view path)
 {
     handOver([file = std::string(path)]() -> std::string {
-        if (showItemOnBus(fileUri(file), busLimit).empty())
+        if (showItemOnBus(fileUri(file), busLimit).problem.empty())
             return {};
         const std::string folder = file.substr(0, std::max<std::size_t>(file.rfind('/'), 1));
         const std::string problem = startDetachedProgram({ "xdg-open", folder }, {});

@@ -36,6 +36,7 @@ namespace {
         decltype(&sd_bus_get_fd) getFd = nullptr;
         decltype(&sd_bus_get_events) getEvents = nullptr;
         decltype(&sd_bus_get_timeout) getTimeout = nullptr;
+        decltype(&sd_bus_is_ready) isReady = nullptr;
         decltype(&sd_bus_message_get_error) getError = nullptr;
 
     private:
@@ -49,7 +50,8 @@ namespace {
                 && find(handle, "sd_bus_message_append", append) && find(handle, "sd_bus_message_unref", messageUnref)
                 && find(handle, "sd_bus_call_async", callAsync) && find(handle, "sd_bus_process", process)
                 && find(handle, "sd_bus_get_fd", getFd) && find(handle, "sd_bus_get_events", getEvents)
-                && find(handle, "sd_bus_get_timeout", getTimeout) && find(handle, "sd_bus_message_get_error", getError);
+                && find(handle, "sd_bus_get_timeout", getTimeout) && find(handle, "sd_bus_is_ready", isReady)
+                && find(handle, "sd_bus_message_get_error", getError);
         }
         template <class Function> static bool find(void* handle, const char* name, Function& function)
         {
@@ -98,57 +100,58 @@ namespace {
     }
 
     // The bus's own limit does not hold before it has let us in, so the whole exchange has one.
-    std::string exchange(const BusLibrary& library, sd_bus* bus, Answer& answer, Clock::time_point end)
+    BusAnswer exchange(const BusLibrary& library, sd_bus* bus, Answer& answer, Clock::time_point end)
     {
         while (!answer.problem) {
             const int processed = library.process(bus, nullptr);
             if (processed < 0)
-                return systemText(processed);
+                return { systemText(processed) };
             if (processed > 0)
                 continue;
             if (Clock::now() >= end)
-                return "no answer in time";
+                return { "no answer in time", library.isReady(bus) > 0 };
             pollfd waiting { library.getFd(bus), static_cast<short>(library.getEvents(bus)), 0 };
             poll(&waiting, 1, waitTime(library, bus, end));
         }
-        return *answer.problem;
+        return { *answer.problem };
     }
 
     template <class... Arguments>
-    std::string call(const Place& place, std::chrono::milliseconds limit, const char* types, Arguments... arguments)
+    BusAnswer call(const Place& place, std::chrono::milliseconds limit, const char* types, Arguments... arguments)
     {
         const BusLibrary* const library = BusLibrary::load();
         if (!library)
-            return "libsystemd.so.0 is not installed";
+            return { "libsystemd.so.0 is not installed" };
         const Clock::time_point end = Clock::now() + limit;
         sd_bus* opened = nullptr;
         if (const int result = library->openUser(&opened); result < 0)
-            return "there is no session bus: " + systemText(result);
+            return { "there is no session bus: " + systemText(result) };
         const std::unique_ptr<sd_bus, decltype(library->closeUnref)> bus(opened, library->closeUnref);
         sd_bus_message* made = nullptr;
         int result = library->newMethodCall(
             bus.get(), &made, place.destination.c_str(), place.path.c_str(), place.interface, place.member);
         if (result < 0)
-            return systemText(result);
+            return { systemText(result) };
         const std::unique_ptr<sd_bus_message, decltype(library->messageUnref)> message(made, library->messageUnref);
         result = library->append(message.get(), types, arguments...);
         Answer answer { library };
-        const auto microseconds = static_cast<std::uint64_t>(std::chrono::microseconds(limit).count());
+        // The exchange has its own limit, which comes first.
+        const auto microseconds = static_cast<std::uint64_t>(std::chrono::microseconds(2 * limit).count());
         if (result >= 0)
             result = library->callAsync(bus.get(), nullptr, message.get(), takeAnswer, &answer, microseconds);
-        return result < 0 ? systemText(result) : exchange(*library, bus.get(), answer, end);
+        return result < 0 ? BusAnswer { systemText(result) } : exchange(*library, bus.get(), answer, end);
     }
 
 } // namespace
 
-std::string showItemOnBus(const std::string& uri, std::chrono::milliseconds limit)
+BusAnswer showItemOnBus(const std::string& uri, std::chrono::milliseconds limit)
 {
     const Place place { "org.freedesktop.FileManager1", "/org/freedesktop/FileManager1", "org.freedesktop.FileManager1",
         "ShowItems" };
     return call(place, limit, "ass", 1, uri.c_str(), "");
 }
 
-std::string activateApplicationOnBus(const std::string& identifier, std::chrono::milliseconds limit)
+BusAnswer activateApplicationOnBus(const std::string& identifier, std::chrono::milliseconds limit)
 {
     // Desktop Entry Specification, "D-Bus Activation": the object's path is the identifier, with other signs.
     std::string path = "/" + identifier;

@@ -270,7 +270,7 @@ ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& fol
     return event;
 }
 
-/// From the open folder of clips what holds it is nearer than along the whole path. Where it is no event nothing is read.
+/// From the open folder of clips what holds it is nearer than along the whole path. Of what is no event nothing is read.
 ReadEvent OBMontaroPlugin::readEventWith(
     ClipScratch& scratch, const Text& library, const FoundFolder& folder, const EventScan& scan)
 {

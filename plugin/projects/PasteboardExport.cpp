@@ -8,10 +8,9 @@
 #include "plugin/OBMontaroPlugin.h"
 
 #include "host/OBConstants.h"
+#include "platform/NumberText.h"
 #include "platform/Pasteboard.h"
 
-#include <array>
-#include <charconv>
 #include <unordered_map>
 #include <utility>
 
@@ -23,16 +22,9 @@ namespace {
 
 constexpr const char* projectsPasteboardType = "OBMontaroProjectsPboardType";
 
-std::string numberText(double number)
-{
-    std::array<char, 32> digits {};
-    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), number).ptr;
-    return std::string(digits.data(), end);
-}
-
 std::string dimensionsText(const Size& size)
 {
-    return "{" + numberText(size.width) + ", " + numberText(size.height) + "}";
+    return "{" + platform::numberText(size.width) + ", " + platform::numberText(size.height) + "}";
 }
 
 /// Null for an object whose file is gone.

@@ -224,7 +224,7 @@ TEST_CASE("help and the version go to standard output")
     CHECK(help.output == runProgram({ { "help" }, {}, {} }).output);
     CHECK(help.output == runProgram({ { "--help", "x" }, {}, {} }).output);
     CHECK(runProgram({ { "tree", "-h" }, {}, {} }).output == runProgram({ { "help", "tree" }, {}, {} }).output);
-    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1.0)\n"));
+    CHECK(contains(runProgram({ { "--version" }, {}, {} }).output, "(host interface 1.1)\n"));
 }
 
 TEST_CASE("a preferences file that cannot be read is logged once, however many questions a command asks")

@@ -170,6 +170,31 @@ TEST_CASE("an editor that cannot be activated is started as its entry says")
     CHECK(desktop.whatStarted() == expected);
 }
 
+TEST_CASE("an editor that is slow to answer is not started a second time")
+{
+    const DesktopOfPerson desktop;
+    desktop.entry("Exec=montaro\nDBusActivatable=true\n");
+    const PrivateBus bus(desktop.disk.path(), editor, ServiceManner::keepsSilent);
+    REQUIRE(bus.problem() == "");
+    const ProgramRun run = desktop.run({ "open" }, bus.address());
+    CHECK(run.status == 1);
+    CHECK(run.errors == "ombrix: editor: no answer in time\n");
+    CHECK(bus.calls() == activation);
+    CHECK_FALSE(desktop.hasStarted());
+}
+
+TEST_CASE("a file behind a link and back is revealed where the system finds it")
+{
+    const DesktopOfPerson desktop;
+    const PrivateBus bus(desktop.disk.path(), editor, ServiceManner::answers);
+    REQUIRE(bus.problem() == "");
+    desktop.disk.file("far/away/inside");
+    desktop.disk.file("far/clip.mov");
+    desktop.disk.link("link", "far/away");
+    checkDone(desktop.run({ "reveal", desktop.disk.path("link/../clip.mov") }, bus.address()));
+    CHECK(bus.calls().find(desktop.disk.path("far/clip.mov")) != std::string::npos);
+}
+
 TEST_CASE("an editor that does not ask for it is never activated")
 {
     const DesktopOfPerson desktop;

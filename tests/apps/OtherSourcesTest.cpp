@@ -53,15 +53,6 @@ TEST_CASE("what the menu of a source does not offer is said to be that")
     checkFailed(runProgram(wishesOf({ "open" })), "editor: the menu of Waiting does not offer this");
 }
 
-TEST_CASE("to verify is given up at once when it is interrupted before there is a tree")
-{
-    RunningProgram verify(wishesOf({ "verify" }, "tell"));
-    REQUIRE(verify.prints("loading\n"));
-    const ProgramRun run = verify.end(SIGINT);
-    CHECK(run.status == 1);
-    CHECK(run.errors == "ombrix: org.ombrix.tests.Waiting: interrupted before there was a tree to compare\n");
-}
-
 TEST_CASE("a difference is never excused by a place where the source does not tell that it looks")
 {
     const TemporaryFolder disk;

@@ -88,6 +88,7 @@ TEST_CASE("a handler of changes that throws is told the next change all the same
     CHECK(told.waitFor("/a/first"));
     disk.tell("/a", { platform::PathChange::Kind::attributesChanged, true, false, "/a/second" });
     CHECK(told.waitFor("/a/second"));
+    CHECK(waitUntil([&] { return test.host().pathWatcher().isAtRest(manager.get()); }));
     test.host().pathWatcher().removeObserver(manager.get());
     CHECK(test.machine.bare.console.lines()
         == Lines { "/a/first: error while this change was told: the disk is made of cheese" });

@@ -25,15 +25,16 @@ public:
     {
         Locked guard(_lock);
         const std::uint64_t generation = currentGeneration();
-        if (std::exchange(_generation, generation) != generation)
+        if (_generation != 0 && _generation != generation)
             _since = now;
+        _generation = generation;
     }
 
     /// Whether something may have been mounted or unmounted since a look at `date`; false while nobody has looked.
     bool haveChangedSince(Date date) const
     {
         Locked guard(_lock);
-        return _generation != 0 && (currentGeneration() != _generation || _since > date);
+        return _generation != 0 && (currentGeneration() != _generation || _since >= date);
     }
 
 private:

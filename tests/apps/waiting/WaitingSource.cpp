@@ -1,7 +1,7 @@
 // A source whose disk never answers: its load ends when somebody cancels it. It offers no inspection.
 //
 // OMBRIX_WAITING changes that: with "unable" it cannot load, with "throw" its load throws an error, with "nameless"
-// its name does, and with "tell" it prints a line when its load has begun. With "deaf" it shows the folder that
+// its name does. With "deaf" it shows the folder that
 // OMBRIX_WAITING_FOLDER names while that is there, and watches nothing.
 
 #include "host/OBConstants.h"
@@ -15,8 +15,6 @@
 #include <memory>
 #include <stdexcept>
 #include <string_view>
-
-#include <unistd.h>
 
 namespace {
 
@@ -48,8 +46,6 @@ public:
         using namespace std::chrono_literals;
         if (isTold("throw"))
             throw std::runtime_error("the disk is made of cheese");
-        if (isTold("tell"))
-            static_cast<void>(!write(STDOUT_FILENO, "loading\n", 8));
         noteFoldersDone(1204);
         noteItemsFound(38110);
         notePathAtWork("/Volumes/Stick/Montaro Projects");

@@ -1,5 +1,7 @@
 #include "platform/formats/PropertyList.h"
 
+#include "platform/NumberText.h"
+
 #include <doctest/doctest.h>
 
 #include <limits>
@@ -68,6 +70,18 @@ TEST_CASE("every kind of value that was written is read back as it was")
     const PropertyListResult result = readPropertyList(writeXmlPropertyList(value));
     CHECK(result.problem == "");
     CHECK(result.value == value);
+}
+
+TEST_CASE("a number is written whole or with the fewest digits that read back, never with an exponent")
+{
+    CHECK(platform::numberText(100000) == "100000");
+    CHECK(platform::numberText(4096) == "4096");
+    CHECK(platform::numberText(-0.5) == "-0.5");
+    CHECK(platform::numberText(1.0 / 3) == "0.3333333333333333");
+    CHECK(platform::numberText(1e-7) == "0.0000001");
+    CHECK(platform::numberText(1e300).size() == 301);
+    CHECK(platform::numberText(std::numeric_limits<double>::denorm_min()).substr(0, 4) == "0.00");
+    CHECK(body(platform::Size { 100000, 2e5 }) == "<string>{100000, 200000}</string>\n");
 }
 
 TEST_CASE("any bytes at all make a property list that is read back")

@@ -256,6 +256,27 @@ TEST_CASE("a folder that may not be listed, and one that may only be listed, ans
         chmod(temporary.path(name).c_str(), 0755);
 }
 
+TEST_CASE("what may not be looked at from inside a folder, or leads nowhere, is no proof that the marker is absent")
+{
+    const TemporaryFolder temporary;
+    for (const char* file : { "event/mark", "event/Media/a", "linked/Media/b", "none/Media/c" })
+        temporary.file(file);
+    temporary.link("linked/mark", "/Volumes/Nowhere/mark");
+    chmod(temporary.path().c_str(), 0755);
+    chmod(temporary.path("event/Media").c_str(), 0444);
+    const auto check = [&] {
+        const LinuxFileSystem files;
+        const ListingRequest request { .markerBeside = "mark", .links = LinkPolicy::stop };
+        const FolderListing closed = files.itemsInFolder(temporary.path("event/Media"), request);
+        const FolderListing linked = files.itemsInFolder(temporary.path("linked/Media"), request);
+        const FolderListing none = files.itemsInFolder(temporary.path("none/Media"), request);
+        return !closed.holder() && closed.size() == 1 && !linked.holder() && linked.size() == 1 && none.holder()
+            && !none.holder()->hasMarker && none.empty();
+    };
+    CHECK(tests::askAsOrdinaryUser(check) == tests::ChildAnswer::yes);
+    chmod(temporary.path("event/Media").c_str(), 0755);
+}
+
 TEST_CASE("a listing of a hundred thousand items is whole, and every name is told once")
 {
     const TemporaryFolder temporary;

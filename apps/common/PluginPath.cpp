@@ -65,7 +65,7 @@ std::vector<std::string> problemsOfPluginPath(const platform::FileSystem& fileSy
     std::vector<std::string> problems;
     for (const std::string& folder : foldersOfPluginPath()) {
         if (const std::string problem = problemOfFolder(fileSystem, folder); !problem.empty())
-            problems.push_back(std::string(variable) + ": " + folder + ": " + problem);
+            problems.push_back(std::string(variable).append(": ").append(folder).append(": ").append(problem));
     }
     return problems;
 }

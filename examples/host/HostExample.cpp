@@ -28,8 +28,9 @@ int browse(const platform::Platform& machine)
     const OBObservation listening
         = made.manager->observe(here, { .rootPublished = [](const OBMediaGroupRef& root) { print(root, ""); } });
     made.manager->requestRootMediaGroup(here, [](const OBLoadResult& result) {
-        if (result.outcome == OBLoadOutcome::unavailable)
-            std::cerr << "nothing to load: the editor is not installed\n";
+        if (result.outcome == OBLoadOutcome::unavailable || !result.problem.empty())
+            std::cerr << "nothing to load: "
+                      << (result.problem.empty() ? "the editor is not installed" : result.problem) << '\n';
     });
     machine.mainRunLoop.run(); // this thread is the framework's main thread, until somebody calls quit()
     return 0;

@@ -1,5 +1,6 @@
 #include "tests/apps/ProgramRun.h"
 #include "tests/support/DescribedMachine.h"
+#include "tests/support/GoldenText.h"
 #include "tests/support/LibraryBuilder.h"
 #include "tests/support/TemporaryFolder.h"
 
@@ -93,6 +94,28 @@ TEST_CASE("a menu is printed with its items and their actions, for a program as 
         "\n");
     checkAnswer(machine.run({ "menu", "--group", machine.project }),
         "Group Context Menu\n  Open in Montaro  (contextMenuOpen:)\n");
+}
+
+TEST_CASE("an item without a text is left out of a menu, which may have none left")
+{
+    const MachineToActOn machine;
+    const std::string bundle = machine.disk.path("plugins/Montaro.obplugin");
+    std::filesystem::create_directories(machine.disk.path("plugins"));
+    std::filesystem::copy(OMBRIX_MONTARO_BUNDLE, bundle, std::filesystem::copy_options::recursive);
+    const std::string table = bundle + "/resources/en.strings.plist";
+    std::string texts = contentOf(table);
+    std::string expected = R"({"title":"Object Context Menu","items":[{"title":"Open in Montaro",)"
+                           R"("action":"contextMenuOpen:","keyEquivalent":""}]})"
+                           "\n";
+    for (const char* key : { "RevealInNavion", "OpenInMontaro" }) {
+        texts = replaced(texts, "<key>" + std::string(key) + "</key>", "<key>Other " + std::string(key) + "</key>");
+        writeFile(table, texts);
+        RunWishes wishes { { "--machine", machine.disk.path("machine.json"), "menu", "--object", machine.movie,
+            "--json" } };
+        wishes.environment = { { "OMBRIX_PLUGIN_PATH", machine.disk.path("plugins") } };
+        checkAnswer(runProgram(wishes), expected);
+        expected = "{\"title\":\"Object Context Menu\",\"items\":[]}\n";
+    }
 }
 
 TEST_CASE("a menu of nothing that is there is null")

@@ -7,6 +7,8 @@
 
 #include <doctest/doctest.h>
 
+#include <functional>
+
 using namespace tests;
 using platform::Value;
 using Lines = std::vector<std::string>;
@@ -171,6 +173,33 @@ TEST_CASE("projects are found in tree order, once for each time their path was g
     CHECK(found[1] == test.group(1));
     CHECK(found[2] == test.group(1));
     CHECK(test.source->projectGroupsForPaths({}).empty());
+}
+
+TEST_CASE("a project in a folder is found, and one group after another is written, also one without a movie")
+{
+    SourceToCopyFrom test;
+    BundleBuilder deep = test.projects().project("Clients/Deep");
+    for (const char* name : { "x.mov", "y.mov", "z.mov" })
+        deep.movie(name, 640, 480);
+    test.projects().project("Bare");
+    test.load(*test.source);
+    OBMediaGroupList groups;
+    Lines expected;
+    const std::function<void(const OBMediaGroup&)> collect = [&](const OBMediaGroup& group) {
+        for (const OBMediaGroupRef& child : group.childGroups()) {
+            if (child->name() == "Deep" || child->name() == "Bare")
+                groups = groups.appending(child);
+            collect(*child);
+        }
+    };
+    collect(*test.source->rootMediaGroup());
+    REQUIRE(groups.size() == 2);
+    CHECK(test.source->writeMediaGroups_toPasteboard(groups, test.pasteboard));
+    const Lines written = test.projectsWritten();
+    REQUIRE(written.size() == 1);
+    CHECK(written[0].starts_with("PROJECTS/Clients/Deep Deep: [PROJECTS/Clients/Deep/Shared Items/x.mov"));
+    CHECK(written[0].find("z.mov") != std::string::npos);
+    CHECK(test.data("text/plain") == "PROJECTS/Clients/Deep/Shared Items/x.mov\n");
 }
 
 TEST_CASE("files are written by their real paths, escaped in URIs and byte by byte as text")

@@ -33,7 +33,7 @@ struct MachineToActOn {
     /// A program that writes its name and its arguments into `started`, one a line, whole or not at all.
     std::string script(const std::string& path)
     {
-        const std::string file = disk.file(path,
+        std::string file = disk.file(path,
             "#!/bin/sh\n{ echo \"${0##*/}\"; for argument; do echo \"$argument\"; done; } > '" + started + ".new'\nmv '"
                 + started + ".new' '" + started + "'\n");
         std::filesystem::permissions(file, std::filesystem::perms::owner_all);

@@ -183,7 +183,9 @@ TEST_CASE("a disk's format is told by the file system that holds a path, and a p
     const std::pair<const char*, const char*> types[] { { "vfat", "false\n" }, { "msdos", "false\n" },
         { "ntfs3", "false\n" }, { "nfs4", "false\n" }, { "orbfs", "false\n" }, { "davfs", "false\n" },
         { "udf", "false\n" }, { "exfat", "true\n" }, { "ext4", "true\n" }, { "MSDOS", "true\n" } };
-    for (const auto& [type, expected] : types) {
+    for (const auto& row : types) {
+        const char* const type = row.first;
+        const char* const expected = row.second;
         CAPTURE(type);
         DescribedMachine description;
         description.localVolume(folder.path("stick"), "Stick", type);

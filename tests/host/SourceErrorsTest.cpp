@@ -1,3 +1,4 @@
+#include "host/SourceCall.h"
 #include "platform/MainRunLoop.h"
 #include "platform/Notifications.h"
 #include "tests/host/TestHost.h"
@@ -20,6 +21,12 @@ const std::string source = TestHost::identifier;
 [[noreturn]] void fail()
 {
     throw std::runtime_error("the disk is made of cheese");
+}
+
+void failAt(std::size_t faulty, std::size_t index)
+{
+    if (index == faulty)
+        fail();
 }
 
 } // namespace
@@ -98,20 +105,19 @@ TEST_CASE("a job that throws ends the work on its caller's thread, with no other
 {
     TestHost test;
     const auto manager = test.manager();
+    const auto nothing = [](std::size_t) {};
     for (const std::size_t faulty : { 0, 5, 99 }) {
         CAPTURE(faulty);
         std::atomic<int> inside { 0 };
-        const auto job = [&](std::size_t index) {
+        const auto failing = [&](std::size_t index) {
             ++inside;
             const std::shared_ptr<void> end(nullptr, [&](void*) { --inside; });
-            if (index == faulty)
-                fail();
+            failAt(faulty, index);
         };
-        CHECK_THROWS_AS(manager->performInOrder(100, job, [](std::size_t) {}), std::runtime_error);
+        const std::string byJob = errorThrownBy([&] { manager->performInOrder(100, failing, nothing); });
         CHECK(inside == 0);
-        CHECK_THROWS_AS(manager->performInOrder(
-                            100, [](std::size_t) {}, [&](std::size_t index) { index == faulty ? fail() : void(); }),
-            std::runtime_error);
+        const std::string byTaker = errorThrownBy([&] { manager->performInOrder(100, nothing, failing); });
+        CHECK(byJob + "," + byTaker == "the disk is made of cheese,the disk is made of cheese");
     }
     CHECK(test.host().waitForThreads(longestWait));
 }

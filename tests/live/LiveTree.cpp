@@ -23,6 +23,7 @@ namespace {
     std::vector<std::string> volumesOf(const std::vector<std::string>& folders)
     {
         std::vector<std::string> volumes;
+        volumes.reserve(folders.size());
         for (const std::string& folder : folders)
             volumes.emplace_back(platform::pathByRemovingLastComponent(folder));
         return volumes;

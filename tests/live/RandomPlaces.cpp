@@ -50,7 +50,7 @@ std::string RandomPlaces::anyFolder()
 /// Something in a folder, or at times a whole library.
 std::string RandomPlaces::anyItem()
 {
-    const std::string folder = anyFolder();
+    std::string folder = anyFolder();
     const std::vector<LiveDisk::Item> items = _disk.itemsIn(folder);
     if (items.empty() || _chance.oneIn(20))
         return folder;

@@ -272,7 +272,7 @@ void RealDisk::storm(const std::string& folder, std::uint64_t reports) const
 {
     const std::string one = systemPath(folder) + "/storm";
     const std::string other = one + " too";
-    Descriptor(open(one.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, openFileMode));
+    const Descriptor made(open(one.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, openFileMode));
     for (std::uint64_t count = 0; count < reports; count += 4) {
         static_cast<void>(std::rename(one.c_str(), other.c_str()));
         static_cast<void>(std::rename(other.c_str(), one.c_str()));

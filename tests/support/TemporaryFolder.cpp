@@ -54,6 +54,19 @@ namespace {
         return entry.is_directory(error) && !entry.is_symlink(error);
     }
 
+    /// Removes the files of `inner` and moves its folders up into `folder`.
+    void moveUp(const fs::path& inner, const fs::path& folder, std::size_t& moved, std::error_code& error)
+    {
+        for (const fs::directory_entry& entry : entriesOf(inner)) {
+            if (isFolder(entry)) {
+                giveBackPermissions(entry.path());
+                fs::rename(entry.path(), folder / ("moved up " + std::to_string(++moved)), error);
+            } else {
+                fs::remove(entry.path(), error);
+            }
+        }
+    }
+
     /// Empties a folder of any depth: what lies in its folders is first moved up, so that no path grows.
     void emptyFolder(const std::string& folder)
     {
@@ -61,15 +74,8 @@ namespace {
         std::size_t moved = 0;
         for (auto entries = entriesOf(folder); !entries.empty() && !error; entries = entriesOf(folder)) {
             for (const fs::directory_entry& entry : entries) {
-                for (const fs::directory_entry& inner :
-                    isFolder(entry) ? entriesOf(entry.path()) : decltype(entries)()) {
-                    if (!isFolder(inner)) {
-                        fs::remove(inner.path(), error);
-                        continue;
-                    }
-                    giveBackPermissions(inner.path());
-                    fs::rename(inner.path(), fs::path(folder) / ("moved up " + std::to_string(++moved)), error);
-                }
+                if (isFolder(entry))
+                    moveUp(entry.path(), folder, moved, error);
                 fs::remove(entry.path(), error);
             }
         }

@@ -38,16 +38,6 @@ namespace {
         std::array<int, 2> ends { -1, -1 };
     };
 
-    std::vector<char*> pointersTo(std::vector<std::string>& texts)
-    {
-        std::vector<char*> pointers;
-        pointers.reserve(texts.size() + 1);
-        for (std::string& text : texts)
-            pointers.push_back(text.data());
-        pointers.push_back(nullptr);
-        return pointers;
-    }
-
     /// How a child gets its descriptors and signals: none held, those that end it doing so.
     class SpawnManner {
     public:
@@ -197,6 +187,16 @@ std::vector<ChildAnswer> runChildren(const std::vector<ChildWishes>& wishes, std
         std::erase_if(children, [](const auto& child) { return child->hasEnded(); });
     }
     return answers;
+}
+
+std::vector<char*> pointersTo(std::vector<std::string>& texts)
+{
+    std::vector<char*> pointers;
+    pointers.reserve(texts.size() + 1);
+    for (std::string& text : texts)
+        pointers.push_back(text.data());
+    pointers.push_back(nullptr);
+    return pointers;
 }
 
 std::string thisProgram()

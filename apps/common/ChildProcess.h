@@ -35,6 +35,9 @@ struct ChildAnswer {
 /// answers. One thread at a time.
 std::vector<ChildAnswer> runChildren(const std::vector<ChildWishes>& wishes, std::size_t atOnce);
 
+/// Texts as programs take their arguments, null behind the last. `texts` outlives the answer and is not changed.
+std::vector<char*> pointersTo(std::vector<std::string>& texts);
+
 /// The file that this process runs.
 std::string thisProgram();
 

@@ -11,8 +11,7 @@
 #include "host/OBBundle.h"
 #include "host/OBSourceInspection.h"
 #include "platform/FileSystem.h"
-
-#include <charconv>
+#include "platform/NumberText.h"
 
 namespace ombrix {
 namespace {
@@ -66,13 +65,6 @@ namespace {
         TextLine line(program.style(), program.columns());
         line.add(labelEnd - static_cast<int>(label.size()), label, TextLine::Look::dim);
         program.printWrapped(line, textStart, text);
-    }
-
-    std::string numberText(double number)
-    {
-        char digits[40];
-        const std::to_chars_result end = std::to_chars(std::begin(digits), std::end(digits), number);
-        return { digits, end.ptr };
     }
 
     std::string editorText(Program& program, OBMediaManager& manager, bool canLoad)
@@ -151,7 +143,7 @@ namespace {
             if (const std::optional<bool> newest = inspection->mostRecentEventFirst())
                 printFact(program, "order", *newest ? "newest events first" : "oldest events first");
         }
-        printFact(program, "thread", "load priority " + numberText(manager.loadThreadPriority()));
+        printFact(program, "thread", "load priority " + platform::numberText(manager.loadThreadPriority()));
         printFact(program, "offers", typesText(pasteboardTypes(program)));
     }
 

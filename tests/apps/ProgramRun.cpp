@@ -1,5 +1,7 @@
 #include "tests/apps/ProgramRun.h"
 
+#include "apps/common/ChildProcess.h"
+
 #include <array>
 #include <cerrno>
 #include <csignal>
@@ -45,23 +47,13 @@ namespace {
         return variables;
     }
 
-    std::vector<char*> pointersTo(std::vector<std::string>& texts)
-    {
-        std::vector<char*> pointers;
-        pointers.reserve(texts.size() + 1);
-        for (std::string& text : texts)
-            pointers.push_back(text.data());
-        pointers.push_back(nullptr);
-        return pointers;
-    }
-
     pid_t start(const RunWishes& wishes, const std::string& term, Descriptors descriptors)
     {
         std::vector<std::string> words { wishes.program.empty() ? OMBRIX_PROGRAM : wishes.program };
         words.insert(words.end(), wishes.arguments.begin(), wishes.arguments.end());
         std::vector<std::string> variables = environmentOf(wishes, term);
-        const std::vector<char*> arguments = pointersTo(words);
-        const std::vector<char*> environment = pointersTo(variables);
+        const std::vector<char*> arguments = apps::pointersTo(words);
+        const std::vector<char*> environment = apps::pointersTo(variables);
         const char* input = wishes.inputFile.empty() ? "/dev/null" : wishes.inputFile.c_str();
         const pid_t child = ::fork();
         if (child == 0) {

@@ -65,10 +65,11 @@ struct WatchingLimit {
 /// What the kernel's reports cost of what it gives.
 struct WatchingLimits {
     WatchingLimit watches {}; ///< one a folder
-    WatchingLimit instances {}; ///< one a program, or a few
+    WatchingLimit instances {}; ///< one a program and disk that it watches
 };
 
-/// Who hears of one watched path. The calls come on the watcher's own threads, one at a time, and must return soon.
+/// Who hears of one watched path. The calls come on the watcher's own threads, one at a time for one path, and must
+/// return soon.
 struct PathWatchHandlers {
     std::function<void(const PathChange&)> changed;
     /// Everything at and below the path is followed from now on. Not called before `watch` has returned.

@@ -153,8 +153,7 @@ std::uint64_t LinuxVolumes::generation() const
 {
     Locked guard(_lock);
     if (!_openTable.isOpen()) {
-        const std::string path = _folders.proc + "/self/mountinfo";
-        _openTable = Descriptor(uninterrupted([&] { return open(path.c_str(), O_RDONLY | O_CLOEXEC); }));
+        _openTable = MountTable::open(_folders.proc);
         if (!_openTable.isOpen())
             return 0;
         ++_generation;

@@ -215,15 +215,20 @@ MountTable::MountTable(const std::vector<Mount>& mounts)
     }
 }
 
+Descriptor MountTable::open(const std::string& procFolder)
+{
+    const std::string path = procFolder + "/self/mountinfo";
+    return Descriptor(uninterrupted([&] { return ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK); }));
+}
+
 MountTable MountTable::read(const std::string& procFolder)
 {
     constexpr std::size_t sizeAtMost = 64 << 20;
     constexpr int triesAtMost = 5;
-    const std::string path = procFolder + "/self/mountinfo";
     std::string text;
     // The kernel hands the table out in pieces; a change between two of them tears it, and shows on the descriptor.
     for (int tries = 0; tries < triesAtMost; ++tries) {
-        const Descriptor file(uninterrupted([&] { return open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK); }));
+        const Descriptor file = open(procFolder);
         if (!file.isOpen())
             break;
         text = readToEnd(file.number(), sizeAtMost);

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "platform/linux/Descriptor.h"
+
 #include <cstddef>
 #include <cstdint>
 #include <optional>
@@ -41,6 +43,8 @@ public:
 
     /// Reads the table of this process from `procFolder`; empty when it cannot be read.
     static MountTable read(const std::string& procFolder);
+    /// For `hasChanged`; not open where there is no table.
+    static Descriptor open(const std::string& procFolder);
 
     /// Whether anything was mounted or unmounted since the table was opened as `openTable`, or since this was last
     /// asked.

@@ -1,5 +1,6 @@
 #include "platform/linux/MountWatch.h"
 
+#include "platform/linux/MountTable.h"
 #include "platform/linux/SignalsHeld.h"
 
 #include <array>
@@ -20,8 +21,7 @@ MountWatch::MountWatch(Descriptor table)
 
 std::shared_ptr<MountWatch> MountWatch::open(const std::string& procFolder)
 {
-    const std::string path = procFolder + "/self/mountinfo";
-    Descriptor table(uninterrupted([&] { return ::open(path.c_str(), O_RDONLY | O_CLOEXEC); }));
+    Descriptor table = MountTable::open(procFolder);
     return table.isOpen() ? std::make_shared<MountWatch>(std::move(table)) : nullptr;
 }
 

@@ -41,7 +41,7 @@ int watchFolder(WatchingContext& context, WatchedFolders::Number folder, const c
     if (watch == -1)
         return errno;
     const bool isNew = folders.firstWithWatch(watch) == WatchedFolders::none;
-    if (isNew && folders.watchCount() >= context.limits.watchesAtMost) {
+    if (isNew && context.watchesInUse() >= context.limits.watchesAtMost) {
         context.inotify.stopWatching(watch);
         return ENOSPC;
     }

@@ -1,8 +1,7 @@
 #include "platform/linux/watching/LinuxPathWatching.h"
 
-#include "platform/Threads.h"
-#include "platform/linux/SignalsHeld.h"
 #include "platform/linux/watching/InotifyLimits.h"
+#include "platform/linux/watching/PolledMounts.h"
 #include "platform/linux/watching/WatchedPlace.h"
 
 #include <ctime>
@@ -17,19 +16,14 @@ LinuxPathWatching::LinuxPathWatching(
 }
 
 LinuxPathWatching::LinuxPathWatching(WatcherRoles roles)
-    : _roles(std::move(roles))
-    , _counts(std::make_shared<WatchingCounts>())
-    , _mountsSeen(std::make_shared<MountsSeen>(_roles.volumes))
+    : _counts(std::make_shared<WatchingCounts>())
+    , _watchers(std::make_shared<DeviceWatchers>(std::move(roles), _counts))
 {
 }
 
 LinuxPathWatching::~LinuxPathWatching()
 {
-    {
-        Locked guard(_lock);
-        if (_queue)
-            _queue->end();
-    }
+    _watchers->end();
     _counts->threads.waitForNone();
 }
 
@@ -38,37 +32,16 @@ Date LinuxPathWatching::timeOfChangesNow() const
     timespec now {};
     clock_gettime(CLOCK_REALTIME_COARSE, &now);
     const Date date { now.tv_sec, static_cast<std::uint32_t>(now.tv_nsec) };
-    _mountsSeen->look(date);
+    _watchers->mountsSeen().look(date);
     return date;
 }
 
 std::shared_ptr<void> LinuxPathWatching::watch(std::string_view path, Date since, PathWatchHandlers handlers)
 {
-    Locked guard(_lock);
     const std::uint64_t number = ++_lastNumber;
-    const auto watch
-        = std::make_shared<const PathWatch>(PathWatch { number, std::string(path), since, std::move(handlers) });
-    if (!_queue || !_queue->add(watch)) {
-        _queue = std::make_shared<WatchingQueue>();
-        _queue->add(watch);
-        if (!startThread())
-            _queue->end();
-    }
-    return { _queue.get(), [queue = _queue, number](void*) { queue->remove(number); } };
-}
-
-bool LinuxPathWatching::startThread()
-{
-    _counts->threads.add();
-    const SignalsHeld inherited;
-    const bool isStarted = _roles.threads.startDetached(
-        "watching", [roles = _roles, queue = _queue, counts = _counts, mounts = _mountsSeen] {
-            PathWatcher(roles, queue, counts, *mounts).run();
-            counts->threads.remove();
-        });
-    if (!isStarted)
-        _counts->threads.remove();
-    return isStarted;
+    _watchers->add(
+        std::make_shared<const PathWatch>(PathWatch { number, std::string(path), since, std::move(handlers) }));
+    return { _watchers.get(), [watchers = _watchers, number](void*) { watchers->remove(number); } };
 }
 
 WatchingState LinuxPathWatching::state() const
@@ -78,11 +51,13 @@ WatchingState LinuxPathWatching::state() const
 
 FollowingMeans LinuxPathWatching::meansOfFollowing(std::string_view path) const
 {
-    const PolledMounts mounts(MountTable::read("/proc"), _roles.limits.furtherPolledTypes);
-    const WatchedPlace place = placeOfPath(_roles.files, path, mounts);
+    const WatcherRoles& roles = _watchers->roles();
+    const PolledMounts mounts(MountTable::read("/proc"), roles.limits.furtherPolledTypes);
+    const WatchedPlace place
+        = placeOfPath(roles.files, path, [&](std::string_view reached) { return !mounts.holds(reached); });
     if (mounts.isAutomountPoint(place.path))
         return FollowingMeans::nothing;
-    return place.isPolled || !_roles.limits.mayUseInotify ? FollowingMeans::looking : FollowingMeans::reports;
+    return place.endsEarly || !roles.limits.mayUseInotify ? FollowingMeans::looking : FollowingMeans::reports;
 }
 
 std::optional<WatchingLimits> LinuxPathWatching::limits(std::uint64_t furtherWatches) const
@@ -92,10 +67,11 @@ std::optional<WatchingLimits> LinuxPathWatching::limits(std::uint64_t furtherWat
 
 std::unique_ptr<PathWatching> LinuxPathWatching::withPathsOf(const FileSystem& files, const Volumes& volumes) const
 {
-    std::vector<const Volumes*> all = _roles.volumes;
+    const WatcherRoles& roles = _watchers->roles();
+    std::vector<const Volumes*> all = roles.volumes;
     all.push_back(&volumes);
     return std::unique_ptr<PathWatching>(
-        new LinuxPathWatching(WatcherRoles { files, std::move(all), _roles.clock, _roles.threads, _roles.limits }));
+        new LinuxPathWatching(WatcherRoles { files, std::move(all), roles.clock, roles.threads, roles.limits }));
 }
 
 } // namespace platform

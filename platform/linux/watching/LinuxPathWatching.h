@@ -1,11 +1,11 @@
 #pragma once
 
 #include "platform/PathWatching.h"
-#include "platform/ThreadSafety.h"
+#include "platform/linux/watching/DeviceWatchers.h"
 #include "platform/linux/watching/LinuxWatchingLimits.h"
-#include "platform/linux/watching/MountsSeen.h"
-#include "platform/linux/watching/PathWatcher.h"
+#include "platform/linux/watching/WatchingCounts.h"
 
+#include <atomic>
 #include <cstdint>
 #include <memory>
 #include <string_view>
@@ -19,9 +19,9 @@ class Volumes;
 
 /// Follows folders by inotify(7), and by looking in intervals where that cannot be.
 ///
-/// Nothing exists before the first watch: one thread and one inotify instance come with it and end with the last, and a
-/// thread comes with each device that has to be polled. Nobody waits for them but the destructor, which waits until a
-/// look that is under way has come to its end.
+/// Nothing exists before the first watch: a thread and an inotify instance come with the first on each device and end
+/// with its last, and a thread comes with each device that has to be polled. Nobody waits for them but the destructor,
+/// which waits until a look that is under way has come to its end.
 class LinuxPathWatching final : public PathWatching {
 public:
     /// `files` tells where paths lead; it, `volumes` and the others outlive this object.
@@ -44,14 +44,9 @@ public:
 private:
     explicit LinuxPathWatching(WatcherRoles roles);
 
-    bool startThread() REQUIRES(_lock);
-
-    const WatcherRoles _roles;
     const std::shared_ptr<WatchingCounts> _counts;
-    const std::shared_ptr<MountsSeen> _mountsSeen;
-    Mutex _lock; ///< taken before the queue's own
-    std::shared_ptr<WatchingQueue> _queue GUARDED_BY(_lock);
-    std::uint64_t _lastNumber GUARDED_BY(_lock) = 0;
+    const std::shared_ptr<DeviceWatchers> _watchers;
+    std::atomic<std::uint64_t> _lastNumber { 0 };
 };
 
 } // namespace platform

@@ -15,49 +15,64 @@ namespace {
 
     constexpr const char* procFolder = "/proc";
 
-    FolderPolling::Parts partsOfPolling(
-        const WatcherRoles& roles, const std::shared_ptr<WatchingQueue>& queue, std::shared_ptr<WatchingCounts> counts)
+    FolderPolling::Parts partsOfPolling(DeviceWatchers& watchers, const std::shared_ptr<WatchingQueue>& queue)
     {
-        return { roles.files, roles.clock, roles.threads, std::move(counts), roles.limits.pollInterval,
+        const WatcherRoles& roles = watchers.roles();
+        return { roles.files, roles.clock, roles.threads, watchers.counts(), roles.limits.pollInterval,
             [queue](std::vector<PollingReport> reports) { queue->report(std::move(reports)); } };
+    }
+
+    std::vector<std::string> pointsThatMayGo(const MountTable& table)
+    {
+        std::vector<std::string> points;
+        for (const Mount& mount : table.mounts()) {
+            if (mount.mountPoint != "/")
+                points.push_back(mount.mountPoint);
+        }
+        return points;
     }
 
 } // namespace
 
-PathWatcher::PathWatcher(const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue,
-    std::shared_ptr<WatchingCounts> counts, const MountsSeen& mountsSeen)
-    : _limits(roles.limits)
-    , _queue(std::move(queue))
-    , _counts(std::move(counts))
-    , _context(roles.files, _limits, mountsSeen, *_queue, partsOfPolling(roles, _queue, _counts))
+PathWatcher::PathWatcher(DeviceWatchers& watchers, const std::string& device, std::shared_ptr<WatchingQueue> queue)
+    : _queue(std::move(queue))
+    , _mountTable(MountTable::open(procFolder))
+    , _context(watchers, device, *_queue, partsOfPolling(watchers, _queue))
 {
-    watchMounts(roles);
+    watchMounts();
 }
 
 // First the changes are followed, then the table is read, so that none is missed.
-void PathWatcher::watchMounts(const WatcherRoles& roles)
+void PathWatcher::watchMounts()
 {
-    for (const Volumes* const volumes : roles.volumes) {
+    for (const Volumes* const volumes : _context.watchers.roles().volumes) {
         if (auto watch = volumes->watchMounts([queue = _queue] { queue->noteMounts(); }))
             _mountWatches.push_back(std::move(watch));
     }
-    _context.mounts = PolledMounts(MountTable::read(procFolder), _limits.furtherPolledTypes);
+    _context.mounts = mountsNow();
+}
+
+PolledMounts PathWatcher::mountsNow() const
+{
+    return { MountTable::read(procFolder), _context.limits.furtherPolledTypes };
 }
 
 void PathWatcher::run()
 {
     while (!_queue->endIfUnused()) {
-        waitForWork();
-        takeTasks();
-        takeEvents();
+        const Work work = waitForWork();
+        if (work.hasTasks)
+            takeTasks();
+        if (work.hasEvents)
+            takeEvents();
         _events.tellDueContents();
         _placing.followNoted();
         _context.countWatches();
     }
-    _counts->watchedFolders = 0;
+    _context.sayWatched(0);
 }
 
-void PathWatcher::waitForWork()
+PathWatcher::Work PathWatcher::waitForWork()
 {
     // The other half of a move comes with the next report or, cut off at the end of a read, at once.
     constexpr int waitForMove = 2;
@@ -73,21 +88,35 @@ void PathWatcher::waitForWork()
     const int count = poll(sources.data(), sources.size(), timeout);
     if (count == 0 && _events.holdsMove())
         _events.releaseMove();
+    return { count > 0 && sources[0].revents != 0, count > 0 && sources[1].revents != 0 };
 }
 
 void PathWatcher::takeTasks()
 {
     WatchingTasks tasks = _queue->take();
-    if (tasks.mountsHaveChanged)
-        _placing.takeMounts(PolledMounts(MountTable::read(procFolder), _limits.furtherPolledTypes));
-    for (const auto& watch : tasks.added)
-        _placing.begin(watch);
+    // Another thread hands over by what is mounted now, of which this one may not have been told yet.
+    if (tasks.mountsHaveChanged || !tasks.added.empty())
+        takeMounts();
+    for (AddedWatch& added : tasks.added)
+        _placing.begin(std::move(added));
     for (const std::uint64_t watch : tasks.removed)
         _placing.end(watch);
     for (const PollingReport& report : tasks.reports)
         _placing.take(report);
     if (tasks.reportsWereLost)
         _placing.followAllAnew();
+}
+
+void PathWatcher::takeMounts()
+{
+    if (!MountTable::hasChanged(_mountTable.number()))
+        return;
+    const PolledMounts now = mountsNow();
+    std::vector<std::string> points = changedMountPoints(_context.mounts.table(), now.table());
+    // The table is as before, and was not meanwhile: what was unmounted and mounted again bears the numbers that it had.
+    if (points.empty())
+        points = pointsThatMayGo(now.table());
+    _placing.takeMounts(now, points);
 }
 
 void PathWatcher::takeEvents()
@@ -98,8 +127,7 @@ void PathWatcher::takeEvents()
         return isWhole;
     };
     // One buffer at a time: tasks come in between.
-    if (_context.inotify.isOpen())
-        _context.inotify.forEachEvent(take);
+    _context.inotify.forEachEvent(take);
     if (!isWhole)
         resynchronise();
 }
@@ -107,7 +135,7 @@ void PathWatcher::takeEvents()
 // Reports were lost. All that have come up to now tell of what a look sees anyway.
 void PathWatcher::resynchronise()
 {
-    ++_counts->overflows;
+    ++_context.counts.overflows;
     _context.inotify.discardEvents();
     _events.forget();
     _placing.followAllAnew();

@@ -4,48 +4,39 @@
 #include "platform/linux/watching/FolderFollowing.h"
 #include "platform/linux/watching/RootPlacing.h"
 #include "platform/linux/watching/WatchingContext.h"
-#include "platform/linux/watching/WatchingCounts.h"
 #include "platform/linux/watching/WatchingQueue.h"
 
 #include <memory>
+#include <string>
 #include <vector>
 
 namespace platform {
 
-class Clock;
-class FileSystem;
-class Threads;
-class Volumes;
-
-/// What a watcher works with; all but the limits outlives its threads.
-struct WatcherRoles {
-    const FileSystem& files;
-    std::vector<const Volumes*> volumes; ///< that tell of mounts
-    const Clock& clock;
-    Threads& threads;
-    LinuxWatchingLimits limits {};
-};
-
-/// What the watcher's thread does from the first watch to the last.
+/// What the thread of a device does from its first watch to its last.
 class PathWatcher {
 public:
-    /// `mountsSeen` outlives this object.
-    PathWatcher(const WatcherRoles& roles, std::shared_ptr<WatchingQueue> queue, std::shared_ptr<WatchingCounts> counts,
-        const MountsSeen& mountsSeen);
+    /// `watchers` outlives this object.
+    PathWatcher(DeviceWatchers& watchers, const std::string& device, std::shared_ptr<WatchingQueue> queue);
 
     /// Returns once nothing is watched any more.
     void run();
 
 private:
-    void watchMounts(const WatcherRoles& roles);
-    void waitForWork();
+    struct Work {
+        bool hasTasks = false;
+        bool hasEvents = false;
+    };
+
+    void watchMounts();
+    PolledMounts mountsNow() const;
+    void takeMounts();
+    Work waitForWork();
     void takeTasks();
     void takeEvents();
     void resynchronise();
 
-    const LinuxWatchingLimits _limits;
     const std::shared_ptr<WatchingQueue> _queue;
-    const std::shared_ptr<WatchingCounts> _counts;
+    const Descriptor _mountTable; ///< tells whether it has changed since it was last asked
     WatchingContext _context;
     FolderFollowing _following { _context };
     RootPlacing _placing { _context, _following };

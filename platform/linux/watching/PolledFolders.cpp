@@ -117,7 +117,7 @@ void PolledFolders::addPath(std::uint64_t watch, const std::string& path)
 
 void PolledFolders::follow(std::uint64_t watch, WatchedPath& path, bool isFirst)
 {
-    WatchedPlace place = placeOfPath(_files, path.path, {});
+    WatchedPlace place = placeOfPath(_files, path.path, nullptr);
     if (!isFirst && place.isSamePlace(path.place))
         return;
     path.place = std::move(place);

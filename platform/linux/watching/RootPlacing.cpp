@@ -10,9 +10,20 @@
 
 namespace platform {
 
-void RootPlacing::begin(const std::shared_ptr<const PathWatch>& watch)
+namespace {
+
+    std::string lastStepOf(const WatchedPlace& place)
+    {
+        return place.steps.empty() ? std::string() : pathJoined(place.steps.back().folder, place.steps.back().name);
+    }
+
+} // namespace
+
+void RootPlacing::begin(AddedWatch added)
 {
-    WatchedRoot& root = _context.roots.add(watch);
+    WatchedRoot& root = _context.roots.add(std::move(added));
+    // Where another thread had found it, it is not any more.
+    root.mustTell = root.history.isPlaced;
     if (!_context.inotify.isOpen()) {
         WatchingProblem problem = noInotifyInstance();
         problem.path = root.path();
@@ -54,13 +65,52 @@ void RootPlacing::follow(WatchedRoot& root)
 {
     WatchedPlace place;
     const bool isWatched = watchWay(root, place);
+    if (const std::optional<std::string> device = otherThread(place))
+        return handOver(root, *device);
     if (!isWatched)
         pollWay(root, place);
     else if (std::exchange(root.isWayPolled, false))
         _context.polling.removePath(root.watch->number);
-    // Where a way leads that is not to be touched here, its own thread finds out.
-    if (!place.isPolled)
+    // Where a way leads that is not to be touched here, the thread that polls it finds out.
+    if (!place.endsEarly)
         arrive(root, std::move(place));
+}
+
+WatchedPlace RootPlacing::placeOf(const WatchedRoot& root) const
+{
+    const std::string own = _context.ownDevice();
+    const auto mayLook = [&](std::string_view path) {
+        const std::string device = _context.mounts.deviceAt(path);
+        const bool isOnTheWay = device.empty() || device == own || root.history.devicesPassed.contains(device);
+        return isOnTheWay && !_context.mounts.holds(path);
+    };
+    return placeOfPath(_context.files, root.path(), mayLook);
+}
+
+// The device whose thread is to follow what leads to `place`; none where this one is to.
+std::optional<std::string> RootPlacing::otherThread(const WatchedPlace& place) const
+{
+    const std::string reached = lastStepOf(place);
+    if (place.endsEarly && !_context.mounts.holds(reached))
+        return _context.mounts.deviceAt(reached);
+    const auto isOwn = [&](const PlaceStep& step) {
+        return _context.mounts.deviceAt(pathJoined(step.folder, step.name)) == _context.device;
+    };
+    if (_context.device == DeviceWatchers::first || std::any_of(place.steps.begin(), place.steps.end(), isOwn))
+        return std::nullopt;
+    return DeviceWatchers::first;
+}
+
+void RootPlacing::handOver(WatchedRoot& root, const std::string& device)
+{
+    const std::shared_ptr<const PathWatch> watch = root.watch;
+    RootHistory history = std::move(root.history);
+    if (device == DeviceWatchers::first)
+        history.devicesPassed.clear();
+    else
+        history.devicesPassed.insert(_context.ownDevice());
+    end(watch->number);
+    _context.watchers.handOver(watch, device, std::move(history));
 }
 
 // Watches the way to where `root` leads, as far as it can be watched, and answers whether it can; `place` becomes where
@@ -68,13 +118,14 @@ void RootPlacing::follow(WatchedRoot& root)
 bool RootPlacing::watchWay(WatchedRoot& root, WatchedPlace& place)
 {
     constexpr int triesAtMost = 8;
-    place = placeOfPath(_context.files, root.path(), _context.mounts);
+    place = placeOf(root);
     bool isWatched = true;
-    // What changed before the watches stood is seen by going the way once more.
-    for (int tries = 0; tries < triesAtMost; ++tries) {
-        isWatched = watchSteps(root, place) && !place.isPolled;
-        WatchedPlace again = placeOfPath(_context.files, root.path(), _context.mounts);
-        const bool isSame = again.isSamePlace(place) && again.steps == place.steps;
+    // What changed before the watches stood is seen by going the way once more. So is a folder on the way to what is
+    // missing that could not be watched yet.
+    for (int tries = 0; tries < triesAtMost && !otherThread(place); ++tries) {
+        isWatched = watchSteps(root, place) && !place.endsEarly;
+        WatchedPlace again = placeOf(root);
+        const bool isSame = again.isSamePlace(place) && again.reached == place.reached && again.steps == place.steps;
         place = std::move(again);
         if (isSame)
             break;
@@ -123,8 +174,8 @@ void RootPlacing::settleSteps(const std::vector<WatchedFolders::Number>& folders
 void RootPlacing::pollWay(WatchedRoot& root, const WatchedPlace& place)
 {
     std::string device = _context.mounts.deviceAt(root.path());
-    if (place.isPolled && !place.steps.empty()) {
-        const std::string reached = pathJoined(place.steps.back().folder, place.steps.back().name);
+    if (place.endsEarly && !place.steps.empty()) {
+        const std::string reached = lastStepOf(place);
         device = _context.mounts.deviceAt(reached);
         WatchingProblem problem = changedByOthers(_context.mounts.typeAt(reached));
         problem.path = root.path();
@@ -136,7 +187,7 @@ void RootPlacing::pollWay(WatchedRoot& root, const WatchedPlace& place)
 
 void RootPlacing::arrive(WatchedRoot& root, WatchedPlace place)
 {
-    const bool isFirst = !std::exchange(root.isPlaced, true);
+    const bool isFirst = !std::exchange(root.history.isPlaced, true);
     const bool isOther = std::exchange(root.mustTell, false) || isFirst || !place.isSamePlace(root.place);
     root.place = std::move(place);
     if (!isOther)
@@ -159,7 +210,7 @@ FolderFollowing::Look RootPlacing::lookThroughPlace(WatchedRoot& root, Date sinc
     if (folder == WatchedFolders::none)
         return {};
     const FolderFollowing::Look look = _following.lookThrough(folder, since);
-    if (_context.folders.isMarked(folder, WatchedFolders::polled) && !root.stands)
+    if (_context.folders.isMarked(folder, WatchedFolders::polled) && !root.history.stands)
         root.awaitedLook = root.place.path;
     return look;
 }
@@ -194,12 +245,9 @@ void RootPlacing::take(const PollingReport& report)
     });
 }
 
-void RootPlacing::takeMounts(PolledMounts mounts)
+void RootPlacing::takeMounts(PolledMounts mounts, const std::vector<std::string>& points)
 {
-    const std::vector<std::string> points = changedMountPoints(_context.mounts.table(), mounts.table());
     _context.mounts = std::move(mounts);
-    if (points.empty())
-        return;
     for (const std::string& point : points) {
         const WatchedFolders::Number folder = _context.folders.atPath(point);
         if (folder != WatchedFolders::none && _context.folders.isMarked(folder, WatchedFolders::followed))

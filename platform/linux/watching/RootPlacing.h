@@ -6,11 +6,14 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
+#include <string>
 #include <vector>
 
 namespace platform {
 
-/// Finds out where watched paths lead, and follows what they lead to. The watcher's thread.
+/// Finds out where watched paths lead, and follows what they lead to, as far as that is this thread's. The watcher's
+/// thread.
 class RootPlacing {
 public:
     RootPlacing(WatchingContext& context, FolderFollowing& following)
@@ -19,18 +22,21 @@ public:
     {
     }
 
-    void begin(const std::shared_ptr<const PathWatch>& watch);
+    void begin(AddedWatch added);
     void end(std::uint64_t watch);
     /// Follows the paths again on whose way something has changed.
     void followNoted();
     /// Follows all paths again, looks through what they lead to, and says that nothing of it is known any more.
     void followAllAnew();
     void take(const PollingReport& report);
-    /// Says what is mounted now, and looks through what was mounted or unmounted.
-    void takeMounts(PolledMounts mounts);
+    /// Says what is mounted now, and looks through what was mounted or unmounted, at `points`.
+    void takeMounts(PolledMounts mounts, const std::vector<std::string>& points);
 
 private:
     void follow(WatchedRoot& root);
+    WatchedPlace placeOf(const WatchedRoot& root) const;
+    std::optional<std::string> otherThread(const WatchedPlace& place) const;
+    void handOver(WatchedRoot& root, const std::string& device);
     bool watchWay(WatchedRoot& root, WatchedPlace& place);
     bool watchSteps(WatchedRoot& root, const WatchedPlace& place);
     void settleSteps(const std::vector<WatchedFolders::Number>& folders);

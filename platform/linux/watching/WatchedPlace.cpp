@@ -31,20 +31,20 @@ namespace {
 
     class Way {
     public:
-        Way(const FileSystem& files, const PolledMounts& polled)
+        Way(const FileSystem& files, const MayLook& mayLook)
             : _files(files)
-            , _polled(polled)
+            , _mayLook(mayLook)
         {
         }
 
         WatchedPlace placeOf(std::string_view path)
         {
             follow(std::string(path));
-            if (!_place.isPolled) {
+            if (!_place.endsEarly) {
                 _place.path = _files.resolvedPath(path);
                 follow(_place.path);
             }
-            if (!_place.isPolled)
+            if (!_place.endsEarly)
                 takeFacts();
             return std::move(_place);
         }
@@ -56,7 +56,7 @@ namespace {
         void takeFacts();
 
         const FileSystem& _files;
-        const PolledMounts& _polled;
+        const MayLook& _mayLook;
         WatchedPlace _place {};
         std::set<std::string> _pathsFollowed {};
     };
@@ -65,7 +65,7 @@ namespace {
     {
         if (path.empty() || path.front() != '/' || !_pathsFollowed.insert(path).second)
             return;
-        for (std::size_t start = 0; start < path.size() && !_place.isPolled;) {
+        for (std::size_t start = 0; start < path.size() && !_place.endsEarly;) {
             const std::size_t end = std::min(path.find('/', start + 1), path.size());
             const std::string_view name = std::string_view(path).substr(start + 1, end - start - 1);
             if (!name.empty() && name != "." && name != "..") {
@@ -79,7 +79,7 @@ namespace {
 
     void Way::step(const std::string& folder, std::string_view name)
     {
-        _place.isPolled = _polled.holds(pathJoined(folder, name));
+        _place.endsEarly = _mayLook && !_mayLook(pathJoined(folder, name));
         const auto isKnown
             = [&](const PlaceStep& candidate) { return candidate.folder == folder && candidate.name == name; };
         if (std::none_of(_place.steps.begin(), _place.steps.end(), isKnown))
@@ -88,7 +88,7 @@ namespace {
 
     void Way::followLink(const std::string& path, const std::string& folder)
     {
-        const std::optional<std::string> target = _place.isPolled ? std::nullopt : _files.linkTarget(path);
+        const std::optional<std::string> target = _place.endsEarly ? std::nullopt : _files.linkTarget(path);
         if (!target || target->empty())
             return;
         if (const auto facts = factsAt(pathJoined(folder, lastPathComponent(path))); facts && S_ISLNK(facts->st_mode))
@@ -109,15 +109,16 @@ namespace {
             path = pathByRemovingLastComponent(path);
             facts = factsAt(path);
         }
+        _place.reached = path;
         if (facts && _place.kind != WatchedPlace::Kind::folder)
             _place.changed = std::max(_place.changed, changeDate(*facts));
     }
 
 } // namespace
 
-WatchedPlace placeOfPath(const FileSystem& files, std::string_view path, const PolledMounts& polled)
+WatchedPlace placeOfPath(const FileSystem& files, std::string_view path, const MayLook& mayLook)
 {
-    return Way(files, polled).placeOf(path);
+    return Way(files, mayLook).placeOf(path);
 }
 
 } // namespace platform

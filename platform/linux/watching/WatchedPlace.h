@@ -1,9 +1,9 @@
 #pragma once
 
 #include "platform/Value.h"
-#include "platform/linux/watching/PolledMounts.h"
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -25,6 +25,8 @@ struct WatchedPlace {
     enum class Kind : std::uint8_t { missing, folder, other };
 
     std::string path {}; ///< the real path
+    /// The real path; where nothing is there, that of the nearest folder above it that is.
+    std::string reached {};
     Kind kind = Kind::missing;
     std::uint64_t device = 0;
     std::uint64_t inode = 0;
@@ -32,16 +34,20 @@ struct WatchedPlace {
     /// nothing is there, the folder that could hold the next step.
     Date changed {};
     std::vector<PlaceStep> steps {}; ///< those near "/" first, each once
-    bool isPolled = false; ///< the way leads over a file system that is polled, and has not been followed further
+    /// The last step leads to where the asker may not look, so the way has not been followed further.
+    bool endsEarly = false;
 
     bool isSamePlace(const WatchedPlace& other) const
     {
         return path == other.path && kind == other.kind && device == other.device && inode == other.inode
-            && isPolled == other.isPolled;
+            && endsEarly == other.endsEarly;
     }
 };
 
-/// Follows `path` as `files` does. Touches nothing on a mount of `polled`; an empty table follows everything.
-WatchedPlace placeOfPath(const FileSystem& files, std::string_view path, const PolledMounts& polled);
+/// Whether one may look at a real path; null is anywhere.
+using MayLook = std::function<bool(std::string_view realPath)>;
+
+/// Follows `path` as `files` does, and looks only where `mayLook` lets it.
+WatchedPlace placeOfPath(const FileSystem& files, std::string_view path, const MayLook& mayLook);
 
 } // namespace platform

@@ -18,10 +18,12 @@ namespace {
 
 } // namespace
 
-WatchedRoot& WatchedRoots::add(std::shared_ptr<const PathWatch> watch)
+WatchedRoot& WatchedRoots::add(AddedWatch added)
 {
-    const std::uint64_t number = watch->number;
-    return _roots.emplace(number, WatchedRoot { std::move(watch) }).first->second;
+    const std::uint64_t number = added.watch->number;
+    WatchedRoot& root = _roots.emplace(number, WatchedRoot { std::move(added.watch) }).first->second;
+    root.history = std::move(added.history);
+    return root;
 }
 
 WatchedRoot* WatchedRoots::find(std::uint64_t number)
@@ -175,7 +177,7 @@ void WatchedRoots::tellAnything(WatchedRoot& root)
 
 void WatchedRoots::tellStanding(WatchedRoot& root)
 {
-    if (!std::exchange(root.stands, true) && root.watch->handlers.stands)
+    if (!std::exchange(root.history.stands, true) && root.watch->handlers.stands)
         _queue.call(*root.watch, root.watch->handlers.stands);
 }
 
@@ -191,7 +193,7 @@ void WatchedRoots::tellProblem(std::string_view realPath, WatchingProblem proble
 
 void WatchedRoots::tellProblem(WatchedRoot& root, const WatchingProblem& problem)
 {
-    if (root.causesTold.insert(problem.cause).second && root.watch->handlers.failed)
+    if (root.history.causesTold.insert(problem.cause).second && root.watch->handlers.failed)
         _queue.call(*root.watch, [&] { root.watch->handlers.failed(problem); });
 }
 

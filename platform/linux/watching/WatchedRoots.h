@@ -22,13 +22,11 @@ struct WatchedRoot {
     /// The entry of the folder that it leads to; none where that is no folder or is polled.
     WatchedFolders::Number folder = WatchedFolders::none;
     std::vector<WatchedFolders::Number> folderOfSteps {}; ///< those in which a step of the way is watched
-    bool isPlaced = false;
-    bool stands = false;
+    RootHistory history {};
     std::string awaitedLook {}; ///< the folder that is polled and has to be looked through before it stands
     bool isWayPolled = false;
     bool mustFollowAgain = false; ///< something on the way has changed
     bool mustTell = false; ///< what the path leads to is another one, even if it should look the same
-    std::set<std::string> causesTold {};
 
     const std::string& path() const { return watch->path; }
 };
@@ -49,15 +47,16 @@ public:
     {
     }
 
-    WatchedRoot& add(std::shared_ptr<const PathWatch> watch);
+    WatchedRoot& add(AddedWatch added);
     WatchedRoot* find(std::uint64_t number);
     /// Whoever removes a root has taken it from its folders.
     void remove(std::uint64_t number) { _roots.erase(number); }
     bool isEmpty() const { return _roots.empty(); }
+    /// `take` may remove the root that it is given.
     template <class Take> void forEach(const Take& take)
     {
-        for (auto& [number, root] : _roots)
-            take(root);
+        for (auto next = _roots.begin(); next != _roots.end();)
+            take((next++)->second);
     }
 
     /// Says that `root` leads to `folder`, or to none.

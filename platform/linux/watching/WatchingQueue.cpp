@@ -11,13 +11,13 @@ WatchingQueue::WatchingQueue()
 {
 }
 
-bool WatchingQueue::add(std::shared_ptr<const PathWatch> watch)
+bool WatchingQueue::add(AddedWatch added)
 {
     Locked guard(_lock);
     if (_hasEnded)
         return false;
-    _watches.insert(watch->number);
-    _tasks.added.push_back(std::move(watch));
+    _watches.insert(added.watch->number);
+    _tasks.added.push_back(std::move(added));
     wake();
     return true;
 }
@@ -29,6 +29,12 @@ void WatchingQueue::remove(std::uint64_t number)
     _tasks.removed.push_back(number);
     wake();
     waitForHandlerOf(number);
+}
+
+void WatchingQueue::forget(std::uint64_t number)
+{
+    Locked guard(_lock);
+    _watches.erase(number);
 }
 
 void WatchingQueue::waitForHandlerOf(std::uint64_t number)

@@ -4,6 +4,7 @@
 #include "platform/ThreadSafety.h"
 #include "platform/linux/Descriptor.h"
 #include "platform/linux/watching/PollingReport.h"
+#include "platform/linux/watching/RootHistory.h"
 
 #include <cstdint>
 #include <memory>
@@ -22,16 +23,22 @@ struct PathWatch {
     PathWatchHandlers handlers;
 };
 
-/// What the watcher's thread has to do besides reading events.
+/// A watch that a thread is to follow from now on.
+struct AddedWatch {
+    std::shared_ptr<const PathWatch> watch;
+    RootHistory history {}; ///< with the threads that have followed it
+};
+
+/// What a watcher's thread has to do besides reading events.
 struct WatchingTasks {
-    std::vector<std::shared_ptr<const PathWatch>> added {};
+    std::vector<AddedWatch> added {};
     std::vector<std::uint64_t> removed {};
     std::vector<PollingReport> reports {};
     bool reportsWereLost = false; ///< of changes, which were too many
     bool mountsHaveChanged = false;
 };
 
-/// What others ask of the watcher's thread, and the gate through which that thread calls handlers. Any thread.
+/// What others ask of a watcher's thread, and the gate through which that thread calls handlers. Any thread.
 ///
 /// No lock is held while a handler runs, so that a handler may begin and end watches.
 class WatchingQueue {
@@ -42,9 +49,11 @@ public:
     int descriptor() const noexcept { return _wake.number(); }
 
     /// False once the thread has ended.
-    bool add(std::shared_ptr<const PathWatch> watch);
+    bool add(AddedWatch added);
     /// No handler of it is called from now on. Waits for one that is being called by another thread.
     void remove(std::uint64_t number);
+    /// Lets the thread, which asks for it, have no part in the watch any more.
+    void forget(std::uint64_t number);
     void noteMounts();
     void report(std::vector<PollingReport> reports);
     /// Ends the thread whatever is still watched. Waits for a handler that is being called by another thread.

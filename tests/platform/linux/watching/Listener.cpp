@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <limits>
+#include <thread>
 #include <utility>
 
 using platform::Locked;
@@ -146,6 +147,20 @@ Changes changesSoFar(Listener& listener, const std::string& root)
     const std::string name = "marker " + std::to_string(++count);
     makeLink(root + '/' + name, "nowhere");
     return listener.until("appeared " + name);
+}
+
+bool comesToHear(Listener& listener, const std::string& folder, const std::string& name)
+{
+    const auto end = std::chrono::steady_clock::now() + std::chrono::minutes(1);
+    for (int number = 0; std::chrono::steady_clock::now() < end; ++number) {
+        tests::writeFile(folder + "/" + name + std::to_string(number), "x");
+        const Changes told = listener.take();
+        const auto isOfFile = [&](const std::string& change) { return change.starts_with("arrivalEnded " + name); };
+        if (std::any_of(told.begin(), told.end(), isOfFile))
+            return true;
+        std::this_thread::yield();
+    }
+    return false;
 }
 
 platform::Date afterEverything()

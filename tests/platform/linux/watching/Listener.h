@@ -11,9 +11,12 @@
 
 #include <doctest/doctest.h>
 
+#include <atomic>
 #include <functional>
 #include <memory>
 #include <string>
+#include <string_view>
+#include <utility>
 #include <vector>
 
 namespace tests {
@@ -65,19 +68,35 @@ private:
 };
 
 /// A disk on which folders are followed, with limits that a test sets before the first watch.
-struct FollowedDisk {
+template <class Files> struct FollowedFiles {
     TemporaryFolder disk {};
-    platform::LinuxFileSystem files {};
+    Files files {};
     platform::LinuxVolumes volumes { files };
     platform::LinuxClock clock {};
     platform::LinuxThreads threads {};
     platform::LinuxPathWatching watching;
 
-    explicit FollowedDisk(platform::LinuxWatchingLimits limits = {})
+    explicit FollowedFiles(platform::LinuxWatchingLimits limits = {})
         : watching(files, volumes, clock, threads, std::move(limits))
     {
     }
     std::string path(const std::string& relativePath) const { return disk.path(relativePath); }
+};
+
+using FollowedDisk = FollowedFiles<platform::LinuxFileSystem>;
+
+/// The files of this machine, which tells how often it was asked where a path leads. Any thread.
+class NotedFileSystem : public platform::LinuxFileSystem {
+public:
+    int resolutions() const { return _resolutions; }
+    std::string resolvedPath(std::string_view path) const override
+    {
+        ++_resolutions;
+        return LinuxFileSystem::resolvedPath(path);
+    }
+
+private:
+    mutable std::atomic<int> _resolutions { 0 };
 };
 
 /// What std::rename does, or the test program ends.
@@ -85,6 +104,10 @@ void moveItem(const std::string& from, const std::string& to);
 
 /// What is told of the root until a file, made now in the watched folder `root`, has appeared.
 Changes changesSoFar(Listener& listener, const std::string& root);
+
+/// Whether files that are made in `folder` from now on, their names beginning with `name`, come to be told of. False when
+/// that does not happen within a minute.
+bool comesToHear(Listener& listener, const std::string& folder, const std::string& name);
 
 /// A time later than every change.
 platform::Date afterEverything();

@@ -15,6 +15,7 @@
 using tests::Changes;
 using tests::changesSoFar;
 using tests::FollowedDisk;
+using tests::FollowedFiles;
 using tests::Listener;
 
 TEST_CASE("a path that does not exist is awaited")
@@ -29,6 +30,24 @@ TEST_CASE("a path that does not exist is awaited")
     CHECK(listener.hears("anythingChanged ."));
     machine.disk.file("a/b/c/file");
     CHECK(listener.hears("appeared file"));
+}
+
+TEST_CASE("a path whose folders are made while its way is being watched is followed")
+{
+    constexpr int rounds = 300;
+    FollowedFiles<tests::NotedFileSystem> machine;
+    for (int round = 0; round < rounds; ++round) {
+        const std::string top = machine.path("round " + std::to_string(round));
+        const std::string awaited = top + "/b/c";
+        Listener listener(machine.watching, awaited);
+        const int before = machine.files.resolutions();
+        tests::makeFolder(top);
+        // Now and a little later the watcher is at the folders on the way.
+        while (machine.files.resolutions() < before + 3 + round % 9) { }
+        tests::makeFolder(top + "/b");
+        tests::makeFolder(awaited);
+        REQUIRE(tests::comesToHear(listener, awaited, "file"));
+    }
 }
 
 TEST_CASE("what happens beside an awaited path is told to nobody")

@@ -125,6 +125,33 @@ TEST_CASE("a load asked for while a cancel is pending starts afterwards and is n
     CHECK(pending == std::vector<bool> { false, false });
 }
 
+TEST_CASE("a load asked for after a cancel is not cancelled, however far the one before had come")
+{
+    constexpr int rounds = 2000;
+    TestHost test;
+    const auto manager = test.manager();
+    std::atomic<bool> isOver { false };
+    // Has the thread of loads wait at each of its steps.
+    std::thread busy([&] {
+        while (!isOver)
+            manager->setAutoReloadEnabled(false);
+    });
+    int cancelled = 0;
+    for (int round = 0; round < rounds; ++round) {
+        manager->setNeedsReload(true);
+        const Request before(*manager);
+        for (volatile int wait = 0; wait < 40 * (round % 50);)
+            wait = wait + 1;
+        manager->cancelLoad();
+        const Request after(*manager);
+        cancelled += after.answer().outcome == OBLoadOutcome::cancelled ? 1 : 0;
+        before.answer();
+    }
+    isOver = true;
+    busy.join();
+    CHECK(cancelled == 0);
+}
+
 TEST_CASE("a loadData called while a cancel is pending runs afterwards and is not cancelled")
 {
     TestHost test;

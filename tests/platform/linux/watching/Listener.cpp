@@ -153,7 +153,7 @@ bool comesToHear(Listener& listener, const std::string& folder, const std::strin
 {
     const auto end = std::chrono::steady_clock::now() + std::chrono::minutes(1);
     for (int number = 0; std::chrono::steady_clock::now() < end; ++number) {
-        tests::writeFile(folder + "/" + name + std::to_string(number), "x");
+        writeFile(platform::pathJoined(folder, name + std::to_string(number)), "x");
         const Changes told = listener.take();
         const auto isOfFile = [&](const std::string& change) { return change.starts_with("arrivalEnded " + name); };
         if (std::any_of(told.begin(), told.end(), isOfFile))

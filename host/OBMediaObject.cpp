@@ -302,9 +302,16 @@ OBMediaObjectRecord OBMediaObject::record() const
     record.sourcePluginIdentifier = _own ? _own->sourcePluginIdentifier : kind.sourcePluginIdentifier;
     record.path = pathLocked();
     record.pathIsReal = _pathIsReal;
+    record.isAsMade = isAsMadeLocked();
     record.icon = _own ? handedOut(_own->icon) : _origin.icon();
     record.attributes = attributesLocked(_own ? _origin.pathOfObject(*this) : record.path);
     return record;
+}
+
+bool OBMediaObject::isAsMade() const
+{
+    Locked guard(_lock);
+    return isAsMadeLocked();
 }
 
 OBImageRef OBMediaObject::icon() const

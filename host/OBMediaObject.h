@@ -66,6 +66,7 @@ struct OBMediaObjectRecord {
     platform::Text sourcePluginIdentifier {};
     platform::Text path {};
     bool pathIsReal = false; ///< the path was seen to hold no symbolic link: it is its own real path
+    bool isAsMade = false; ///< what `OBMediaObject::isAsMade` answers
     OBImageRef icon {};
     platform::Value::Dictionary attributes {};
 };
@@ -98,6 +99,9 @@ public:
 
     /// All of it at once, for whoever prints a million.
     OBMediaObjectRecord record() const;
+    /// Whether it is still as it was made: nobody has changed it, nothing is known of its movie, and its path is its real
+    /// path. All such objects of a batch differ by their files' names alone.
+    bool isAsMade() const;
 
     /// The file; absent when none was set.
     platform::Text path() const;
@@ -156,6 +160,7 @@ private:
         const OBMediaObjectOrigin& origin, std::uint32_t nameOffset, std::uint16_t nameLength, bool pathIsReal);
 
     OwnFields& own() REQUIRES(_lock);
+    bool isAsMadeLocked() const REQUIRES(_lock) { return !_own && !_movie && _pathIsReal; }
     platform::Text pathLocked() const REQUIRES(_lock);
     std::optional<platform::FileFacts> factsLocked() const REQUIRES(_lock);
     platform::Value::Dictionary attributesLocked(const platform::Text& firstPath) const REQUIRES(_lock);

@@ -1,7 +1,9 @@
 #include "apps/common/RecordJson.h"
 
+#include "platform/PathText.h"
 #include "platform/formats/JsonWriter.h"
 
+#include <string>
 #include <vector>
 
 namespace apps {
@@ -34,41 +36,155 @@ namespace {
         writeText(writer, "icon", icon ? icon->name() : Text());
     }
 
-    void writeAttributes(JsonWriter& writer, const Value::Dictionary& attributes)
+    /// `write` writes the texts among the values.
+    template <class WriteText>
+    void writeAttributes(JsonWriter& writer, const Value::Dictionary& attributes, const WriteText& write)
     {
         writer.plainKey("attributes");
         writer.beginObject();
-        for (const Value::Entry& attribute : attributes) {
-            writer.key(attribute.first);
-            writer.value(attribute.second);
+        for (const auto& [key, value] : attributes) {
+            writer.key(key);
+            if (const Text* text = value.text())
+                write(*text);
+            else
+                writer.value(value);
         }
         writer.endObject();
     }
 
-    void writeObject(JsonWriter& writer, const OBMediaObject& object)
+    /// `write` writes the texts that may differ between the objects of a folder.
+    template <class WriteText>
+    void writeObject(
+        JsonWriter& writer, const OBMediaObjectRecord& record, const Text& realPath, const WriteText& write)
     {
-        const OBMediaObjectRecord record = object.record();
         writer.beginObject();
         writer.plainKey("mediaType");
         writer.integer(record.mediaType);
-        writeText(writer, "name", record.name);
+        writer.plainKey("name");
+        write(record.name);
         writer.plainKey("mediaSourceType");
         writer.integer(record.mediaSourceType);
         writeText(writer, "sourcePluginIdentifier", record.sourcePluginIdentifier);
-        writeText(writer, "path", record.path);
-        writeText(writer, "aliasResolvedPath", record.pathIsReal ? record.path : object.aliasResolvedPath());
+        writer.plainKey("path");
+        write(record.path);
+        writer.plainKey("aliasResolvedPath");
+        write(realPath);
         writeIcon(writer, record.icon);
-        writeAttributes(writer, record.attributes);
+        writeAttributes(writer, record.attributes, write);
         writer.endObject();
     }
+
+    void writeObject(JsonWriter& writer, const OBMediaObject& object, const OBMediaObjectRecord& record)
+    {
+        writeObject(writer, record, record.pathIsReal ? record.path : object.aliasResolvedPath(),
+            [&writer](const Text& text) { writer.text(text); });
+    }
+
+    /// An object's JSON with gaps for its name and its file's name. The files of a folder mostly differ by these alone, and
+    /// a library holds a million of them, so all else is looked up, quoted and put together once a folder.
+    class ObjectStencil {
+    public:
+        /// Cuts it anew after an object that is as its batch made it.
+        void cut(const OBMediaObjectRecord& record, std::string_view fileName)
+        {
+            _json.clear();
+            _gaps.clear();
+            JsonWriter writer([this](std::string_view block) { _json.append(block); });
+            const auto writeGap = [&](std::string_view before, bool isOfName) {
+                writer.string(before);
+                writer.flush();
+                _gaps.push_back({ _json.size() - 1, isOfName }); // before the closing quote
+            };
+            // Known by where the bytes lie: another text may happen to say the same.
+            const auto isSame
+                = [](const Text& left, const Text& right) { return left.view().data() == right.view().data(); };
+            const std::string_view folder = record.path.view().substr(0, record.path.size() - fileName.size());
+            writeObject(writer, record, record.path, [&](const Text& text) {
+                if (isSame(text, record.name))
+                    writeGap({}, true);
+                else if (isSame(text, record.path))
+                    writeGap(folder, false);
+                else
+                    writer.text(text);
+            });
+            writer.flush();
+            layOut();
+        }
+
+        void write(JsonWriter& writer, std::string_view fileName)
+        {
+            _fileName.clear();
+            JsonWriter::appendString(_fileName, fileName);
+            // No full stop is ever escaped, and no escape holds one.
+            const std::string_view name = platform::nameWithoutExtension(_fileName);
+            for (std::size_t gap = 0; gap < _gaps.size(); ++gap)
+                _pieces[2 * gap + 1] = _gaps[gap].isOfName ? name : std::string_view(_fileName);
+            writer.json(_pieces);
+        }
+
+    private:
+        struct Gap {
+            std::size_t place;
+            bool isOfName; ///< which leaves the extension out
+        };
+
+        void layOut()
+        {
+            const std::string_view json = _json;
+            std::size_t start = 0;
+            _pieces.clear();
+            for (const Gap& gap : _gaps) {
+                _pieces.push_back(json.substr(start, gap.place - start));
+                _pieces.emplace_back(); // the gap
+                start = gap.place;
+            }
+            _pieces.push_back(json.substr(start));
+        }
+
+        std::string _json;
+        std::vector<Gap> _gaps;
+        std::vector<std::string_view> _pieces; ///< of the JSON, and between each two what fills the gap there
+        std::string _fileName; ///< of the object that is written, escaped
+    };
+
+    class ObjectsWriter final : public OBMediaObjectRunVisitor {
+    public:
+        explicit ObjectsWriter(JsonWriter& writer)
+            : _writer(writer)
+        {
+        }
+
+        void visitBatch(const OBMediaObjectBatch& batch, std::size_t count) override
+        {
+            bool isCut = false;
+            std::size_t next = 0;
+            batch.visit(count, [&](OBMediaObject& object) {
+                const std::string_view fileName = batch.fileNameAtIndex(next++);
+                if (isCut && object.isAsMade()) {
+                    _stencil.write(_writer, fileName);
+                    return true;
+                }
+                const OBMediaObjectRecord record = object.record();
+                writeObject(_writer, object, record);
+                if (record.isAsMade && !isCut && next < count) {
+                    _stencil.cut(record, fileName);
+                    isCut = true;
+                }
+                return true;
+            });
+        }
+        void visitObject(const OBMediaObjectRef& object) override { writeObject(_writer, *object, object->record()); }
+
+    private:
+        JsonWriter& _writer;
+        ObjectStencil _stencil {};
+    };
 
     void writeObjects(JsonWriter& writer, const OBMediaObjectList& objects)
     {
         writer.beginList();
-        objects.visit([&writer](OBMediaObject& object) {
-            writeObject(writer, object);
-            return true;
-        });
+        ObjectsWriter visitor(writer);
+        objects.visitRuns(visitor);
         writer.endList();
     }
 
@@ -92,7 +208,7 @@ namespace {
             writer.date(*date);
         else
             writer.null();
-        writeAttributes(writer, group.attributes());
+        writeAttributes(writer, group.attributes(), [&writer](const Text& text) { writer.text(text); });
         writer.plainKey("mediaObjects");
         writeObjects(writer, group.ownMediaObjects());
     }

@@ -17,19 +17,14 @@ namespace {
         return byte * 0x0101010101010101;
     }
 
-    /// The high bit of each byte of `eight` that is zero; bits above the first one set may be wrong.
-    constexpr std::uint64_t zeroBytes(std::uint64_t eight)
-    {
-        return (eight - everyByte(1)) & ~eight & everyByte(0x80);
-    }
-
-    /// 0 when all eight are ASCII and may stand in a string as they are.
+    /// 0 when all eight are ASCII and may stand in a string as they are. A byte that may not borrows from those above it,
+    /// so which ones may not is not told.
     std::uint64_t unplainBytes(std::uint64_t eight)
     {
-        const std::uint64_t controls = (eight - everyByte(0x20)) & ~eight & everyByte(0x80);
-        const std::uint64_t quotes = zeroBytes(eight ^ everyByte('"'));
-        const std::uint64_t backslashes = zeroBytes(eight ^ everyByte('\\'));
-        return (eight & everyByte(0x80)) | controls | quotes | backslashes;
+        const std::uint64_t controls = eight - everyByte(0x20);
+        const std::uint64_t quotes = (eight ^ everyByte('"')) - everyByte(1);
+        const std::uint64_t backslashes = (eight ^ everyByte('\\')) - everyByte(1);
+        return (eight | controls | quotes | backslashes) & everyByte(0x80);
     }
 
     bool isPlain(char letter)
@@ -109,11 +104,31 @@ namespace {
         }
     }
 
+    /// Hands on what stands for `text` between quotes.
+    template <class Append> void escape(std::string_view text, const Append& append)
+    {
+        std::size_t position = 0;
+        for (;;) {
+            const std::size_t run = plainRun(text, position);
+            append(text.substr(position, run));
+            position += run;
+            if (position == text.size())
+                break;
+            const char letter = text[position++];
+            if (static_cast<unsigned char>(letter) >= 0x80) {
+                append(replacementCharacter);
+            } else {
+                const Escape escape = escapeFor(letter);
+                append(std::string_view(escape.letters, escape.length));
+            }
+        }
+    }
+
 } // namespace
 
 JsonWriter::JsonWriter(Sink sink)
     : _sink(std::move(sink))
-    , _block(std::make_unique<char[]>(blockSize))
+    , _block(std::make_unique_for_overwrite<char[]>(blockSize))
 {
 }
 
@@ -219,6 +234,21 @@ void JsonWriter::value(const Value& value)
     }
 }
 
+void JsonWriter::json(std::span<const std::string_view> pieces)
+{
+    separate();
+    for (const std::string_view piece : pieces)
+        append(piece);
+}
+
+void JsonWriter::appendString(std::string& json, std::string_view text)
+{
+    if (isPlain(text))
+        json.append(text);
+    else
+        escape(text, [&json](std::string_view bytes) { json.append(bytes); });
+}
+
 void JsonWriter::endDocument()
 {
     append('\n');
@@ -263,21 +293,7 @@ void JsonWriter::quoted(std::string_view text)
         return;
     }
     append('"');
-    std::size_t position = 0;
-    for (;;) {
-        const std::size_t run = plainRun(text, position);
-        append(text.substr(position, run));
-        position += run;
-        if (position == text.size())
-            break;
-        const char letter = text[position++];
-        if (static_cast<unsigned char>(letter) >= 0x80) {
-            append(replacementCharacter);
-        } else {
-            const Escape escape = escapeFor(letter);
-            append({ escape.letters, escape.length });
-        }
-    }
+    escape(text, [this](std::string_view bytes) { append(bytes); });
     append('"');
 }
 
@@ -297,15 +313,19 @@ void JsonWriter::append(char letter)
 
 void JsonWriter::append(std::string_view bytes)
 {
-    if (bytes.size() > blockSize - _length) {
-        flush();
-        if (bytes.size() > blockSize)
-            return _sink(bytes);
-    }
-    if (bytes.empty())
-        return;
-    std::memcpy(_block.get() + _length, bytes.data(), bytes.size());
+    if (bytes.size() > blockSize - _length)
+        return appendBeyondBlock(bytes);
+    std::copy(bytes.begin(), bytes.end(), _block.get() + _length);
     _length += bytes.size();
+}
+
+void JsonWriter::appendBeyondBlock(std::string_view bytes)
+{
+    flush();
+    if (bytes.size() > blockSize)
+        _sink(bytes);
+    else
+        append(bytes);
 }
 
 } // namespace platform

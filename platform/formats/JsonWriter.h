@@ -7,6 +7,8 @@
 #include <cstring>
 #include <functional>
 #include <memory>
+#include <span>
+#include <string>
 #include <string_view>
 
 namespace platform {
@@ -66,6 +68,11 @@ public:
     /// Any value by its kind; data as Base64.
     void value(const Value& value);
 
+    /// A value whose JSON stands ready, in pieces.
+    void json(std::span<const std::string_view> pieces);
+    /// Appends what `string` puts between the quotes.
+    static void appendString(std::string& json, std::string_view text);
+
     /// Ends a document with a line feed; another one may follow.
     void endDocument();
     /// Hands what was collected to the sink.
@@ -87,6 +94,7 @@ private:
     void separate();
     void append(char letter);
     void append(std::string_view bytes);
+    void appendBeyondBlock(std::string_view bytes);
 
     const Sink _sink;
     const std::unique_ptr<char[]> _block;

@@ -1,12 +1,15 @@
 #include "apps/common/RecordJson.h"
 #include "apps/common/Output.h"
 #include "host/OBConstants.h"
+#include "host/OBMediaObjectList.h"
 
 #include <doctest/doctest.h>
 
 #include <cstdio>
 #include <functional>
+#include <memory>
 #include <string>
+#include <vector>
 
 #include <unistd.h>
 
@@ -66,6 +69,32 @@ TEST_CASE("an object prints every key, and null for a file that is not there")
     CHECK(printed([&objects](apps::Output& output) { apps::printObjects(output, objects); })
         == "[{\"mediaType\":3,\"name\":\"clip\",\"mediaSourceType\":4,\"sourcePluginIdentifier\":null,\"path\":null,"
            "\"aliasResolvedPath\":null,\"icon\":null,\"attributes\":{\"Project Path\":\"/p\"}}]\n");
+}
+
+TEST_CASE("each object of a folder is printed as it is by itself, whatever its name and whoever has changed it")
+{
+    OBMediaObjectKind kind;
+    kind.mediaType = OBMediaTypeMovie;
+    kind.sourcePluginIdentifier = "a.mov";
+    kind.icon = OBImage::pictureNamed("icon", { 16, 16 }, "/x.svg");
+    kind.ownPathKeys = { "Path", "Same \"path\"" };
+    kind.beforeFileName = "/Below/";
+    kind.attributes = { { "first", "/f\n\xff/Below/a.mov" }, { "number", 1 } };
+    const std::vector<OBFileOfFolder> files { { "a.mov", true }, { "a.mov", true }, { "link.mov", false },
+        { "b \"quoted\".mov", true }, { "changed.mov", true }, { "\xff.\xc3.mov", true }, { ".hidden", true },
+        { "no extension", true }, { "dots..", true }, { "\t.\n", true }, { "last.mov", true } };
+    const OBMediaObjectList list
+        = OBMediaObjectBatch::objects(std::make_shared<const OBMediaObjectKind>(kind), { "/f\n\xff", true }, files);
+    list[4]->setPath("/elsewhere.mov");
+    const OBMediaObjectList oneByOne(list.objects());
+    const auto textOf = [](const OBMediaObjectList& objects) {
+        return printed([&objects](apps::Output& output) { apps::printObjects(output, objects); });
+    };
+    CHECK(textOf(list) == textOf(oneByOne));
+    CHECK(textOf(list.prefix(1)) == textOf(oneByOne.prefix(1)));
+    CHECK(textOf(list.prefix(2).appending(list)) == textOf(oneByOne.prefix(2).appending(oneByOne)));
+    list[0]->setMediaSourceType(5);
+    CHECK(textOf(list) == textOf(oneByOne));
 }
 
 TEST_CASE("a group prints the objects and children that were set on it, not those of what lies below")

@@ -300,6 +300,21 @@ TEST_CASE("a record of an object holds what its fields answer, also where somebo
     CHECK(objects[0]->record().path == "/elsewhere/other.mov");
 }
 
+TEST_CASE("an object whose path is its real path is as it was made until somebody changes it")
+{
+    const std::vector<OBFileOfFolder> files { { "a.mov", true }, { "link.mov", false } };
+    const OBMediaObjectList list = OBMediaObjectBatch::objects(projectMovies(), { "/movies", true }, files);
+    const auto isAsMade = [](const OBMediaObject& object) {
+        CHECK(object.record().isAsMade == object.isAsMade());
+        return object.isAsMade();
+    };
+    CHECK(isAsMade(*list[0]));
+    CHECK_FALSE(isAsMade(*list[1]));
+    CHECK_FALSE(isAsMade(*OBMediaObjectBatch::objects(projectMovies(), { "/linked", false }, files)[0]));
+    list[0]->setPath("/movies/a.mov");
+    CHECK_FALSE(isAsMade(*list[0]));
+}
+
 TEST_CASE("an object keeps what was seen of its file until it gets another path, and asks nothing of the disk for it")
 {
     const HostMachine machine;

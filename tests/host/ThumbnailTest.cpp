@@ -93,6 +93,21 @@ TEST_CASE("a file that is no movie has neither thumbnail nor attributes, and is 
     CHECK(test.machine.movies.read().size() == 1);
 }
 
+TEST_CASE("an object is no longer as it was made once something is known of its movie")
+{
+    TestHost test;
+    test.host();
+    writeMovie(test, "movie.mov");
+    const auto object = objectOfFolder(test.machine.folder.path(), "movie.mov");
+    CHECK(object->isAsMade());
+    CHECK(object->thumbnailImage() != nullptr);
+    CHECK_FALSE(object->isAsMade());
+    test.machine.folder.file("other.mov", "no movie at all");
+    const auto other = objectOfFolder(test.machine.folder.path(), "other.mov");
+    CHECK(other->thumbnailImage() == nullptr);
+    CHECK(other->isAsMade());
+}
+
 TEST_CASE("a movie of sound alone has a duration, but neither resolution nor thumbnail")
 {
     TestHost test;

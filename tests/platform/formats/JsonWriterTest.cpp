@@ -125,6 +125,32 @@ TEST_CASE("every byte at every place of a word is written as it is alone")
     }
 }
 
+TEST_CASE("what stands ready in pieces is a value like any other, wherever a block ends")
+{
+    std::string expected = "[";
+    const std::string text = written([&](JsonWriter& json) {
+        json.beginList();
+        for (int number = 0; number < 20'000; ++number) {
+            const std::string digits = std::to_string(number);
+            const std::vector<std::string_view> pieces { "{\"a\":", digits, "", "}" };
+            json.json(pieces);
+            expected += (number ? ",{\"a\":" : "{\"a\":") + digits + "}";
+        }
+        json.endList();
+    });
+    CHECK(text == expected + "]");
+}
+
+TEST_CASE("what is appended as part of a string is what a string holds between its quotes")
+{
+    for (const std::string_view text : { "", "plain", "a text of more than one word", "a\"b\\c\n\x01", "caf\xC3\xA9",
+             "\xFF and eight more", "Caf\xC3\xA9 \xC3 \"quoted\"" }) {
+        std::string json = "before ";
+        JsonWriter::appendString(json, text);
+        CHECK("\"" + json.substr(7) + "\"" == writtenText(text));
+    }
+}
+
 TEST_CASE("a document of many blocks arrives whole, in blocks of 64 KiB at most or as long as one text")
 {
     const std::string longText(200'000, 'l');

@@ -12,9 +12,14 @@ namespace platform {
 
 namespace {
 
+    std::string pathOf(const PlaceStep& step)
+    {
+        return pathJoined(step.folder, step.name);
+    }
+
     std::string lastStepOf(const WatchedPlace& place)
     {
-        return place.steps.empty() ? std::string() : pathJoined(place.steps.back().folder, place.steps.back().name);
+        return place.steps.empty() ? std::string() : pathOf(place.steps.back());
     }
 
 } // namespace
@@ -66,7 +71,8 @@ void RootPlacing::follow(WatchedRoot& root)
     WatchedPlace place;
     const bool isWatched = watchWay(root, place);
     if (const std::optional<std::string> device = otherThread(place))
-        return handOver(root, *device);
+        return handOver(root, place, *device);
+    root.history.devicesPassed = devicesBefore(place, _context.ownDevice());
     if (!isWatched)
         pollWay(root, place);
     else if (std::exchange(root.isWayPolled, false))
@@ -93,22 +99,31 @@ std::optional<std::string> RootPlacing::otherThread(const WatchedPlace& place) c
     const std::string reached = lastStepOf(place);
     if (place.endsEarly && !_context.mounts.holds(reached))
         return _context.mounts.deviceAt(reached);
-    const auto isOwn = [&](const PlaceStep& step) {
-        return _context.mounts.deviceAt(pathJoined(step.folder, step.name)) == _context.device;
-    };
+    const auto isOwn = [&](const PlaceStep& step) { return _context.mounts.deviceAt(pathOf(step)) == _context.device; };
     if (_context.device == DeviceWatchers::first || std::any_of(place.steps.begin(), place.steps.end(), isOwn))
         return std::nullopt;
     return DeviceWatchers::first;
 }
 
-void RootPlacing::handOver(WatchedRoot& root, const std::string& device)
+// Over which the way leads before it reaches `device`.
+std::set<std::string> RootPlacing::devicesBefore(const WatchedPlace& place, const std::string& device) const
+{
+    std::set<std::string> devices;
+    for (const PlaceStep& step : place.steps) {
+        std::string next = _context.mounts.deviceAt(pathOf(step));
+        if (next == device)
+            break;
+        devices.insert(std::move(next));
+    }
+    return devices;
+}
+
+void RootPlacing::handOver(WatchedRoot& root, const WatchedPlace& place, const std::string& device)
 {
     const std::shared_ptr<const PathWatch> watch = root.watch;
     RootHistory history = std::move(root.history);
-    if (device == DeviceWatchers::first)
-        history.devicesPassed.clear();
-    else
-        history.devicesPassed.insert(_context.ownDevice());
+    // Its way begins anew with the first.
+    history.devicesPassed = device == DeviceWatchers::first ? std::set<std::string>() : devicesBefore(place, device);
     end(watch->number);
     _context.watchers.handOver(watch, device, std::move(history));
 }
@@ -144,7 +159,7 @@ bool RootPlacing::watchSteps(WatchedRoot& root, const WatchedPlace& place)
     for (auto step = place.steps.rbegin(); step != place.steps.rend(); ++step) {
         if (_context.mounts.holds(step->folder))
             continue;
-        const std::string path = pathJoined(step->folder, step->name);
+        const std::string path = pathOf(*step);
         const bool isPlace = path == place.path;
         unsigned marks = 0;
         if (isPlace || watched.count(path) == 0)

@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <memory>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -36,7 +37,8 @@ private:
     void follow(WatchedRoot& root);
     WatchedPlace placeOf(const WatchedRoot& root) const;
     std::optional<std::string> otherThread(const WatchedPlace& place) const;
-    void handOver(WatchedRoot& root, const std::string& device);
+    std::set<std::string> devicesBefore(const WatchedPlace& place, const std::string& device) const;
+    void handOver(WatchedRoot& root, const WatchedPlace& place, const std::string& device);
     bool watchWay(WatchedRoot& root, WatchedPlace& place);
     bool watchSteps(WatchedRoot& root, const WatchedPlace& place);
     void settleSteps(const std::vector<WatchedFolders::Number>& folders);

@@ -156,6 +156,33 @@ TEST_CASE("a link to a disk that does not answer keeps no other disk's changes f
     });
 }
 
+TEST_CASE("a disk that lies behind another one, and lay before it, keeps nothing of that one from being told")
+{
+    checkWithThreeDisks([] {
+        ThreeDisks machine;
+        const auto turn = [&](const char* link, const char* target) {
+            const std::string turned = machine.path(link) + "-new";
+            symlink(machine.path(target).c_str(), turned.c_str());
+            tests::moveItem(turned, machine.path(link));
+        };
+        turn("home/link", "one/link");
+        turn("one/link", "two/library");
+        tests::makeFolder(machine.path("two/other"));
+        turn("two/link", "two/other");
+        Listener two(machine.watching, machine.path("two/library"));
+        Listener listener(machine.watching, machine.path("home/link"));
+        turn("home/link", "two/link");
+        listener.until("anythingChanged .");
+        machine.files.silence(machine.path("one"));
+        turn("two/link", "one/library");
+        machine.files.waitUntilAsked();
+        const bool isRight = machine.areMounted && hearsOfFile(two, machine.path("two/library"), "a");
+        machine.files.answer();
+        listener.until("anythingChanged .");
+        return isRight && hearsOfFile(listener, machine.path("one/library"), "b");
+    });
+}
+
 TEST_CASE("a link that is turned from disk to disk is told each time, and what it leads to is followed")
 {
     checkWithThreeDisks([] {

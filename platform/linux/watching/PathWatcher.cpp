@@ -22,16 +22,6 @@ namespace {
             [queue](std::vector<PollingReport> reports) { queue->report(std::move(reports)); } };
     }
 
-    std::vector<std::string> pointsThatMayGo(const MountTable& table)
-    {
-        std::vector<std::string> points;
-        for (const Mount& mount : table.mounts()) {
-            if (mount.mountPoint != "/")
-                points.push_back(mount.mountPoint);
-        }
-        return points;
-    }
-
 } // namespace
 
 PathWatcher::PathWatcher(DeviceWatchers& watchers, const std::string& device, std::shared_ptr<WatchingQueue> queue)
@@ -61,8 +51,10 @@ void PathWatcher::run()
 {
     while (!_queue->endIfUnused()) {
         const Work work = waitForWork();
-        if (work.hasTasks)
-            takeTasks();
+        WatchingTasks tasks = work.hasTasks ? _queue->take() : WatchingTasks {};
+        // Another thread hands over by what is mounted now, and what is looked at is on what is mounted now.
+        takeMounts();
+        takeTasks(std::move(tasks));
         if (work.hasEvents)
             takeEvents();
         _events.tellDueContents();
@@ -91,12 +83,8 @@ PathWatcher::Work PathWatcher::waitForWork()
     return { count > 0 && sources[0].revents != 0, count > 0 && sources[1].revents != 0 };
 }
 
-void PathWatcher::takeTasks()
+void PathWatcher::takeTasks(WatchingTasks tasks)
 {
-    WatchingTasks tasks = _queue->take();
-    // Another thread hands over by what is mounted now, of which this one may not have been told yet.
-    if (tasks.mountsHaveChanged || !tasks.added.empty())
-        takeMounts();
     for (AddedWatch& added : tasks.added)
         _placing.begin(std::move(added));
     for (const std::uint64_t watch : tasks.removed)
@@ -109,14 +97,24 @@ void PathWatcher::takeTasks()
 
 void PathWatcher::takeMounts()
 {
-    if (!MountTable::hasChanged(_mountTable.number()))
-        return;
-    const PolledMounts now = mountsNow();
-    std::vector<std::string> points = changedMountPoints(_context.mounts.table(), now.table());
-    // The table is as before, and was not meanwhile: what was unmounted and mounted again bears the numbers that it had.
-    if (points.empty())
-        points = pointsThatMayGo(now.table());
-    _placing.takeMounts(now, points);
+    // Whoever mounts without end must not hold up the rest.
+    constexpr int readingsAtMost = 16;
+    PolledMounts now = _context.mounts;
+    std::vector<std::string> points;
+    int readings = 0;
+    // What changes before a reading is in it, and must not look as if it had come and gone after it.
+    for (; readings < readingsAtMost && MountTable::hasChanged(_mountTable.number()); ++readings) {
+        PolledMounts next = mountsNow();
+        const std::vector<std::string> changed = changedMountPoints(now.table(), next.table());
+        points.insert(points.end(), changed.begin(), changed.end());
+        now = std::move(next);
+    }
+    if (!points.empty())
+        _placing.takeMounts(std::move(now), points);
+    // The table is as before, and was not meanwhile: something was mounted for a moment, or was unmounted and mounted
+    // again and bears the numbers that it had. Nothing tells where.
+    else if (readings > 0)
+        _placing.followAllAnew();
 }
 
 void PathWatcher::takeEvents()

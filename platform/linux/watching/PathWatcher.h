@@ -31,7 +31,7 @@ private:
     PolledMounts mountsNow() const;
     void takeMounts();
     Work waitForWork();
-    void takeTasks();
+    void takeTasks(WatchingTasks tasks);
     void takeEvents();
     void resynchronise();
 

@@ -46,7 +46,6 @@ void WatchingQueue::waitForHandlerOf(std::uint64_t number)
 void WatchingQueue::noteMounts()
 {
     Locked guard(_lock);
-    _tasks.mountsHaveChanged = true;
     wake();
 }
 

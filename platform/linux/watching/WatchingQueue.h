@@ -35,7 +35,6 @@ struct WatchingTasks {
     std::vector<std::uint64_t> removed {};
     std::vector<PollingReport> reports {};
     bool reportsWereLost = false; ///< of changes, which were too many
-    bool mountsHaveChanged = false;
 };
 
 /// What others ask of a watcher's thread, and the gate through which that thread calls handlers. Any thread.
@@ -54,6 +53,7 @@ public:
     void remove(std::uint64_t number);
     /// Lets the thread, which asks for it, have no part in the watch any more.
     void forget(std::uint64_t number);
+    /// Has the thread see to its tasks, and to what is mounted.
     void noteMounts();
     void report(std::vector<PollingReport> reports);
     /// Ends the thread whatever is still watched. Waits for a handler that is being called by another thread.

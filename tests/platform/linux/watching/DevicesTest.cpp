@@ -264,6 +264,22 @@ TEST_CASE("a disk that is mounted again as soon as it was unmounted is followed 
     });
 }
 
+TEST_CASE("what is mounted for a moment only is told, at, above and below it")
+{
+    checkWithThreeDisks([] {
+        ThreeDisks machine;
+        const std::string place = machine.path("home/place");
+        tests::makeFolder(place + "/library");
+        Listener above(machine.watching, machine.path("home"));
+        Listener at(machine.watching, place);
+        Listener below(machine.watching, place + "/library");
+        bool isRight = machine.areMounted && tests::mountMemory(place) && isUnmounted(place);
+        for (Listener* const listener : { &above, &at, &below })
+            isRight = isRight && listener->hears("anythingChanged .");
+        return isRight;
+    });
+}
+
 TEST_CASE("the folders of all disks count against the watches that may be used")
 {
     checkWithThreeDisks([] {

@@ -23,12 +23,31 @@ namespace {
     constexpr unsigned reasonsToWatch
         = WatchedFolders::followed | WatchedFolders::onTheWay | WatchedFolders::holdsWatchedFile;
 
-    std::uint32_t maskForMarks(const WatchedFolders& folders, WatchedFolders::Number folder)
+    std::uint32_t maskOf(bool entries, bool contents)
+    {
+        return selfEvents | (entries ? entryEvents : 0) | (contents ? contentEvents : 0);
+    }
+
+    std::uint32_t maskNeeded(const WatchedFolders& folders, WatchedFolders::Number folder)
     {
         constexpr unsigned needingContents = WatchedFolders::followed | WatchedFolders::holdsWatchedFile;
-        const bool needsContents = folders.isMarked(folder, needingContents);
-        const bool needsEntries = folders.isMarked(folder, needingContents | WatchedFolders::namesMatter);
-        return selfEvents | (needsEntries ? entryEvents : 0) | (needsContents ? contentEvents : 0);
+        return maskOf(folders.isMarked(folder, needingContents | WatchedFolders::namesMatter),
+            folders.isMarked(folder, needingContents));
+    }
+
+    std::uint32_t maskAskedFor(const WatchedFolders& folders, WatchedFolders::Number folder)
+    {
+        return maskOf(folders.isMarked(folder, WatchedFolders::entriesReported),
+            folders.isMarked(folder, WatchedFolders::contentsReported));
+    }
+
+    void noteAsked(WatchedFolders& folders, WatchedFolders::Number folder, std::uint32_t mask)
+    {
+        folders.unmark(folder, WatchedFolders::entriesReported | WatchedFolders::contentsReported);
+        if ((mask & entryEvents) != 0)
+            folders.mark(folder, WatchedFolders::entriesReported);
+        if ((mask & contentEvents) != 0)
+            folders.mark(folder, WatchedFolders::contentsReported);
     }
 
 } // namespace
@@ -37,7 +56,8 @@ int watchFolder(WatchingContext& context, WatchedFolders::Number folder, const c
 {
     WatchedFolders& folders = context.folders;
     // Another entry may have the same watch, and need more.
-    const int watch = context.inotify.watchFolder(path, maskForMarks(folders, folder) | IN_MASK_ADD);
+    const std::uint32_t mask = maskNeeded(folders, folder);
+    const int watch = context.inotify.watchFolder(path, mask | IN_MASK_ADD);
     if (watch == -1)
         return errno;
     const bool isNew = folders.firstWithWatch(watch) == WatchedFolders::none;
@@ -45,6 +65,7 @@ int watchFolder(WatchingContext& context, WatchedFolders::Number folder, const c
         context.inotify.stopWatching(watch);
         return ENOSPC;
     }
+    noteAsked(folders, folder, folders.watch(folder) == watch ? mask | maskAskedFor(folders, folder) : mask);
     if (const int unused = folders.setWatch(folder, watch); unused != WatchedFolders::noWatch)
         context.inotify.stopWatching(unused);
     return 0;
@@ -139,12 +160,24 @@ void FolderFollowing::narrowWatch(Number folder)
     if (watch == WatchedFolders::noWatch)
         return;
     std::uint32_t mask = 0;
-    for (Number same = folders.firstWithWatch(watch); same != WatchedFolders::none; same = folders.nextWithWatch(same))
-        mask |= maskForMarks(folders, same);
+    std::uint32_t asked = 0;
+    for (Number same = folders.firstWithWatch(watch); same != WatchedFolders::none;
+         same = folders.nextWithWatch(same)) {
+        mask |= maskNeeded(folders, same);
+        asked |= maskAskedFor(folders, same);
+    }
+    if (mask == asked)
+        return;
     const std::string path = folders.path(folder);
     const int now = _context.inotify.watchFolder(path.c_str(), mask);
     if (now != -1 && now != watch && folders.firstWithWatch(now) == WatchedFolders::none)
         _context.inotify.stopWatching(now);
+    // While it takes another mask in place of the one it had, the kernel reports nothing, so the ways are gone again.
+    for (Number same = folders.firstWithWatch(watch); same != WatchedFolders::none;
+         same = folders.nextWithWatch(same)) {
+        noteAsked(folders, same, mask);
+        _context.roots.noteFolder(same, false);
+    }
 }
 
 void FolderFollowing::takeWatchFrom(Number folder)

@@ -34,6 +34,8 @@ public:
         holdsArrivals = 64, ///< files in it are kept in mind as arriving
         polled = 128, ///< it and what is below it is looked at in intervals
         namesMatter = 256, ///< what stands in it under some names decides where a watched path leads
+        entriesReported = 512, ///< for it the kernel was asked to report what comes to it and leaves it
+        contentsReported = 1024, ///< and what is written to files in it
     };
 
     WatchedFolders();

@@ -203,7 +203,9 @@ void RootPlacing::pollWay(WatchedRoot& root, const WatchedPlace& place)
 void RootPlacing::arrive(WatchedRoot& root, WatchedPlace place)
 {
     const bool isFirst = !std::exchange(root.history.isPlaced, true);
-    const bool isOther = std::exchange(root.mustTell, false) || isFirst || !place.isSamePlace(root.place);
+    // Its entry may have gone elsewhere with one above it, by a report that is older than the look at the place.
+    const bool isAstray = root.folder != WatchedFolders::none && _context.folders.atPath(place.path) != root.folder;
+    const bool isOther = std::exchange(root.mustTell, false) || isFirst || isAstray || !place.isSamePlace(root.place);
     root.place = std::move(place);
     if (!isOther)
         return;

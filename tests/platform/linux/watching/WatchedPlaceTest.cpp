@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <fstream>
 #include <string>
+#include <utility>
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -48,6 +49,26 @@ TEST_CASE("a path whose folders are made while its way is being watched is follo
         tests::makeFolder(awaited);
         REQUIRE(tests::comesToHear(listener, awaited, "file"));
     }
+}
+
+TEST_CASE("a path is followed that was found again before the move of a folder above it was reported")
+{
+    FollowedDisk machine;
+    const std::string watched = machine.disk.folder("library/sub");
+    Listener above(machine.watching, machine.disk.path());
+    Listener listener(machine.watching, watched);
+    bool isMoved = false;
+    // The reports of what the handler does come after the look that it delays.
+    above.onChange([&](const platform::PathChange&) {
+        if (std::exchange(isMoved, true))
+            return;
+        tests::moveItem(machine.path("library"), machine.path("before"));
+        tests::makeFolder(watched);
+    });
+    REQUIRE(chmod(watched.c_str(), 0700) == 0);
+    REQUIRE(above.hears("appeared before/"));
+    changesSoFar(above, machine.disk.path());
+    CHECK(tests::comesToHear(listener, watched, "file"));
 }
 
 TEST_CASE("what happens beside an awaited path is told to nobody")

@@ -169,9 +169,14 @@ void FolderFollowing::narrowWatch(Number folder)
     if (mask == asked)
         return;
     const std::string path = folders.path(folder);
-    const int now = _context.inotify.watchFolder(path.c_str(), mask);
-    if (now != -1 && now != watch && folders.firstWithWatch(now) == WatchedFolders::none)
-        _context.inotify.stopWatching(now);
+    // Another folder may stand there by now, of which as much is to be reported as before.
+    const int now = _context.inotify.watchFolder(path.c_str(), selfEvents | IN_MASK_ADD);
+    if (now != watch) {
+        if (now != -1 && folders.firstWithWatch(now) == WatchedFolders::none)
+            _context.inotify.stopWatching(now);
+        return;
+    }
+    _context.inotify.watchFolder(path.c_str(), mask);
     // While it takes another mask in place of the one it had, the kernel reports nothing, so the ways are gone again.
     for (Number same = folders.firstWithWatch(watch); same != WatchedFolders::none;
          same = folders.nextWithWatch(same)) {

@@ -33,7 +33,8 @@ struct WatcherRoles {
 /// other's changes from being told. A thread comes with the first path and ends with the last. Any thread.
 ///
 /// Where a path leads cannot be told without a look at the disks on its way. So each begins with the thread of "/",
-/// which no program can do without, and is handed over wherever its way goes on to another device.
+/// which no program can do without, and is handed over wherever its way goes on to another device. What is mounted
+/// below a watched folder is followed by the folder's thread all the same.
 class DeviceWatchers : public std::enable_shared_from_this<DeviceWatchers> {
 public:
     /// The name of the thread with which every path begins, beside the numbers of devices.

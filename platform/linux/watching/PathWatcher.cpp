@@ -75,6 +75,8 @@ PathWatcher::Work PathWatcher::waitForWork()
     }
     if (_events.holdsMove())
         timeout = waitForMove;
+    if (_context.roots.haveNotes())
+        timeout = 0;
     std::array<pollfd, 2> sources { { { _queue->descriptor(), POLLIN, 0 },
         { _context.inotify.descriptor(), POLLIN, 0 } } };
     const int count = poll(sources.data(), sources.size(), timeout);

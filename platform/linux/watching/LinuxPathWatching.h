@@ -38,7 +38,7 @@ public:
     WatchingState state() const override;
     FollowingMeans meansOfFollowing(std::string_view path) const override;
     std::optional<WatchingLimits> limits(std::uint64_t furtherWatches) const override;
-    /// Mounts of this machine are noticed as well as those that the other volumes tell of.
+    /// What is mounted is told by this machine's own table, whatever `volumes` add to it.
     std::unique_ptr<PathWatching> withPathsOf(const FileSystem& files, const Volumes& volumes) const override;
 
 private:

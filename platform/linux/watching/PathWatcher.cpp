@@ -101,21 +101,23 @@ void PathWatcher::takeMounts()
 {
     // Whoever mounts without end must not hold up the rest.
     constexpr int readingsAtMost = 16;
+    if (!MountTable::hasChanged(_mountTable.number()))
+        return;
     PolledMounts now = _context.mounts;
     std::vector<std::string> points;
     int readings = 0;
     // What changes before a reading is in it, and must not look as if it had come and gone after it.
-    for (; readings < readingsAtMost && MountTable::hasChanged(_mountTable.number()); ++readings) {
+    do {
         PolledMounts next = mountsNow();
         const std::vector<std::string> changed = changedMountPoints(now.table(), next.table());
         points.insert(points.end(), changed.begin(), changed.end());
         now = std::move(next);
-    }
+    } while (++readings < readingsAtMost && MountTable::hasChanged(_mountTable.number()));
     if (!points.empty())
         _placing.takeMounts(std::move(now), points);
     // The table is as before, and was not meanwhile: something was mounted for a moment, or was unmounted and mounted
     // again and bears the numbers that it had. Nothing tells where.
-    else if (readings > 0)
+    else
         _placing.followAllAnew();
 }
 

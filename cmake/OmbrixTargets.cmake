@@ -30,8 +30,8 @@ endif()
 function(ombrix_library name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "LINK;PRIVATE_LINK")
   add_library(${name} STATIC ${arg_UNPARSED_ARGUMENTS})
-  target_link_libraries(${name} PUBLIC ${arg_LINK} PRIVATE ombrix_options ${arg_PRIVATE_LINK})
-  target_include_directories(${name} PUBLIC ${CMAKE_SOURCE_DIR})
+  target_link_libraries(${name} PUBLIC ${arg_LINK} PRIVATE $<BUILD_INTERFACE:ombrix_options> ${arg_PRIVATE_LINK})
+  target_include_directories(${name} PUBLIC $<BUILD_INTERFACE:${CMAKE_SOURCE_DIR}>)
 endfunction()
 
 # ombrix_program(NAME SOURCES... [LINK LIBRARIES...]): a program in bin/.

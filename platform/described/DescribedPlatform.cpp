@@ -12,6 +12,7 @@
 #include "platform/common/UserFolders.h"
 #include "platform/common/WholeFile.h"
 #include "platform/described/DescribedVolumes.h"
+#include "platform/described/MachineDescription.h"
 
 #include <filesystem>
 #include <system_error>

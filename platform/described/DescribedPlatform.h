@@ -1,12 +1,13 @@
 #pragma once
 
 #include "platform/Platform.h"
-#include "platform/described/MachineDescription.h"
 
 #include <memory>
 #include <string>
 
 namespace platform {
+
+struct MachineDescription;
 
 /// The machine that a description tells of, laid over another: files, links, volumes, the editor and the preferences
 /// are those of the description, everything else is the other machine's.

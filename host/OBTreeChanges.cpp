@@ -3,10 +3,10 @@
 
 #include "host/OBTreeChanges.h"
 
+#include "host/OBGroupWalk.h"
 #include "host/OBMediaObjectList.h"
 
 #include <cstdint>
-#include <limits>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -17,7 +17,7 @@ using platform::Text;
 
 namespace {
 
-constexpr std::size_t nowhere = std::numeric_limits<std::size_t>::max();
+constexpr std::size_t nowhere = OBGroupPlace::nowhere;
 
 /// A group's fields at one moment.
 struct SeenGroup {
@@ -29,35 +29,18 @@ struct SeenGroup {
     std::optional<platform::Date> modificationDate {};
     platform::Value::Dictionary attributes {};
     OBMediaObjectList objects {};
-    std::size_t parent = nowhere; ///< index; none for the root
+    std::size_t parent = nowhere; ///< index; `nowhere` for the root
     std::size_t depth = 0;
 };
 
-SeenGroup seen(const OBMediaGroupRef& group, std::size_t parent, std::size_t depth)
-{
-    return { group, group->typeIdentifier(), group->name(), group->ID(), group->path(), group->modificationDate(),
-        group->attributes(), group->ownMediaObjects(), parent, depth };
-}
-
 std::vector<SeenGroup> laidFlat(const OBMediaGroupRef& root)
 {
-    struct Level {
-        OBMediaGroupList groups;
-        std::size_t next = 0;
-        std::size_t parent = 0;
-    };
-    std::vector<SeenGroup> groups { seen(root, nowhere, 0) };
-    std::vector<Level> levels { { root->childGroups() } };
-    while (!levels.empty()) {
-        Level& innermost = levels.back();
-        if (innermost.next == innermost.groups.size()) {
-            levels.pop_back();
-            continue;
-        }
-        const OBMediaGroupRef group = innermost.groups[innermost.next++];
-        groups.push_back(seen(group, innermost.parent, levels.size()));
-        levels.push_back({ group->childGroups(), 0, groups.size() - 1 });
-    }
+    std::vector<SeenGroup> groups;
+    OBWalkGroups(root, [&groups](const OBMediaGroupRef& group, const OBGroupPlace& place) {
+        groups.push_back({ group, group->typeIdentifier(), group->name(), group->ID(), group->path(),
+            group->modificationDate(), group->attributes(), group->ownMediaObjects(), place.parent, place.depth });
+        return true;
+    });
     return groups;
 }
 

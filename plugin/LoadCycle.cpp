@@ -51,7 +51,7 @@ OBMediaGroupRef OBMontaroPlugin::performLoadData()
     if (!_MontaroEventsSearchPaths.load())
         _prepareMontaroEventsSearchPaths();
 
-    const OBMediaGroupRef root = OBMediaGroup::initWithTypeIdentifier(OBMontaroRootGroupTypeIdentifier);
+    OBMediaGroupRef root = OBMediaGroup::initWithTypeIdentifier(OBMontaroRootGroupTypeIdentifier);
     root->setName(OBMontaro);
     root->setParentID({});
     root->setID(OBMontaro);

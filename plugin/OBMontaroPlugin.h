@@ -28,6 +28,11 @@ using MontaroSearchPaths = std::shared_ptr<const std::vector<platform::Text>>;
 /// The groups that one scan found, in the order found. A scan extends the list that it made, and only that.
 using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList>>;
 
+inline void addGroup(const MontaroFlatGroupList& list, const OBMediaGroupRef& group)
+{
+    list->update([&group](const OBMediaGroupList& groups) { return groups.appending(group); });
+}
+
 /// The source of the video editor Montaro: its project and event libraries as a live tree of groups and movies.
 ///
 /// Threads: the framework's load thread runs `performLoadData` and the scans below it; reloads run on whatever thread

@@ -4,6 +4,7 @@
 #include "apps/common/NameSearch.h"
 
 #include "apps/common/NameBlock.h"
+#include "host/OBGroupWalk.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -17,23 +18,11 @@ namespace {
 
     std::vector<FlatGroup> laidFlat(const OBMediaGroupRef& root)
     {
-        struct Level {
-            OBMediaGroupList groups;
-            std::size_t next = 0;
-            std::size_t parent = 0;
-        };
-        std::vector<FlatGroup> groups { { root } };
-        std::vector<Level> levels { { root->childGroups() } };
-        while (!levels.empty()) {
-            Level& innermost = levels.back();
-            if (innermost.next == innermost.groups.size()) {
-                levels.pop_back();
-                continue;
-            }
-            const OBMediaGroupRef group = innermost.groups[innermost.next++];
-            groups.push_back({ group, innermost.parent, levels.size() });
-            levels.push_back({ group->childGroups(), 0, groups.size() - 1 });
-        }
+        std::vector<FlatGroup> groups;
+        OBWalkGroups(root, [&groups](const OBMediaGroupRef& group, const OBGroupPlace& place) {
+            groups.push_back({ group, place.depth == 0 ? 0 : place.parent, place.depth });
+            return true;
+        });
         return groups;
     }
 

@@ -2,15 +2,10 @@
 
 #include "host/OBMediaGroup.h"
 
-#include <functional>
 #include <string>
 #include <string_view>
 
 namespace ombrix {
-
-/// Calls `visitor` for `root` and everything below it, depth first, until it answers false. Takes no stack however deep
-/// the tree is.
-void visitDepthFirst(const OBMediaGroupRef& root, const std::function<bool(const OBMediaGroupRef&)>& visitor);
 
 /// The first group with that ID or name, depth first; null when there is none.
 OBMediaGroupRef groupWithID(const OBMediaGroupRef& root, std::string_view identifier);

@@ -1,6 +1,6 @@
 #include "apps/ombrix/ObjectSearch.h"
 
-#include "apps/ombrix/GroupSearch.h"
+#include "host/OBGroupWalk.h"
 
 #include <cstddef>
 
@@ -23,7 +23,7 @@ OBMediaObjectRef ownObjectWithPath(const OBMediaGroup& group, std::string_view p
 FoundObject objectWithPath(const OBMediaGroupRef& root, std::string_view path)
 {
     FoundObject found;
-    visitDepthFirst(root, [&](const OBMediaGroupRef& group) {
+    OBWalkGroups(root, [&](const OBMediaGroupRef& group, const OBGroupPlace&) {
         found = { ownObjectWithPath(*group, path), group };
         return !found.object;
     });

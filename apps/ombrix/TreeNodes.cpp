@@ -1,6 +1,7 @@
 #include "apps/ombrix/TreeNodes.h"
 
 #include "host/OBConstants.h"
+#include "host/OBGroupWalk.h"
 #include "platform/PathText.h"
 
 #include <algorithm>
@@ -11,40 +12,30 @@
 namespace ombrix {
 namespace {
 
-    struct Level {
-        OBMediaGroupList groups;
-        std::size_t next = 0;
-        std::size_t node = 0;
-    };
-
-    TreeNode makeNode(const OBMediaGroupRef& group, std::size_t index, std::size_t parent, std::size_t depth)
+    TreeNode makeNode(const OBMediaGroupRef& group, const OBGroupPlace& place)
     {
         TreeNode node { group };
         node.kind = kindOf(*group);
-        node.depth = depth;
-        node.parent = parent;
-        node.end = index + 1;
+        node.depth = place.depth;
+        node.parent = place.depth == 0 ? 0 : place.parent;
         node.children = group->childGroups().size();
         return node;
     }
 
     std::vector<TreeNode> flattened(const OBMediaGroupRef& root)
     {
-        std::vector<TreeNode> nodes { makeNode(root, 0, 0, 0) };
-        std::vector<Level> levels { { root->childGroups(), 0, 0 } };
-        while (!levels.empty()) {
-            Level& innermost = levels.back();
-            if (innermost.next == innermost.groups.size()) {
-                nodes[innermost.node].end = nodes.size();
-                levels.pop_back();
-                continue;
-            }
-            const OBMediaGroupRef group = innermost.groups[innermost.next++];
-            const bool isLast = innermost.next == innermost.groups.size();
-            const std::size_t index = nodes.size();
-            nodes.push_back(makeNode(group, index, innermost.node, levels.size()));
-            nodes.back().isLast = isLast;
-            levels.push_back({ group->childGroups(), 0, index });
+        std::vector<TreeNode> nodes;
+        OBWalkGroups(root, [&nodes](const OBMediaGroupRef& group, const OBGroupPlace& place) {
+            nodes.push_back(makeNode(group, place));
+            return true;
+        });
+        // From the last node on, so that it is known where what lies below ends.
+        for (std::size_t index = nodes.size(); index-- > 0;) {
+            TreeNode& node = nodes[index];
+            node.end = index + 1;
+            while (node.end < nodes.size() && nodes[node.end].depth > node.depth)
+                node.end = nodes[node.end].end;
+            node.isLast = node.end == nodes.size() || nodes[node.end].depth < node.depth;
         }
         return nodes;
     }

@@ -13,6 +13,7 @@
 #include "apps/ombrix/Seconds.h"
 #include "apps/ombrix/SuggestedCommand.h"
 #include "apps/ombrix/Verification.h"
+#include "host/OBGroupWalk.h"
 #include "host/OBSourceInspection.h"
 #include "platform/MainRunLoop.h"
 #include "platform/Threads.h"
@@ -46,18 +47,14 @@ namespace {
     private:
         void collect(const OBMediaGroupRef& root)
         {
-            std::vector<OBMediaGroupRef> left { root };
-            while (!left.empty()) {
-                const OBMediaGroupRef group = std::move(left.back());
-                left.pop_back();
-                for (const OBMediaGroupRef& child : group->childGroups())
-                    left.push_back(child);
+            OBWalkGroups(root, [this](const OBMediaGroupRef& group, const OBGroupPlace&) {
                 group->ownMediaObjects().visit([this](const OBMediaObject& object) {
                     if (const auto facts = object.fileFacts())
                         _facts.emplace(object.path().string(), facts);
                     return true;
                 });
-            }
+                return true;
+            });
         }
 
         OBMediaGroupRef _root;

@@ -174,7 +174,7 @@ OBMediaGroupRef OBMontaroPlugin::eventGroup(
         = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
     event->setPath(found.path);
     event->setModificationDate(read.modificationDate);
-    scan.addToFlatGroups(event);
+    addGroup(scan.flatGroups, event);
 
     event->setMediaObjects(clips.clips);
     noteItemsFound(clips.clips.size());

@@ -55,11 +55,6 @@ struct EventScan {
     OBImageRef eventIcon;
     OBImageRef calendarIcon;
     std::unique_ptr<ClipScratches> scratches = std::make_unique<ClipScratches>();
-
-    void addToFlatGroups(OBMediaGroupRef group)
-    {
-        flatGroups->update([&](OBMediaGroupList groups) { return groups.appending(std::move(group)); });
-    }
 };
 
 /// A folder of a library.

@@ -52,7 +52,7 @@ bool isProject(const OBMontaroPlugin& plugin, const ScanReport& report, const Fo
 /// A library that holds `groups`.
 OBMediaGroupRef libraryOf(const OBMediaGroupList& groups)
 {
-    const OBMediaGroupRef library = OBMediaGroup::initWithTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
+    OBMediaGroupRef library = OBMediaGroup::initWithTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
     library->setChildGroups(groups);
     return library;
 }
@@ -155,7 +155,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
                                                                          : OBMontaroFolderGroupTypeIdentifier,
                 platform::lastPathComponent(listed), listed, listed, listed, scan.projectIcon,
                 listed == path ? folder->modificationDate() : OBMediaGroup::modDateForFile(listed) });
-        scan.addToFlatGroups(placeholder);
+        addGroup(scan.flatGroups, placeholder);
     }
     _createMontaroProjectsFolderMediaObjects(folder);
     return folder;
@@ -169,7 +169,7 @@ OBMediaGroupRef OBMontaroPlugin::projectGroup(
     OBMediaGroupRef project = OBMediaGroup::withFields(
         { OBMontaroProjectGroupTypeIdentifier, platform::nameWithoutExtension(item.name), path, listedFolder, path,
             scan.projectIcon, item.modificationDate ? item.modificationDate : OBMediaGroup::modDateForFile(path) });
-    scan.addToFlatGroups(project);
+    addGroup(scan.flatGroups, project);
 
     if (item.subfolder)
         noteFoldersDone(1);

@@ -21,11 +21,6 @@ struct ProjectScan {
     std::shared_ptr<const OBMediaObjectKind> movieKind;
     OBImageRef projectIcon;
     OBImageRef emptyProjectIcon;
-
-    void addToFlatGroups(OBMediaGroupRef group)
-    {
-        flatGroups->update([&](OBMediaGroupList groups) { return groups.appending(std::move(group)); });
-    }
 };
 
 /// The folder in a project in which its shared movies lie.

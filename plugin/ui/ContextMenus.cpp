@@ -26,7 +26,7 @@ constexpr std::array<std::string_view, 1> editorIdentifiers { MontaroBundleIdent
 
 OBMenuRef emptyMenu(std::string_view title)
 {
-    const auto menu = std::make_shared<OBMenu>();
+    auto menu = std::make_shared<OBMenu>();
     menu->title = Text(title);
     menu->autoenablesItems = false;
     return menu;
@@ -39,7 +39,7 @@ OBMenuRef OBMontaroPlugin::contextMenuForMediaObject_inMediaGroup(
 {
     if (!object)
         return nullptr;
-    const OBMenuRef menu = emptyMenu("Object Context Menu");
+    OBMenuRef menu = emptyMenu("Object Context Menu");
     addItem(*menu, "OpenInMontaro", openAction, object);
     addItem(*menu, "RevealInNavion", revealAction, object);
     return menu;
@@ -49,7 +49,7 @@ OBMenuRef OBMontaroPlugin::contextMenuForMediaGroup(const OBMediaGroupRef& group
 {
     if (!group)
         return nullptr;
-    const OBMenuRef menu = emptyMenu("Group Context Menu");
+    OBMenuRef menu = emptyMenu("Group Context Menu");
     addItem(*menu, group == rootMediaGroup() ? "OpenMontaro" : "OpenInMontaro", openAction, group);
     return menu;
 }

@@ -1,5 +1,6 @@
 #include "platform/linux/watching/InotifyLimits.h"
 
+#include "platform/PathText.h"
 #include "platform/linux/WholeSystemFile.h"
 
 #include <algorithm>
@@ -61,15 +62,17 @@ InotifyUse inotifyUse(const std::string& procFolder, unsigned user)
 {
     InotifyUse use;
     for (const std::string& process : numbersIn(procFolder)) {
-        const std::string folder = procFolder + "/" + process;
+        const std::string folder = pathJoined(procFolder, process);
         struct stat facts { };
         if (::stat(folder.c_str(), &facts) != 0 || facts.st_uid != user)
             continue;
-        for (const std::string& descriptor : numbersIn(folder + "/fd")) {
-            if (!isInotify(folder + "/fd/" + descriptor))
+        const std::string descriptors = pathJoined(folder, "fd");
+        const std::string information = pathJoined(folder, "fdinfo");
+        for (const std::string& descriptor : numbersIn(descriptors)) {
+            if (!isInotify(pathJoined(descriptors, descriptor)))
                 continue;
             ++use.instances;
-            use.watches += watchesIn(folder + "/fdinfo/" + descriptor);
+            use.watches += watchesIn(pathJoined(information, descriptor));
         }
     }
     return use;

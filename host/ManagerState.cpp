@@ -73,22 +73,20 @@ void ManagerState::requestLoad(Job job)
 
 void ManagerState::setNeedsReload(bool needed)
 {
-    bool start = false;
-    {
-        std::lock_guard guard(_lock);
-        _needsReload = needed;
-        start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
-    }
-    if (start)
-        startLoadThread();
+    setWish(_needsReload, needed);
 }
 
 void ManagerState::setAutoReload(bool enabled)
 {
+    setWish(_autoReload, enabled);
+}
+
+void ManagerState::setWish(bool& wish, bool value)
+{
     bool start = false;
     {
         std::lock_guard guard(_lock);
-        _autoReload = enabled;
+        wish = value;
         start = wantsLoadByItself() && queueLoad(Job::wholeLoad);
     }
     if (start)

@@ -102,6 +102,7 @@ private:
     };
     using Observers = std::vector<std::shared_ptr<ManagerObserver>>;
 
+    void setWish(bool& wish, bool value); // a field that `wantsLoadByItself` asks
     bool wantsLoadByItself() const; // under _lock
     bool queueLoad(Job job); // under _lock; whether a thread is to be started
     void startLoadThread();

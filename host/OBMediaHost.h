@@ -19,8 +19,8 @@ class PluginLibrary;
 
 /// How an application wants its host.
 struct OBHostOptions {
-    /// Folders that are searched for bundles, in order, before the installed ones. Of two bundles with one identifier
-    /// the first found is used.
+    /// Folders that are searched for bundles, in order, before the installed ones. Of bundles with one identifier the
+    /// first that works is used.
     std::vector<std::string> pluginFolders {};
     OBLogSink logSink {};
 };
@@ -41,7 +41,11 @@ struct OBManagerResult {
     std::string problem; ///< one line that names the plug-in
 };
 
-/// An application's host: finds plug-ins and makes their managers. One at a time in a process.
+/// An application's host: finds plug-ins and makes their managers. One at a time in a process. Any thread, also several
+/// at once; whoever asks about plug-ins waits while another call loads a plug-in's code.
+///
+/// The main thread is the one that runs the platform's main run loop, `mainRunLoop.run()`, which may be a thread of its
+/// own. Until somebody runs it nothing is delivered there, and loads that need that thread for a moment wait for it.
 ///
 /// The manager that it hands out ends when the application has dropped the last reference to it. The host may be
 /// destroyed while threads of its managers still run; the platform has to outlive them.
@@ -57,14 +61,17 @@ public:
     /// Loads every bundle and makes a manager of each to see that it can be made. Slow; for `plugins` and its like.
     std::vector<OBPluginInfo> tryAllPlugins();
 
-    /// The class of a plug-in, loaded if need be; null with the problem in `plugins` when it is refused.
+    /// The class of a plug-in, loaded if need be, which blocks; null with the problem in `plugins` when it is refused.
+    /// Lives as long as the process.
     const OBMediaManagerClass* managerClass(std::string_view identifier);
-    /// A new manager of the plug-in called `identifier`.
+    /// A new manager of the plug-in called `identifier`. Blocks: it loads the plug-in's code if need be, and makes the
+    /// manager and calls its `init` on the calling thread.
     OBManagerResult createManager(std::string_view identifier);
 
     /// Follows what managers have registered, and volumes that are mounted, until the answer is dropped. The options
     /// of whoever follows first count while anybody does. Whoever follows before the first load misses nothing; volumes
-    /// that are mounted between a load and this are not told of. Not to be called by who is told of a volume.
+    /// that are mounted between a load and this are not told of. Not to be called, nor its answer dropped, by
+    /// who is told of a volume.
     [[nodiscard]] OBObservation followChanges(const OBFollowOptions& options = {});
     /// Follows the files at and below the folders of `scope` that match `query`, whether or not changes are followed
     /// otherwise.
@@ -75,7 +82,8 @@ public:
     OBPathWatcher& pathWatcher();
     /// How many threads the framework has started for managers that still run.
     std::size_t threadCount() const;
-    /// Waits until none runs; false when `limit` has passed before. Not needed to end a process.
+    /// Waits until none runs; false when `limit` has passed before. Not needed to end a process, and not to be called
+    /// on one of them.
     bool waitForThreads(std::chrono::nanoseconds limit);
 
 private:

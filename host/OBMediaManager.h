@@ -82,31 +82,40 @@ public:
     // What a plug-in overrides. `init` is called once, by the framework, before anything else; false hands out nothing.
     // An override calls the base first in `init`, last in `dealloc`.
 
+    // `init` is called on the thread that asks for the manager, which waits; `dealloc` on the one that returns last.
+
     virtual bool init();
     virtual void dealloc();
+
+    // Loading: on the load thread, one load at a time; `canLoadData` on any other thread as well, also meanwhile.
 
     /// Starts a load and answers at once. The framework calls it on the load thread, where the base operation runs the
     /// load itself.
     virtual void loadData();
-    /// Builds a new tree, on the load thread; the framework installs it. Null leaves what is installed.
+    /// Builds a new tree; the framework installs it. Null leaves what is installed.
     virtual OBMediaGroupRef performLoadData();
-    /// The framework has installed what `performLoadData` answered. On the load thread, before the load ends: what
-    /// reloads put into the tree before this one can be put into this one now.
+    /// The framework has installed what `performLoadData` answered, and the load has not ended: what reloads put into
+    /// the tree before this one can be put into this one now.
     virtual void rootMediaGroupInstalled(const OBMediaGroupRef& root);
     /// Whether a load can produce anything now.
     virtual bool canLoadData();
+
+    // Lists, identity, application, messages and menus: on any thread, several at once, also while a scan runs.
 
     /// All groups that hold media, as a flat list.
     virtual OBMediaGroupList mediaGroups();
     virtual OBMediaGroupList movieGroups();
 
+    /// What people call the source; absent unless overridden.
     virtual platform::Text displayName();
     /// The source's picture in a list of sources, as a rule that of the root; null for none.
     virtual OBImageRef displayImage();
     /// What tells this source from others in what an application keeps; the plug-in's identifier unless overridden.
     virtual platform::Text uniqueID();
+    /// The name and the picture that the source gives its root group; absent and null unless overridden.
     virtual platform::Text rootMediaGroupTitle();
     virtual OBImageRef rootMediaGroupIcon();
+    /// What media the source offers: `OBMediaTypesMovies`, the one code there is, or 0, none, unless overridden.
     virtual int mediaTypesSupported();
 
     /// Of the application that the source's media come from, for people; absent where it has none or none is known.
@@ -124,12 +133,15 @@ public:
         const OBMediaObjectRef& object, const OBMediaGroupRef& group);
     virtual OBMenuRef contextMenuForMediaGroup(const OBMediaGroupRef& group);
 
+    // The pasteboard: on the thread on which the application calls.
+
     /// Writes what a person copies or drags; true when anything was written. The base operation begins the pasteboard
     /// anew and writes the files, of groups those of their media objects, for any desktop program.
     virtual bool writeMediaObjects_toPasteboard(const OBMediaObjectList& objects, platform::Pasteboard& pasteboard);
     virtual bool writeMediaGroups_toPasteboard(const OBMediaGroupList& groups, platform::Pasteboard& pasteboard);
 
-    /// What the source tells beside its tree; null when it offers nothing.
+    /// What the source tells beside its tree, valid as long as the manager; null when it offers nothing. It and what it
+    /// answers: on any thread; may block.
     virtual OBSourceInspection* inspection();
 
     // Services that a plug-in calls on itself. Any thread.
@@ -146,6 +158,8 @@ public:
     /// Whether whoever asks next gets a load in place of the installed tree; a load that begins clears it. Where
     /// automatic reloads are enabled and somebody observes, true starts that load.
     void setNeedsReload(bool needsReload);
+    /// Whether a load that is needed starts by itself while somebody observes; not so at first. True starts one that is
+    /// needed already.
     void setAutoReloadEnabled(bool enabled);
     /// 0.5 and above is normal priority; below, the load thread becomes nicer, up to the nicest at 0.0.
     void setLoadThreadPriority(double priority);
@@ -203,7 +217,9 @@ public:
 
     // What an application calls. Any thread.
 
-    /// Delivers the tree through `executor`, after a load if one is needed. Answers at once.
+    /// Delivers the tree through `executor`, after a load if one is needed. Answers at once. A source may need the main
+    /// thread for its load: then, and where `executor` leads there, nothing is delivered until somebody runs the
+    /// platform's main run loop, `mainRunLoop.run()`, which may be a thread of its own.
     void requestRootMediaGroup(const OBExecutor& executor, std::function<void(OBLoadResult)> completion);
     /// Asks the loads and reloads at work to stop; void when none is at work.
     void cancelLoad();
@@ -216,6 +232,8 @@ public:
     OBLoadProgress loadProgress() const;
     /// The folders that the last load could not read.
     std::vector<OBLoadProblem> loadProblems() const;
+    /// Who is told what scans decide that start from now on; null for nobody, as at first. The manager keeps it, and a
+    /// scan the one it began with. Told on the threads that scan, perhaps several at once.
     void setScanObserver(std::shared_ptr<OBScanObserver> observer);
 
     /// For the framework: `init` has succeeded and the application has the manager; it has dropped it.

@@ -6,7 +6,11 @@
 
 namespace platform {
 
-/// This machine: one of each role.
+/// This machine: one of each role. Any thread; each role says for itself which threads may call it.
+///
+/// When it is destroyed, the main run loop and every thread that was started through `threads` have ended
+/// (`OBMediaHost::waitForThreads`), and so has whatever uses the roles: hosts, managers, observations, watches. Who
+/// cannot wait for that, since a disk may never answer, does not destroy it and ends the process by `std::quick_exit`.
 class LinuxPlatform {
 public:
     LinuxPlatform();

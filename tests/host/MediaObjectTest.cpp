@@ -19,10 +19,7 @@ namespace {
 
 std::shared_ptr<const OBMediaObjectKind> projectMovies()
 {
-    auto kind = std::make_shared<OBMediaObjectKind>();
-    kind->mediaType = OBMediaTypeMovie;
-    kind->mediaSourceType = OBMediaSourceTypePlugin;
-    kind->sourcePluginIdentifier = "org.test.Source";
+    auto kind = movieKind();
     kind->icon = OBImage::pictureNamed("projectIcon", Size { 16, 16 }, "/icon.svg");
     kind->ownPathKeys = { "Own Path" };
     return kind;

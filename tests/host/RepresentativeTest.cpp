@@ -19,10 +19,7 @@ namespace {
 
 std::shared_ptr<const OBMediaObjectKind> representatives()
 {
-    auto kind = std::make_shared<OBMediaObjectKind>();
-    kind->mediaType = OBMediaTypeMovie;
-    kind->mediaSourceType = OBMediaSourceTypePlugin;
-    kind->sourcePluginIdentifier = "org.test.Source";
+    auto kind = movieKind();
     kind->groupPathKey = "Group Path";
     kind->attributes = { { "Version", "6" }, { "Represents", true } };
     return kind;

@@ -1,5 +1,8 @@
 #include "tests/host/TestHost.h"
 
+#include "host/OBConstants.h"
+#include "host/OBMediaObject.h"
+
 #include <doctest/doctest.h>
 
 #include <utility>
@@ -55,6 +58,15 @@ void TestHost::endHost()
     if (_host)
         CHECK(_host->waitForThreads(longestWait));
     _host = nullptr;
+}
+
+std::shared_ptr<OBMediaObjectKind> movieKind()
+{
+    auto kind = std::make_shared<OBMediaObjectKind>();
+    kind->mediaType = OBMediaTypeMovie;
+    kind->mediaSourceType = OBMediaSourceTypePlugin;
+    kind->sourcePluginIdentifier = TestHost::identifier;
+    return kind;
 }
 
 } // namespace tests

@@ -10,6 +10,8 @@
 #include <optional>
 #include <string>
 
+struct OBMediaObjectKind;
+
 namespace tests {
 
 /// A host on a made-up machine, with one plug-in that makes scripted managers.
@@ -45,5 +47,8 @@ public:
 private:
     std::unique_ptr<OBMediaHost> _host;
 };
+
+/// What the movies of the plug-in share.
+std::shared_ptr<OBMediaObjectKind> movieKind();
 
 } // namespace tests

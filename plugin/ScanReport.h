@@ -1,11 +1,14 @@
 #pragma once
 
+#include "plugin/OBMontaroPlugin.h"
+#include "plugin/ScanFindings.h"
 #include "plugin/ScanReason.h"
 #include "plugin/ScanRules.h"
 
 #include "host/OBMediaManager.h"
 #include "platform/FileSystem.h"
 
+#include <cstddef>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -54,10 +57,20 @@ public:
         found(finding);
     }
 
-    void libraryBegan(std::string_view path) const
+    /// Calls `scan` with each of `paths`, the libraries that are searched for `what`, until a cancel is pending.
+    /// `isInHome` answers whether a path is the home folder's, and is called only where somebody listens.
+    template <class IsInHome, class Scan>
+    void walkLibraries(
+        const MontaroSearchPaths& paths, std::string_view what, const IsInHome& isInHome, const Scan& scan) const
     {
-        if (_observer)
-            _observer->libraryBegan(std::string(path));
+        const std::size_t count = paths ? paths->size() : 0;
+        for (std::size_t index = 0; index < count && !_manager.isCancelLoadRequestPending(); ++index) {
+            const platform::Text& path = (*paths)[index];
+            if (_observer)
+                _observer->libraryBegan(path.string());
+            found([&] { return findings::searchedLibrary(path, what, index, count, isInHome(path)); });
+            scan(path);
+        }
     }
     /// `entry` answers the path of the link, or below one, that leads to `target`; called only where somebody listens.
     template <class Entry> void linkFollowed(const Entry& entry, std::string_view target) const

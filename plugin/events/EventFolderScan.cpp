@@ -98,16 +98,8 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
 void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& scan)
 {
     Locked guard(*_MontaroEventsSearchPathsLock);
-    const MontaroSearchPaths paths = _MontaroEventsSearchPaths.load();
-    const std::size_t count = paths ? paths->size() : 0;
-    for (std::size_t index = 0; index < count; ++index) {
-        if (isCancelLoadRequestPending())
-            return;
-        const Text& path = (*paths)[index];
-        scan.report.libraryBegan(path);
-        scan.report.found([&] {
-            return findings::searchedLibrary(path, "events", index, count, path == _MontaroDefaultEventsFolderPath());
-        });
+    const auto isInHome = [this](const Text& path) { return path == _MontaroDefaultEventsFolderPath(); };
+    scan.report.walkLibraries(_MontaroEventsSearchPaths.load(), "events", isInHome, [&](const Text& path) {
         if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
             carrier->setParentID(OBMontaro);
             carrier->setID(path);
@@ -117,7 +109,7 @@ void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& sca
         const auto watcher = OBPathWatcher::sharedPathWatcher();
         if (watcher && watcher->watchPathIsUnique_observer(platform::pathByRemovingLastComponent(path), this))
             _watchPath(path);
-    }
+    });
 }
 
 bool OBMontaroPlugin::_isMTEvent(std::string_view path)

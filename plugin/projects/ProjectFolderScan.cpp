@@ -71,16 +71,8 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
     std::vector<OBMediaGroupRef> libraries;
     {
         Locked guard(*_MontaroSearchPathsLock);
-        const MontaroSearchPaths paths = _MontaroSearchPaths.load();
-        const std::size_t count = paths ? paths->size() : 0;
-        for (std::size_t index = 0; index < count; ++index) {
-            if (isCancelLoadRequestPending())
-                break;
-            const Text& path = (*paths)[index];
-            scan.report.libraryBegan(path);
-            scan.report.found([&] {
-                return findings::searchedLibrary(path, "projects", index, count, path == _MontaroDefaultPath());
-            });
+        const auto isInHome = [this](const Text& path) { return path == _MontaroDefaultPath(); };
+        scan.report.walkLibraries(_MontaroSearchPaths.load(), "projects", isInHome, [&](const Text& path) {
             if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
                 library->setName(localizedString("MontaroProjectLibrary"));
                 library->setTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
@@ -90,7 +82,7 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
                 libraries.push_back(library);
             }
             _watchPath(path);
-        }
+        });
     }
 
     const bool isWhole = !libraries.empty() && !isCancelLoadRequestPending();

@@ -6,7 +6,7 @@
 
 namespace platform {
 
-/// What `problem` means to a person, to stand after "cannot be read: ".
+/// What `problem` means to a person, to stand behind the path that it is about and a colon, or "cannot be read: ".
 constexpr std::string_view textOfFileProblem(FileProblem problem) noexcept
 {
     switch (problem) {

@@ -2,8 +2,8 @@
 
 #include "apps/common/HumanText.h"
 #include "apps/ombrix/Checkup.h"
-#include "apps/ombrix/ProblemText.h"
 #include "apps/ombrix/ShellWord.h"
+#include "platform/FileProblemText.h"
 #include "platform/PathText.h"
 
 #include <algorithm>
@@ -52,6 +52,11 @@ namespace {
         return volume && volume->path != "/" ? "sudo umount --lazy " + shellWord(volume->path) : std::string();
     }
 
+    std::string withProblem(const FolderState& folder)
+    {
+        return folder.path + ": " + std::string(platform::textOfFileProblem(folder.problem));
+    }
+
     void checkFolder(const CheckupFacts& facts, const FolderState& folder, std::vector<Finding>& findings)
     {
         if (folder.isSilent) {
@@ -60,14 +65,13 @@ namespace {
                 findings.push_back({ Severity::fail, libraries, silenceOf(folder.path), commandToTakeOff(volume) });
         } else if (folder.problem == FileProblem::notPermitted) {
             const std::string where = folder.blockedAt == folder.path ? std::string() : " (" + folder.blockedAt + ")";
-            findings.push_back({ Severity::fail, libraries, folder.path + ": reading it is not permitted" + where,
+            findings.push_back({ Severity::fail, libraries, withProblem(folder) + where,
                 "chmod u+rx " + shellWord(folder.blockedAt) });
         } else if (folder.problem == FileProblem::notAFolder) {
             findings.push_back(
                 { Severity::note, libraries, folder.path + " is no folder, so nothing is searched there" });
         } else if (folder.isThere() && folder.problem != FileProblem::none) {
-            findings.push_back(
-                { Severity::fail, libraries, folder.path + ": " + std::string(problemText(folder.problem)) });
+            findings.push_back({ Severity::fail, libraries, withProblem(folder) });
         }
     }
 
@@ -154,11 +158,8 @@ void checkVolumes(const CheckupFacts& facts, std::vector<Finding>& findings)
     for (const FolderState& volume : facts.volumes) {
         if (volume.isSilent)
             findings.push_back({ Severity::fail, volumes, silenceOf(volume.path), commandToTakeOff(&volume) });
-        else if (!volume.isThere())
-            findings.push_back({ Severity::note, volumes, volume.path + " does not exist" });
         else if (volume.problem != FileProblem::none)
-            findings.push_back(
-                { Severity::note, volumes, volume.path + ": " + std::string(problemText(volume.problem)) });
+            findings.push_back({ Severity::note, volumes, withProblem(volume) });
         else if (!volume.isFit)
             findings.push_back({ Severity::note, volumes,
                 volume.path + " is of type " + volume.fileSystem

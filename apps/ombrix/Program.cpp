@@ -4,7 +4,7 @@
 #include "apps/common/HostileNames.h"
 #include "apps/common/StandardError.h"
 #include "apps/ombrix/GroupSearch.h"
-#include "apps/ombrix/ProblemText.h"
+#include "platform/FileProblemText.h"
 
 #include <algorithm>
 #include <climits>
@@ -31,7 +31,8 @@ namespace {
     {
         if (problems.empty())
             return {};
-        std::string first = apps::escapedText(problems[0].path) + ": " + std::string(problemText(problems[0].problem));
+        std::string first = apps::escapedText(problems[0].path) + ": "
+            + std::string(platform::textOfFileProblem(problems[0].problem));
         if (problems.size() == 1)
             return first;
         return std::to_string(problems.size()) + " folders could not be read, the first: " + first;

@@ -4,11 +4,11 @@
 #include "apps/common/RecordJson.h"
 #include "apps/ombrix/AbsolutePath.h"
 #include "apps/ombrix/Commands.h"
-#include "apps/ombrix/ProblemText.h"
 #include "apps/ombrix/Program.h"
 #include "apps/ombrix/WatchText.h"
 #include "host/OBMetadataQuery.h"
 #include "platform/Clock.h"
+#include "platform/FileProblemText.h"
 #include "platform/MainRunLoop.h"
 #include "platform/PathText.h"
 #include "platform/ThreadSafety.h"
@@ -118,7 +118,7 @@ namespace {
             _query.gather(
                 _platform, scope.path, [this](std::string_view path) { take(path); },
                 [this] { return !_program.output().problem().empty(); }, observer);
-            return problem ? _program.fail(scope.typed, problemText(*problem)) : done;
+            return problem ? _program.fail(scope.typed, platform::textOfFileProblem(*problem)) : done;
         }
 
         void finish()

@@ -1,6 +1,6 @@
 #include "apps/ombrix/SearchFolders.h"
 
-#include "apps/ombrix/ProblemText.h"
+#include "platform/FileProblemText.h"
 #include "platform/PathText.h"
 
 namespace ombrix {
@@ -30,7 +30,7 @@ std::string searchStateText(FileProblem problem)
     case FileProblem::notAFolder:
         return "not a folder";
     default:
-        return "not readable: " + std::string(problemText(problem));
+        return "not readable: " + std::string(platform::textOfFileProblem(problem));
     }
 }
 

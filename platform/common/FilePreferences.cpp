@@ -33,7 +33,7 @@ namespace {
         if (bytes.size() > largestDomain)
             return { {}, "it is larger than 16 MiB" };
         if (bytes.size() < file.status().size)
-            return { {}, "the disk cannot be read" };
+            return { {}, std::string(textOfFileProblem(FileProblem::readError)) };
         PropertyListResult result = readPropertyList(bytes);
         if (result.problem.empty() && !result.value.dictionary())
             result = { {}, "its outermost value is no dictionary" };

@@ -97,9 +97,9 @@ TEST_CASE("a search folder that may not be read is a failure, mended where it is
     facts.events[0].blockedAt = facts.events[0].path;
     facts.events[1] = folderAt("/E", FileProblem::notAFolder);
     CHECK(told(facts)
-        == Lines { "fail libraries: /home/ann/Movies/P: reading it is not permitted (/home/ann/Movies) [chmod u+rx "
+        == Lines { "fail libraries: /home/ann/Movies/P: permission denied (/home/ann/Movies) [chmod u+rx "
                    "/home/ann/Movies]",
-            "fail libraries: /home/ann/Movies/it's: reading it is not permitted [chmod u+rx "
+            "fail libraries: /home/ann/Movies/it's: permission denied [chmod u+rx "
             "'/home/ann/Movies/it'\\''s']",
             "note libraries: /E is no folder, so nothing is searched there" });
 }
@@ -196,7 +196,7 @@ TEST_CASE("folders that are looked at, or not followed at all, and disks that ar
                    "change on a file system of type nfs",
             "note watching: /home/ann/Movies/E is not followed",
             "note volumes: /mnt/stick is of type msdos: shown, but the editor keeps no libraries there",
-            "note volumes: /mnt/gone does not exist" });
+            "note volumes: /mnt/gone: it does not exist" });
 }
 
 TEST_CASE("preferences that cannot be read are warned of, and set aside or permitted by the remedy")

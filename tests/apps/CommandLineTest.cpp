@@ -154,12 +154,12 @@ TEST_CASE("a library that is there and cannot be read is neither absent nor fata
     const std::string closed = machine.folder.path("home/Movies/Montaro Projects");
     std::filesystem::remove_all(closed);
     std::filesystem::create_symlink(closed, closed);
-    CHECK(contains(machine.run({ "paths" }).output, closed + "   not readable: its links lead in circles\n"));
+    CHECK(contains(machine.run({ "paths" }).output, closed + "   not readable: its symbolic links lead in circles\n"));
     CHECK(contains(machine.run({ "info" }).output, "project folders exist (1 not readable), "));
     const ProgramRun tree = machine.run({ "tree" });
     CHECK(tree.status == 0);
     CHECK(contains(tree.output, "1 folder unreadable"));
-    CHECK(tree.errors == "ombrix: warning: " + closed + ": its links lead in circles\n");
+    CHECK(tree.errors == "ombrix: warning: " + closed + ": its symbolic links lead in circles\n");
     CHECK(machine.run({ "paths", "--json" }).errors.empty());
 }
 

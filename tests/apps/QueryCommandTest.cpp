@@ -102,9 +102,9 @@ TEST_CASE("a scope that does not exist is told in one line, and the others are a
     const ProgramRun run = query({ movies, folder.path("no\nne"), folder.path() });
     CHECK(run.status == 1);
     CHECK(run.output == file + "\n");
-    CHECK(run.errors == "ombrix: " + folder.path() + "/no\\x0ane: nothing is there\n");
-    checkRefused(query({ movies, "./none" }), 1, "./none: nothing is there");
-    checkRefused(query({ movies, folder.link("dangling", "none") }), 1, folder.path("dangling: nothing is there"));
+    CHECK(run.errors == "ombrix: " + folder.path() + "/no\\x0ane: it does not exist\n");
+    checkRefused(query({ movies, "./none" }), 1, "./none: it does not exist");
+    checkRefused(query({ movies, folder.link("dangling", "none") }), 1, folder.path("dangling: it does not exist"));
 }
 
 TEST_CASE("names in a query's answer are escaped on a terminal, and links to their files")

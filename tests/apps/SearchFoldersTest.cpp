@@ -46,8 +46,8 @@ TEST_CASE("the state of a search folder says why it cannot be read")
     CHECK(searchStateText(FileProblem::none) == "exists");
     CHECK(searchStateText(FileProblem::missing) == "absent");
     CHECK(searchStateText(FileProblem::notAFolder) == "not a folder");
-    CHECK(searchStateText(FileProblem::notPermitted) == "not readable: reading it is not permitted");
-    CHECK(searchStateText(FileProblem::readError) == "not readable: the disk could not be read");
+    CHECK(searchStateText(FileProblem::notPermitted) == "not readable: permission denied");
+    CHECK(searchStateText(FileProblem::readError) == "not readable: the disk cannot be read");
 }
 
 TEST_CASE("what cannot be read is there and is not absent")

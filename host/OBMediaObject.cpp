@@ -162,23 +162,11 @@ std::optional<platform::FileFacts> OBMediaObject::factsLocked() const
 
 Text OBMediaObject::aliasResolvedPath() const
 {
-    Text path;
-    bool wasReal = false;
-    {
-        Locked guard(_lock);
-        path = pathLocked();
-        wasReal = _pathIsReal;
-    }
+    const Text path = this->path();
     const auto core = FrameworkCore::current();
     if (!core || path.isAbsent())
         return {};
     const platform::FileSystem& fileSystem = core->platform().fileSystem;
-    if (wasReal) {
-        // What was a plain file by its real path, and still is one, needs no walk along its path.
-        const std::optional<platform::ItemStatus> now = fileSystem.linkStatus(path);
-        if (now && now->kind == platform::ItemKind::file)
-            return path;
-    }
     return fileSystem.exists(path) ? Text(fileSystem.resolvedPath(path)) : Text();
 }
 

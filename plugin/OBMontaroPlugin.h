@@ -9,6 +9,7 @@
 #include "platform/ThreadSafety.h"
 
 #include <atomic>
+#include <functional>
 #include <map>
 #include <memory>
 #include <optional>
@@ -27,6 +28,11 @@ using MontaroSearchPaths = std::shared_ptr<const std::vector<platform::Text>>;
 
 /// The groups that one scan found, in the order found. A scan extends the list that it made, and only that.
 using MontaroFlatGroupList = std::shared_ptr<platform::Snapshot<OBMediaGroupList>>;
+
+inline MontaroFlatGroupList listOrNew(const MontaroFlatGroupList& list)
+{
+    return list ? list : std::make_shared<platform::Snapshot<OBMediaGroupList>>();
+}
 
 inline void addGroup(const MontaroFlatGroupList& list, const OBMediaGroupRef& group)
 {
@@ -98,7 +104,9 @@ public:
     void finishReloadMontaroProjects(const OBMediaGroupRef& library);
     /// Whether a folder is a project.
     bool _isMTProject(std::string_view path);
-    OBMediaGroupRef _createMontaroProjectsFolderForPath(const platform::Text& path, ProjectScan& scan);
+    /// One folder's projects and folders, below a group that stands for it; null for no path. They are added to the flat
+    /// list, as in a scan.
+    OBMediaGroupRef _createMontaroProjectsFolderForPath(const platform::Text& path);
     /// Gives a folder group one representative movie a project below it.
     void _createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder);
     /// The movies that were shared from the project, in listing order.
@@ -128,8 +136,9 @@ public:
     /// into the installed tree too.
     OBMediaGroupRef _reloadMontaroEvents_updateRootMediaGroup(const platform::Text& parentID, bool updateRoot);
     OBMediaGroupRef _reloadMontaroEvents();
-    /// One library's events, below a group that carries them; null for a folder that lists nothing.
-    OBMediaGroupRef _createMontaroEventsFolderForPath(const platform::Text& path, EventScan& scan);
+    /// One library's events, below a group that carries them; null for a folder that lists nothing. They are added to the
+    /// flat list, as in a scan.
+    OBMediaGroupRef _createMontaroEventsFolderForPath(const platform::Text& path);
     /// Whether a folder is an event.
     bool _isMTEvent(std::string_view path);
     /// When a clip was recorded, where its file says so; it then bears that date for a name. Any thread.
@@ -196,15 +205,20 @@ private:
     void postWillOpenOrReveal();
     void dropAppIcon() NO_THREAD_SAFETY_ANALYSIS;
     OBMediaGroupRef projectGroup(const platform::Text& listedFolder, const platform::FolderListing& listing,
-        const platform::FolderItem& item, ProjectScan& scan);
+        const platform::FolderItem& item, const ProjectScan& scan);
+    ProjectScan newProjectScan(MontaroFlatGroupList flatGroups);
+    OBMediaGroupRef projectsInFolder(const platform::Text& path, const ProjectScan& scan);
 
     class ClipReader;
-    void walkEventLibraries(OBMediaGroup& collected, EventScan& scan);
-    OBMediaGroupRef eventGroup(
-        const platform::Text& library, const FoundFolder& found, const ReadEvent& read, EventScan& scan);
-    ReadEvent readEvent(const platform::Text& library, const FoundFolder& folder, const EventScan& scan);
-    ReadEvent readEventWith(
-        ClipScratch& scratch, const platform::Text& library, const FoundFolder& folder, const EventScan& scan);
+    void walkEventLibraries(OBMediaGroup& collected, const EventScan& scan);
+    EventScan newEventScan(MontaroFlatGroupList flatGroups);
+    OBMediaGroupRef eventsInFolder(const platform::Text& path, const EventScan& scan);
+    using EventFound = std::function<void(const OBMediaGroupRef& event)>;
+    OBMediaGroupRef finishedEvent(const FoundFolder& found, const ReadEvent& read, const EventScan& scan);
+    ReadEvent readEvent(
+        const platform::Text& library, const FoundFolder& folder, const EventScan& scan, const EventFound& found);
+    ReadEvent readEventWith(ClipScratch& scratch, const platform::Text& library, const FoundFolder& folder,
+        const EventScan& scan, const EventFound& found);
     void groupEventsByYear(OBMediaGroup& library, const OBMediaGroupList& events, const EventScan& scan);
     void sortEventsWithinYears(const OBMediaGroup& library);
 

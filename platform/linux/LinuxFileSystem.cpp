@@ -109,7 +109,7 @@ FolderListing LinuxFileSystem::itemsInFolder(std::string_view folder, const List
         = request.links == LinkPolicy::stop && isLexicallyNormalised(folder) && !hasDotComponent(folder);
     // What lies too deep to be named by its whole path is not to be reached from here either.
     ListingRequest reachable = request;
-    if (!pathIsReal || folder == "/")
+    if (!pathIsReal || folder == "/" || folder.size() + request.markerBeside.size() + 1 >= PATH_MAX)
         reachable.markerBeside = {};
     if (folder.size() + NAME_MAX + request.subfolder.size() + 2 >= PATH_MAX)
         reachable.subfolder = {};

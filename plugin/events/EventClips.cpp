@@ -92,7 +92,6 @@ public:
     {
         _result.folder = folder;
         _result.problem = _listing.problem();
-        _result.hasEntries = !_listing.empty();
     }
 
     EventClips read();
@@ -119,7 +118,7 @@ private:
 
 EventClips OBMontaroPlugin::ClipReader::read()
 {
-    if (!_result.hasEntries)
+    if (_listing.empty())
         return std::move(_result);
     _scan.report.found([&] { return findings::clipsFolder(_result.folder, _listing.size()); });
     _realFolder = realFolder();
@@ -261,18 +260,19 @@ void OBMontaroPlugin::ClipReader::addPlainClips()
     _plainClips.clear();
 }
 
-/// Looks into one folder of `library`. Any thread.
-ReadEvent OBMontaroPlugin::readEvent(const Text& library, const FoundFolder& folder, const EventScan& scan)
+/// Looks into one folder of `library`, and tells of the event as soon as there is one. Any thread.
+ReadEvent OBMontaroPlugin::readEvent(
+    const Text& library, const FoundFolder& folder, const EventScan& scan, const EventFound& found)
 {
     ClipScratch scratch = scan.scratches->take();
-    ReadEvent event = readEventWith(scratch, library, folder, scan);
+    ReadEvent event = readEventWith(scratch, library, folder, scan, found);
     scan.scratches->giveBack(std::move(scratch));
     return event;
 }
 
 /// From the open folder of clips what holds it is nearer than along the whole path. Of what is no event nothing is read.
-ReadEvent OBMontaroPlugin::readEventWith(
-    ClipScratch& scratch, const Text& library, const FoundFolder& folder, const EventScan& scan)
+ReadEvent OBMontaroPlugin::readEventWith(ClipScratch& scratch, const Text& library, const FoundFolder& folder,
+    const EventScan& scan, const EventFound& found)
 {
     const Text clips = Text::joined(folder.path, "/", clipsFolder);
     platform::ListingRequest request = clipListing;
@@ -288,9 +288,19 @@ ReadEvent OBMontaroPlugin::readEventWith(
     item.marker = isEvent ? platform::MarkerAnswer::present : platform::MarkerAnswer::absent;
     if (!scan.report.passes(rules::hasEventMarker, item, library))
         return {};
-    const std::optional<Date> modificationDate
-        = holder ? holder->modificationDate : OBMediaGroup::modDateForFile(folder.path);
-    return { true, modificationDate, ClipReader(*this, scan, clips, scratch).read() };
+    ReadEvent event { true };
+    if (!scratch.listing.empty()) {
+        event.group = OBMediaGroup::withFields({ .typeIdentifier = OBMontaroEventGroupTypeIdentifier,
+            .name = folder.name,
+            .ID = folder.path,
+            .parentID = library,
+            .path = folder.path,
+            .icon = scan.eventIcon,
+            .modificationDate = holder ? holder->modificationDate : OBMediaGroup::modDateForFile(folder.path) });
+        found(event.group);
+    }
+    event.clips = ClipReader(*this, scan, clips, scratch).read();
+    return event;
 }
 
 /// Clips carry no date of their recording yet; whatever reads one goes here.

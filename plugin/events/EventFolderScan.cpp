@@ -67,12 +67,16 @@ void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newe
 
 } // namespace
 
+EventScan OBMontaroPlugin::newEventScan(MontaroFlatGroupList flatGroups)
+{
+    return { ScanReport(*this), std::move(flatGroups), clipKind(), localizedString("MontaroClipNameDisplayFormat"),
+        sharedValues().eventIcon.load(), sharedValues().calendarIcon.load() };
+}
+
 OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const Text& parentID, bool updateRoot)
 {
     _poolingEventsReload = false;
-    EventScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), clipKind(),
-        localizedString("MontaroClipNameDisplayFormat"), sharedValues().eventIcon.load(),
-        sharedValues().calendarIcon.load() };
+    const EventScan scan = newEventScan(listOrNew({}));
     const ScanHistory::Number number = _eventScans.begin(_flatEventGroupsList, scan.flatGroups);
     if (!updateRoot)
         _eventScans.beganForLoad(number);
@@ -95,12 +99,12 @@ OBMediaGroupRef OBMontaroPlugin::_reloadMontaroEvents_updateRootMediaGroup(const
 }
 
 /// Collects the events of all libraries, one folder after the other.
-void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, EventScan& scan)
+void OBMontaroPlugin::walkEventLibraries(OBMediaGroup& collected, const EventScan& scan)
 {
     Locked guard(*_MontaroEventsSearchPathsLock);
     const auto isInHome = [this](const Text& path) { return path == _MontaroDefaultEventsFolderPath(); };
     scan.report.walkLibraries(_MontaroEventsSearchPaths.load(), "events", isInHome, [&](const Text& path) {
-        if (const OBMediaGroupRef carrier = _createMontaroEventsFolderForPath(path, scan)) {
+        if (const OBMediaGroupRef carrier = eventsInFolder(path, scan)) {
             carrier->setParentID(OBMontaro);
             carrier->setID(path);
             collected.addChildGroups(carrier->childGroups());
@@ -117,7 +121,12 @@ bool OBMontaroPlugin::_isMTEvent(std::string_view path)
     return platform().fileSystem.exists(platform::pathJoined(path, MontaroEventIdentifierPathComponent));
 }
 
-OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& path, EventScan& scan)
+OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& path)
+{
+    return eventsInFolder(path, newEventScan(listOrNew(_flatEventGroupsList.load())));
+}
+
+OBMediaGroupRef OBMontaroPlugin::eventsInFolder(const Text& path, const EventScan& scan)
 {
     if (!path)
         return nullptr;
@@ -133,9 +142,14 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
 
     const std::vector<FoundFolder> folders = foldersInLibrary(scan.report, path, listing);
     std::vector<ReadEvent> events(folders.size());
-    const auto read = [&](std::size_t index) { events[index] = readEvent(path, folders[index], scan); };
+    ShownEvents shown(scan.flatGroups, folders.size());
+    const auto read = [&](std::size_t index) {
+        events[index]
+            = readEvent(path, folders[index], scan, [&](const OBMediaGroupRef& event) { shown.found(index, event); });
+    };
     const auto take = [&](std::size_t index) {
-        carrier->addChildGroup(eventGroup(path, folders[index], std::exchange(events[index], {}), scan));
+        carrier->addChildGroup(finishedEvent(folders[index], std::exchange(events[index], {}), scan));
+        shown.reached(index + 1);
     };
     if (scan.report.isObserved()) {
         // Whoever is told of decisions is told of them in their order.
@@ -149,31 +163,24 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroEventsFolderForPath(const Text& p
     return carrier;
 }
 
-/// One event of `library`; null when it has no clips. The flat list shows it all the same where its folder of clips
-/// holds anything at all.
-OBMediaGroupRef OBMontaroPlugin::eventGroup(
-    const Text& library, const FoundFolder& found, const ReadEvent& read, EventScan& scan)
+/// An event with what was read of it; null when it has no clips. The flat list shows it all the same where its folder of
+/// clips holds anything at all.
+OBMediaGroupRef OBMontaroPlugin::finishedEvent(const FoundFolder& found, const ReadEvent& read, const EventScan& scan)
 {
     if (!read.isEvent)
         return nullptr;
     const EventClips& clips = read.clips;
     noteFolderRead(clips.folder, clips.problem);
-    if (!clips.hasEntries) {
+    if (!read.group) {
         scan.report.keptOut([&] { return findings::eventWithoutClipsFolder(found.path, clips.problem); });
         return nullptr;
     }
-    OBMediaGroupRef event
-        = makeGroup(OBMontaroEventGroupTypeIdentifier, found.name, found.path, library, scan.eventIcon);
-    event->setPath(found.path);
-    event->setModificationDate(read.modificationDate);
-    addGroup(scan.flatGroups, event);
-
-    event->setMediaObjects(clips.clips);
+    read.group->setMediaObjects(clips.clips);
     noteItemsFound(clips.clips.size());
     if (clips.clips.empty()) {
         scan.report.keptOut([&] { return findings::eventWithoutClips(found.path); });
         return nullptr;
     }
-    setAttributesOfClips(*event, clips.dates, _mostRecentEventFirst);
-    return event;
+    setAttributesOfClips(*read.group, clips.dates, _mostRecentEventFirst);
+    return read.group;
 }

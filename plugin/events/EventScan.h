@@ -45,8 +45,7 @@ private:
     std::vector<ClipScratch> _spare GUARDED_BY(_lock);
 };
 
-/// What one scan of the event libraries carries through its folders. Several threads read it; the list of groups is
-/// extended by the scanning thread alone.
+/// What one scan of the event libraries carries through its folders. Several threads read it.
 struct EventScan {
     ScanReport report;
     MontaroFlatGroupList flatGroups;
@@ -67,7 +66,6 @@ struct FoundFolder {
 struct EventClips {
     platform::Text folder {};
     platform::FileProblem problem = platform::FileProblem::none;
-    bool hasEntries = false; ///< of any kind, clips or not
     OBMediaObjectList clips {};
     ClipDates dates {};
 };
@@ -75,8 +73,41 @@ struct EventClips {
 /// What a look into a folder of a library told.
 struct ReadEvent {
     bool isEvent = false;
-    std::optional<platform::Date> modificationDate {};
+    OBMediaGroupRef group {}; ///< null where the folder of clips holds nothing; not yet with its clips
     EventClips clips {};
+};
+
+/// The events of one library on their way into the flat list, which shows each as soon as it is known to be one and all
+/// before it have been read, its clips unread as yet. Any thread.
+class ShownEvents {
+public:
+    ShownEvents(MontaroFlatGroupList list, std::size_t count)
+        : _list(std::move(list))
+        , _found(count)
+    {
+    }
+
+    void found(std::size_t index, const OBMediaGroupRef& event)
+    {
+        platform::Locked guard(_lock);
+        _found[index] = event;
+        if (index == _reached)
+            addGroup(_list, event);
+    }
+    /// All before `index` have been read.
+    void reached(std::size_t index)
+    {
+        platform::Locked guard(_lock);
+        _reached = index;
+        if (index < _found.size() && _found[index])
+            addGroup(_list, _found[index]);
+    }
+
+private:
+    const MontaroFlatGroupList _list;
+    platform::Mutex _lock;
+    std::vector<OBMediaGroupRef> _found GUARDED_BY(_lock);
+    std::size_t _reached GUARDED_BY(_lock) = 0;
 };
 
 /// The folder in an event in which its clips lie.

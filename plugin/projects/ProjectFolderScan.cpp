@@ -59,11 +59,16 @@ OBMediaGroupRef libraryOf(const OBMediaGroupList& groups)
 
 } // namespace
 
+ProjectScan OBMontaroPlugin::newProjectScan(MontaroFlatGroupList flatGroups)
+{
+    return { ScanReport(*this), std::move(flatGroups), movieKind(*this), sharedValues().projectIcon.load(),
+        sharedValues().emptyProjectIcon.load() };
+}
+
 OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
 {
     _poolingProjectsReload = false;
-    ProjectScan scan { ScanReport(*this), std::make_shared<platform::Snapshot<OBMediaGroupList>>(), movieKind(*this),
-        sharedValues().projectIcon.load(), sharedValues().emptyProjectIcon.load() };
+    const ProjectScan scan = newProjectScan(listOrNew({}));
     const ScanHistory::Number number = _projectScans.begin(_flatProjectGroupsList, scan.flatGroups);
     if (!updateRoot)
         _projectScans.beganForLoad(number);
@@ -73,7 +78,7 @@ OBMediaGroupList OBMontaroPlugin::_reloadMontaroProjects(bool updateRoot)
         Locked guard(*_MontaroSearchPathsLock);
         const auto isInHome = [this](const Text& path) { return path == _MontaroDefaultPath(); };
         scan.report.walkLibraries(_MontaroSearchPaths.load(), "projects", isInHome, [&](const Text& path) {
-            if (const OBMediaGroupRef library = _createMontaroProjectsFolderForPath(path, scan)) {
+            if (const OBMediaGroupRef library = projectsInFolder(path, scan)) {
                 library->setName(localizedString("MontaroProjectLibrary"));
                 library->setTypeIdentifier(OBMontaroProjectGroupTypeIdentifier);
                 library->setParentID(OBMontaro);
@@ -106,7 +111,12 @@ bool OBMontaroPlugin::_isMTProject(std::string_view path)
     return platform().fileSystem.exists(platform::pathJoined(path, MontaroProjectIdentifierPathComponent));
 }
 
-OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text& path, ProjectScan& scan)
+OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text& path)
+{
+    return projectsInFolder(path, newProjectScan(listOrNew(_flatProjectGroupsList.load())));
+}
+
+OBMediaGroupRef OBMontaroPlugin::projectsInFolder(const Text& path, const ProjectScan& scan)
 {
     if (!path)
         return nullptr;
@@ -134,8 +144,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
             folder->addChildGroup(projectGroup(listed, listing, item, scan));
         } else if (scan.report.passes(rules::isContainer, item, listed)
             && scan.report.passes(rules::isNotPackage, item, listed)) {
-            const OBMediaGroupRef subfolder
-                = _createMontaroProjectsFolderForPath(Text::joined(listed, "/", item.name), scan);
+            const OBMediaGroupRef subfolder = projectsInFolder(Text::joined(listed, "/", item.name), scan);
             subfolder->setParentID(folder->ID());
             folder->addChildGroup(subfolder);
         }
@@ -155,7 +164,7 @@ OBMediaGroupRef OBMontaroPlugin::_createMontaroProjectsFolderForPath(const Text&
 
 /// One project of `listedFolder`. It shows in the flat list before its movies are known.
 OBMediaGroupRef OBMontaroPlugin::projectGroup(
-    const Text& listedFolder, const FolderListing& listing, const FolderItem& item, ProjectScan& scan)
+    const Text& listedFolder, const FolderListing& listing, const FolderItem& item, const ProjectScan& scan)
 {
     const Text path = Text::joined(listedFolder, "/", item.name);
     OBMediaGroupRef project = OBMediaGroup::withFields(

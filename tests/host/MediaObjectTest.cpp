@@ -6,6 +6,7 @@
 
 #include <doctest/doctest.h>
 
+#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
@@ -185,7 +186,7 @@ TEST_CASE("the alias-resolved path is absent where nothing exists, and without a
     CHECK(object->aliasResolvedPath().isAbsent());
 }
 
-TEST_CASE("a path that was seen to hold no link resolves to itself without links being looked for")
+TEST_CASE("a path that was seen to hold no link resolves to itself")
 {
     TestHost test;
     const std::string file = test.machine.folder.file("real/trip.mov");
@@ -209,6 +210,19 @@ TEST_CASE("a file that has gone since it was found has no real path, and one tha
     CHECK(object->aliasResolvedPath().isAbsent());
     makeLink(file, elsewhere);
     CHECK(object->aliasResolvedPath() == Text(elsewhere));
+}
+
+TEST_CASE("a file whose folder has moved away from under a link in its place is resolved to where it is")
+{
+    TestHost test;
+    test.machine.folder.file("real/trip.mov");
+    test.host();
+    const std::string real = test.machine.folder.path("real");
+    const std::string moved = test.machine.folder.path("moved");
+    const auto object = fileOfFolder(real, "trip.mov", true);
+    std::filesystem::rename(real, moved);
+    makeLink(real, moved);
+    CHECK(object->aliasResolvedPath() == Text(moved + "/trip.mov"));
 }
 
 TEST_CASE("a new path of an object is resolved afresh")

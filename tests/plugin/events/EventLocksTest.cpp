@@ -125,6 +125,32 @@ TEST_CASE("during a scan the flat list holds the events found so far, and not ye
     CHECK(EventMachine::flatNames(*source) == "A B C");
 }
 
+TEST_CASE("an event is in the flat list before its clips are read, and not before all clips of those ahead of it are")
+{
+    for (const int count : { 3, manyEvents }) {
+        CAPTURE(count);
+        EventMachine machine;
+        for (int number = 0; number < count; ++number)
+            machine.clip(nameOfEvent(number), "a.mov", noonOf(2011));
+        const auto source = machine.makeSource();
+        machine.load(*source);
+        Stop stop;
+        EventMachine::whenDateIsAsked() = [&stop](std::string_view clip) {
+            if (clip.ends_with("/C/Original Media/a.mov"))
+                stop.stopHere();
+        };
+        std::thread scan([&] { source->_reloadMontaroEvents_updateRootMediaGroup("Montaro", false); });
+        REQUIRE(stop.waitUntilReached());
+        CHECK(waitUntil([&] { return EventMachine::flatNames(*source) == "A B C"; }));
+        giveOthersTheirTurn();
+        CHECK(EventMachine::flatNames(*source) == "A B C");
+        stop.release();
+        scan.join();
+        EventMachine::whenDateIsAsked() = nullptr;
+        CHECK(EventMachine::flatNames(*source).size() == static_cast<std::size_t>(2 * count - 1));
+    }
+}
+
 TEST_CASE("several threads read the clips of events, which show one after the other in listing order all the same")
 {
     EventMachine machine;

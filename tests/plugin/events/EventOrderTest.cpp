@@ -171,6 +171,7 @@ TEST_CASE("events of the same dates compare by name, A to Z in both orders, with
     for (const auto compared : { oldestFirst, newestFirst }) {
         CHECK(compared({ "beta", 2010, march, june }, { "Alpha", 2010, march, june }) == otherFirst);
         CHECK(compared({ "ALPHA", 2010, march, june }, { "alpha", 2010, march, june }) == same);
+        CHECK(compared({ {}, 2010, march, june }, { "a", 2010, march, june }) == same);
     }
     CHECK(oldestFirst({ "a", 2010, march, may }, { "b", 2010, march, june }) == receiverFirst);
     CHECK(newestFirst({ "a", 2010, march, june }, { "b", 2010, may, june }) == receiverFirst);

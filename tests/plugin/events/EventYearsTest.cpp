@@ -74,6 +74,7 @@ TEST_CASE("a clip without a date counts to the year before 0, oldest first, and 
     CHECK(oldestFirst({ file(2011), undated, file(2012) }) == "-1, 2012-07-01 to 2012-07-01");
     CHECK(newestFirst({ file(2011), undated, file(2012) }) == "2012, 2012-07-01 to 2012-07-01");
     CHECK(oldestFirst({ undated, undated }) == "-1, - to -");
+    CHECK(oldestFirst({ MadeClip { {}, noonOf(10'000) } }) == "-1, 10000-07-01 to -");
 }
 
 TEST_CASE("an event whose clips all lack dates has no attributes, newest first")

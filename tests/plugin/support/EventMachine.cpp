@@ -23,6 +23,8 @@ namespace {
 
         std::optional<Date> _dateFromExtendedFileAttributeAtPath(std::string_view path) override
         {
+            if (EventMachine::whenDateIsAsked())
+                EventMachine::whenDateIsAsked()(path);
             const auto known = EventMachine::recordedDates().find(platform::lastPathComponent(path));
             return known == EventMachine::recordedDates().end() ? std::nullopt : std::optional(known->second);
         }
@@ -179,6 +181,12 @@ std::string EventMachine::flatNames(OBMontaroPlugin& source)
             names += (names.empty() ? "" : " ") + group->name().string();
     }
     return names;
+}
+
+std::function<void(std::string_view)>& EventMachine::whenDateIsAsked()
+{
+    static std::function<void(std::string_view)> call;
+    return call;
 }
 
 std::map<std::string, Date, std::less<>>& EventMachine::recordedDates()

@@ -2,6 +2,7 @@
 
 #include "tests/plugin/support/SourceMachine.h"
 
+#include <functional>
 #include <map>
 #include <optional>
 #include <string>
@@ -48,6 +49,8 @@ struct EventMachine : SourceMachine {
     /// The names of the events in the flat list, separated by blanks.
     static std::string flatNames(OBMontaroPlugin& source);
 
+    /// Called with the path of each clip before it is told when it was recorded. Set before a source scans; any thread.
+    static std::function<void(std::string_view path)>& whenDateIsAsked();
     /// When clips were recorded, by their file names. Set before a source scans.
     static std::map<std::string, platform::Date, std::less<>>& recordedDates();
 };

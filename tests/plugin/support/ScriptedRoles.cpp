@@ -43,6 +43,8 @@ platform::FolderListing ScriptedFileSystem::itemsInFolder(
         ordered.append(item);
     if (listing.folderStatus())
         ordered.setFolderStatus(*listing.folderStatus());
+    if (listing.holder())
+        ordered.setHolder(*listing.holder());
     ordered.setPathIsReal(listing.pathIsReal());
     ordered.setOtherRealPath(listing.otherRealPath());
     return ordered;

@@ -6,7 +6,7 @@
 
 namespace ombrix {
 
-/// Absolute, "." and ".." taken out as text; no link is looked at. The empty path stays empty; absent where there is no
+/// Absolute, as the shell names the working folder, "." and ".." taken out as text; no link is looked at. The empty path stays empty; absent where there is no
 /// current folder.
 std::optional<std::string> absolutePath(const std::string& path);
 

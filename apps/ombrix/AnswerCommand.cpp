@@ -15,6 +15,8 @@
 namespace ombrix {
 namespace {
 
+    constexpr std::size_t mostClosedTold = 5;
+
     using Answer = std::vector<std::pair<std::string, std::string>>;
 
     void addTexts(Answer& answer, const std::string& name, const std::vector<std::string>& texts)
@@ -107,12 +109,15 @@ namespace {
     {
         const std::chrono::nanoseconds end = machine.clock.monotonic() + untilSilent - std::chrono::milliseconds(500);
         std::vector<std::string> left { path };
+        std::vector<std::string> closed;
         std::uint64_t count = 0;
         while (!left.empty() && machine.clock.monotonic() < end) {
             const std::string folder = std::move(left.back());
             left.pop_back();
             const platform::FolderListing listing = machine.fileSystem.itemsInFolder(folder, {});
             count += listing.problem() == platform::FileProblem::none ? 1 : 0;
+            if (listing.problem() == platform::FileProblem::notPermitted)
+                closed.push_back(folder);
             for (std::size_t index = 0; index < listing.size(); ++index) {
                 const platform::FolderItem item = listing[index];
                 if (item.kind == platform::ItemKind::folder)
@@ -122,6 +127,11 @@ namespace {
         Answer answer { { "folders", std::to_string(count + left.size()) } };
         if (!left.empty())
             answer.emplace_back("hasMore", "");
+        if (closed.size() > mostClosedTold) {
+            closed.resize(mostClosedTold);
+            answer.emplace_back("hasMoreClosed", "");
+        }
+        addTexts(answer, "closed", closed);
         return answer;
     }
 

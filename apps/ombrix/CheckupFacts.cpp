@@ -21,8 +21,11 @@ namespace {
         std::vector<FolderState> states;
         for (const std::string& path : paths) {
             const auto isKnown = [&](const FolderState& state) { return state.path == path; };
-            if (std::none_of(states.begin(), states.end(), isKnown))
+            const auto known = std::find_if(states.begin(), states.end(), isKnown);
+            if (known == states.end())
                 states.emplace_back().path = path;
+            else
+                ++known->timesSearched;
         }
         return states;
     }
@@ -119,7 +122,7 @@ namespace {
         std::vector<FolderState*> counted;
         Questions questions;
         for (const FolderState* folder : distinctSearchFolders(facts)) {
-            if (folder->means != FollowingMeans::reports || folder->problem != platform::FileProblem::none)
+            if (folder->problem != platform::FileProblem::none)
                 continue;
             counted.push_back(const_cast<FolderState*>(folder)); // it lies in `facts`
             questions.push_back(wordsOf(DiskQuestion::count, folder->path));
@@ -131,6 +134,8 @@ namespace {
             std::from_chars(text.data(), text.data() + text.size(), number);
             counted[index]->folders = number;
             counted[index]->hasMore = !answers[index] || textIn(answers[index], "hasMore");
+            counted[index]->closed = textsIn(answers[index], "closed");
+            counted[index]->hasMoreClosed = textIn(answers[index], "hasMoreClosed").has_value();
         }
     }
 
@@ -158,8 +163,10 @@ std::vector<const FolderState*> distinctSearchFolders(const CheckupFacts& facts)
 std::uint64_t foldersToWatch(const CheckupFacts& facts)
 {
     std::uint64_t count = 0;
-    for (const FolderState* folder : distinctSearchFolders(facts))
-        count += folder->folders.value_or(0);
+    for (const FolderState* folder : distinctSearchFolders(facts)) {
+        if (folder->means == FollowingMeans::reports)
+            count += folder->folders.value_or(0);
+    }
     return count;
 }
 

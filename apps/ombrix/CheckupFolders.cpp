@@ -75,9 +75,42 @@ namespace {
         }
     }
 
+    void checkClosed(const CheckupFacts& facts, std::vector<Finding>& findings)
+    {
+        for (const FolderState* folder : distinctSearchFolders(facts)) {
+            for (const std::string& closed : folder->closed)
+                findings.push_back({ Severity::warn, libraries,
+                    closed + ": " + std::string(textOfFileProblem(FileProblem::notPermitted))
+                        + ", so nothing below it is shown",
+                    "chmod u+rx " + shellWord(closed) });
+            if (folder->hasMoreClosed)
+                findings.push_back(
+                    { Severity::warn, libraries, folder->path + " holds more folders that may not be read" });
+        }
+    }
+
+    /// Volumes are searched by what they are called, and two of one name are one path.
+    void checkNames(const CheckupFacts& facts, std::vector<Finding>& findings)
+    {
+        for (std::size_t index = 0; index < facts.volumes.size(); ++index) {
+            for (std::size_t before = 0; before < index; ++before) {
+                const FolderState& one = facts.volumes[before];
+                const FolderState& other = facts.volumes[index];
+                if (!one.name.empty() && one.name == other.name)
+                    findings.push_back({ Severity::warn, volumes,
+                        one.path + " and " + other.path + " are both called \"" + one.name
+                            + "\", so only one of them is searched, and twice: rename the other" });
+            }
+        }
+    }
+
     void checkSpellings(const std::vector<FolderState>& searched, std::vector<Finding>& findings)
     {
         for (std::size_t index = 0; index < searched.size(); ++index) {
+            if (searched[index].isThere() && searched[index].timesSearched > 1)
+                findings.push_back({ Severity::note, libraries,
+                    searched[index].path + " is searched " + apps::countText(searched[index].timesSearched)
+                        + " times, and what it holds is shown as often" });
             for (std::size_t before = 0; before < index; ++before) {
                 const FolderState& one = searched[before];
                 const FolderState& other = searched[index];
@@ -143,6 +176,7 @@ void checkLibraries(const CheckupFacts& facts, std::vector<Finding>& findings)
     tellCounts(facts, findings);
     for (const FolderState* folder : searchedFolders(facts))
         checkFolder(facts, *folder, findings);
+    checkClosed(facts, findings);
     checkSpellings(facts.projects, findings);
     checkSpellings(facts.events, findings);
     checkStrays(facts, findings);
@@ -165,9 +199,11 @@ void checkVolumes(const CheckupFacts& facts, std::vector<Finding>& findings)
                 volume.path + " is of type " + volume.fileSystem
                     + ": shown, but the editor keeps no libraries there" });
     }
+    checkNames(facts, findings);
     if (findings.size() == before)
-        findings.push_back(
-            { Severity::ok, volumes, apps::quantityText(facts.volumes.size(), "volume") + ", fit for libraries" });
+        findings.push_back({ Severity::ok, volumes,
+            facts.volumes.empty() ? "none is mounted"
+                                  : apps::quantityText(facts.volumes.size(), "volume") + ", fit for libraries" });
 }
 
 } // namespace ombrix

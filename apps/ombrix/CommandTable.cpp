@@ -117,7 +117,7 @@ namespace {
 
     constexpr OptionInfo messageOptions[] { group };
     constexpr Example messageExamples[] {
-        { "ombrix message --group Montaro", "why the whole tree is empty" },
+        { "ombrix message --group ID --source org.example.Source", "what another source says of one of its groups" },
         { "ombrix message --group \"$HOME/Movies/Montaro Projects/Trip\"", "why a project is" },
     };
 

@@ -88,6 +88,7 @@ FolderState stateOfAnswer(const FolderState& asked, const DiskAnswer& answer)
     FolderState state;
     state.path = asked.path;
     state.name = asked.name;
+    state.timesSearched = asked.timesSearched;
     state.isSilent = !answer;
     state.problem = static_cast<platform::FileProblem>(numberIn(answer, "problem"));
     state.blockedAt = textIn(answer, "blockedAt").value_or("");

@@ -28,7 +28,7 @@ enum class DiskQuestion : std::uint8_t {
     videos, ///< where the desktop keeps videos
     preferences, ///< of the domain that follows
     folder, ///< the state of the folder that follows
-    count, ///< how many folders are at and below the folder that follows
+    count, ///< how many folders are at and below the folder that follows, and which may not be read
 };
 
 /// A question as words for the command line.
@@ -62,8 +62,11 @@ struct FolderState {
     std::string fileSystem {}; ///< its type; empty where nothing is there
     bool isFit = false; ///< for the source's libraries
     platform::FollowingMeans means = platform::FollowingMeans::nothing;
+    std::size_t timesSearched = 1; ///< of a folder that is searched: how often it is named
     std::optional<std::uint64_t> folders {}; ///< at and below it; absent where they have not been counted
     bool hasMore = false; ///< there was no time to count them all
+    std::vector<std::string> closed {}; ///< of those, some that may not be read
+    bool hasMoreClosed = false;
 
     bool isThere() const
     {

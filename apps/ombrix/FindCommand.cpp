@@ -11,6 +11,7 @@
 #include "apps/ombrix/Program.h"
 #include "apps/ombrix/TreeNodes.h"
 #include "platform/FileSystem.h"
+#include "platform/PathText.h"
 
 #include <algorithm>
 #include <charconv>
@@ -100,10 +101,19 @@ namespace {
                 "… " + apps::countText(all - count) + " more (\"--limit " + std::to_string(all) + "\" shows all)");
     }
 
+    /// Names are shown without extensions, and people type what a file is called.
+    std::string hintAtExtension(const std::string& typed, const OBMediaGroupRef& root, apps::NameKinds kinds)
+    {
+        const std::string name(platform::nameWithoutExtension(typed));
+        const bool isFound = name != typed && !apps::findNames(root, apps::NameQuery(name), kinds).hits.empty();
+        return isFound ? "; they have no extensions, and \"" + apps::escapedText(name) + "\" is among them"
+                       : std::string();
+    }
+
     void tellThatNothingWasFound(const std::string& typed, const OBMediaGroupRef& root, apps::NameKinds kinds)
     {
         apps::printError("ombrix: find: nothing is called \"" + apps::escapedText(typed) + "\" (looked through "
-            + apps::quantityText(apps::countOfNames(root, kinds), "name") + ")");
+            + apps::quantityText(apps::countOfNames(root, kinds), "name") + hintAtExtension(typed, root, kinds) + ")");
     }
 
 } // namespace

@@ -46,6 +46,7 @@ namespace {
     std::vector<std::string_view> pathsOf(const std::vector<std::string_view>& objects)
     {
         std::vector<std::string_view> paths;
+        paths.reserve(objects.size());
         for (const std::string_view object : objects)
             paths.push_back(memberOf(object, "path"));
         return paths;
@@ -54,6 +55,7 @@ namespace {
     std::vector<std::string_view> identifiersOf(const TreeDocument& tree, const std::vector<std::size_t>& groups)
     {
         std::vector<std::string_view> identifiers;
+        identifiers.reserve(groups.size());
         for (const std::size_t group : groups)
             identifiers.push_back(tree.groups[group].fact("ID"));
         return identifiers;

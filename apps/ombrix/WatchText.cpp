@@ -138,7 +138,7 @@ std::string circumstancesText(const OBPublication& publication, const OBTreeChan
 {
     if (std::string text = volumesText(changes, volumes, style); !text.empty())
         return text;
-    const std::string scanned = "scanned in " + apps::durationText(publication.duration);
+    std::string scanned = "scanned in " + apps::durationText(publication.duration);
     const OBChangeCause& cause = publication.cause;
     if (cause.text.empty())
         return scanned;

@@ -146,6 +146,41 @@ TEST_CASE("folders that are one, or one in the other, are noted in each half")
     CHECK(foldersToWatch(facts) == 30);
 }
 
+TEST_CASE("folders below a search folder that may not be read are warned of, each with the command that permits it")
+{
+    CheckupFacts facts = soundFacts();
+    facts.projects[0].closed = { "/home/ann/Movies/P/a", "/home/ann/Movies/P/b c" };
+    facts.projects[0].hasMoreClosed = true;
+    CHECK(told(facts)
+        == Lines { "warn libraries: /home/ann/Movies/P/a: permission denied, so nothing below it is shown "
+                   "[chmod u+rx /home/ann/Movies/P/a]",
+            "warn libraries: /home/ann/Movies/P/b c: permission denied, so nothing below it is shown "
+            "[chmod u+rx '/home/ann/Movies/P/b c']",
+            "warn libraries: /home/ann/Movies/P holds more folders that may not be read" });
+}
+
+TEST_CASE("volumes of one name, and folders that are searched twice, are told")
+{
+    CheckupFacts facts = soundFacts();
+    facts.volumes.push_back(folderAt("/media/ann/a"));
+    facts.volumes.push_back(folderAt("/media/ann/b"));
+    facts.volumes[1].name = facts.volumes[2].name = "Stick";
+    facts.projects.push_back(folderAt("/Volumes/Stick/P"));
+    facts.projects[2].timesSearched = 2;
+    CHECK(told(facts)
+        == Lines { "note libraries: /Volumes/Stick/P is searched 2 times, and what it holds is shown as often",
+            "warn volumes: /media/ann/a and /media/ann/b are both called \"Stick\", so only one of them is searched, "
+            "and twice: rename the other" });
+}
+
+TEST_CASE("a machine on which nothing is mounted says so")
+{
+    CheckupFacts facts = soundFacts();
+    facts.volumes.clear();
+    const std::vector<Finding> findings = findingsOf(facts);
+    CHECK(std::count(findings.begin(), findings.end(), Finding { Severity::ok, "volumes", "none is mounted" }) == 1);
+}
+
 TEST_CASE("libraries among the desktop's videos are brought home by a link, or moved")
 {
     CheckupFacts facts = soundFacts();
@@ -226,13 +261,15 @@ TEST_CASE("disks are asked in rounds, and one that is silent keeps no other from
                 answer = Facts { { "volume", "/" }, { "name", "Boot" }, { "volume", "/hung" }, { "name", "Hung" },
                     { "home", "/home/ann" } };
             else if (question->first == DiskQuestion::source)
-                answer = Facts { { "project", "/home/ann/Movies/P" }, { "project", "/hung/P" }, { "domain", "a.b" } };
+                answer = Facts { { "project", "/home/ann/Movies/P" }, { "project", "/hung/P" },
+                    { "project", "/hung/P" }, { "domain", "a.b" } };
             else if (question->first == DiskQuestion::folder && question->second.starts_with("/hung"))
                 answer = std::nullopt;
             else if (question->first == DiskQuestion::folder)
                 answer = answerOfState(folderAt(question->second));
             else if (question->first == DiskQuestion::count)
-                answer = Facts { { "folders", "7" }, { "hasMore", "" } };
+                answer = Facts { { "folders", "7" }, { "hasMore", "" }, { "closed", "/home/ann/Movies/P/a" },
+                    { "hasMoreClosed", "" } };
             else if (question->first == DiskQuestion::videos)
                 answer = Facts { { "folder", "/home/ann/Videos" } };
             answers.push_back(answer ? answerOfBytes(bytesOfAnswer(*answer)) : answer);
@@ -247,6 +284,10 @@ TEST_CASE("disks are asked in rounds, and one that is silent keeps no other from
     CHECK(facts.projects[1].isSilent);
     CHECK(facts.projects[0].folders == 7);
     CHECK(facts.projects[0].hasMore);
+    CHECK(facts.projects[0].closed == Lines { "/home/ann/Movies/P/a" });
+    CHECK(facts.projects[0].hasMoreClosed);
+    CHECK(facts.projects[0].timesSearched == 1);
+    CHECK(facts.projects[1].timesSearched == 2);
     REQUIRE(facts.strays.size() == 1);
     CHECK(facts.strays[0].stray.path == "/home/ann/Videos/P");
     CHECK(facts.preferences.empty());

@@ -113,6 +113,8 @@ TEST_CASE("nothing found is no failure")
     CHECK(text.output.empty());
     CHECK(text.errors == "ombrix: find: nothing is called \"now\\x0ahere\" (looked through 6 names)\n");
     CHECK(contains(machine.run({ "nowhere" }).errors, "(looked through 38 names)\n"));
+    CHECK(contains(machine.run({ "beach sunset.mov" }).errors,
+        "(looked through 38 names; they have no extensions, and \"beach sunset\" is among them)\n"));
 }
 
 TEST_CASE("a search without a word, a kind that is none and a limit that is no number are wrong usage")

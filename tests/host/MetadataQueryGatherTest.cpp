@@ -156,9 +156,9 @@ TEST_CASE("numbers are compared by value, and a file without the attribute is on
         { "!(kMDItemPixelWidth = 640)", { text } },
         { "!kMDItemPixelWidth > 640", { movie, text } },
     };
-    for (const auto& [query, expected] : cases) {
-        CAPTURE(query);
-        CHECK(disk.answers(query) == expected);
+    for (const auto& example : cases) {
+        CAPTURE(example.first);
+        CHECK(disk.answers(example.first) == example.second);
     }
 }
 

@@ -153,7 +153,7 @@ TEST_CASE("an object counts in the innermost group that it was set on")
 {
     const auto make = [](const Texts& names) {
         const OBMediaGroupRef inner = groupOfFiles("inner", names);
-        const OBMediaGroupRef root = groupWith("top", { inner });
+        OBMediaGroupRef root = groupWith("top", { inner });
         const OBMediaObjectRef alone = OBMediaObject::initWithMediaType_name(OBMediaTypeMovie, "alone");
         inner->setMediaObjects(inner->ownMediaObjects().appending(alone));
         root->setMediaObjects(inner->ownMediaObjects());
@@ -167,7 +167,7 @@ TEST_CASE("what a longer list repeats counts further in, and only the rest where
 {
     const auto make = [](const Texts& names) {
         const OBMediaGroupRef inner = groupNamed("inner");
-        const OBMediaGroupRef root = groupWith("top", { inner });
+        OBMediaGroupRef root = groupWith("top", { inner });
         root->setMediaObjects(filesOf("f", names));
         inner->setMediaObjects(root->ownMediaObjects().prefix(1));
         return root;

@@ -24,6 +24,7 @@ int browse(const platform::Platform& machine)
         std::cerr << made.problem << '\n'; // names the bundle and why
         return 1;
     }
+    const OBObservation following = host.followChanges(); // else the tree stays as it is loaded
     const OBExecutor here = [&](std::function<void()> call) { machine.mainRunLoop.post(std::move(call)); };
     const OBObservation listening
         = made.manager->observe(here, { .rootPublished = [](const OBMediaGroupRef& root) { print(root, ""); } });

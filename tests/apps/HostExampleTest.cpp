@@ -23,14 +23,19 @@ RunWishes exampleRun(const TemporaryFolder& folder)
     return wishes;
 }
 
+void installEditor(const TemporaryFolder& folder)
+{
+    const std::string editor = folder.file("editor");
+    folder.file("data/applications/org.ombrix.Montaro.desktop",
+        "[Desktop Entry]\nType=Application\nName=Montaro\nExec=" + editor + "\n");
+}
+
 } // namespace
 
 TEST_CASE("the example of an application prints the tree when it is published, and Ctrl-C ends it")
 {
     const TemporaryFolder folder;
-    const std::string editor = folder.file("editor");
-    folder.file("data/applications/org.ombrix.Montaro.desktop",
-        "[Desktop Entry]\nType=Application\nName=Montaro\nExec=" + editor + "\n");
+    installEditor(folder);
     LibraryBuilder projects(folder.folder("home/Movies/Montaro Projects"));
     projects.project("Clients/Meyer").movie("a.mov");
     TerminalWishes terminal;
@@ -40,6 +45,19 @@ TEST_CASE("the example of an application prints the tree when it is published, a
     CHECK(run.status == 0);
     CHECK(run.errors.empty());
     CHECK(run.output == "Montaro\n  Clients\n    Meyer\n  Events\n");
+}
+
+TEST_CASE("the example of an application prints the tree again when a project has come")
+{
+    const TemporaryFolder folder;
+    installEditor(folder);
+    LibraryBuilder projects(folder.folder("home/Movies/Montaro Projects"));
+    projects.project("Meyer").movie("a.mov");
+    RunningProgram program(exampleRun(folder));
+    REQUIRE(program.prints("Montaro\n  Meyer\n  Events\n"));
+    projects.project("Berger").movie("b.mov");
+    CHECK(program.prints("  Berger\n"));
+    CHECK(program.end(SIGINT).status == 0);
 }
 
 TEST_CASE("the example of an application says so when there is nothing to load")

@@ -215,17 +215,31 @@ void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path
         way.end("place", next, "it was not there when the folder was listed", "load again");
 }
 
+/// `path` as the search spells it, where that is another way to the same place, and the folder that is searched; empty
+/// where there is none. Only links that lead into the folder are resolved: those below it stay as they were asked about.
+std::pair<std::string, std::string> Explainer::searchedSpelling(const std::string& path) const
+{
+    for (const std::string& folder : _folders) {
+        const std::string real = _fileSystem.resolvedPath(folder);
+        for (std::string step = "/"; step.size() < path.size();) {
+            step = firstBelow(step, path);
+            const std::string realStep = _fileSystem.resolvedPath(step);
+            if (!platform::isSameOrBelow(realStep, real))
+                continue;
+            const std::string spelled = platform::pathJoined(folder, platform::pathRelativeTo(realStep, real));
+            return { platform::pathJoined(spelled, platform::pathRelativeTo(path, step)), folder };
+        }
+    }
+    return {};
+}
+
 Explainer::Way Explainer::wayOutside(const std::string& path) const
 {
     Way way;
-    for (const std::string& folder : _folders) {
-        const std::string real = _fileSystem.resolvedPath(folder);
-        if (real != folder && platform::isSameOrBelow(path, real)) {
-            const std::string spelled = platform::pathJoined(folder, platform::pathRelativeTo(path, real));
-            way.end("search folder", path, "the folder that it lies in is searched by another path, " + folder,
-                "ask about " + spelled);
-            return way;
-        }
+    if (const auto [spelled, folder] = searchedSpelling(path); !spelled.empty() && spelled != path) {
+        way.end("search folder", path, "the folder that it lies in is searched by another path, " + folder,
+            "ask about " + spelled);
+        return way;
     }
     const auto has = [&](auto&& isSo) { return std::any_of(_folders.begin(), _folders.end(), isSo); };
     if (auto place = _inspection ? _inspection->whyUnsearched(path) : std::nullopt)

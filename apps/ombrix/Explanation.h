@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 class OBSourceInspection;
@@ -56,6 +57,7 @@ private:
     Way wayToRecord(const Decisions& met, const std::string& path) const;
     void endAt(Way& way, const Decisions& met, const std::string& path) const;
     void endBelow(Way& way, const Decisions& met, const std::string& path) const;
+    std::pair<std::string, std::string> searchedSpelling(const std::string& path) const;
     Way wayOutside(const std::string& path) const;
     Decisions decisionsOnWay(std::size_t library, const std::string& path) const;
     const ScanRecord::Made* madeInto(const std::string& path) const;

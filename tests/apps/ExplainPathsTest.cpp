@@ -91,6 +91,23 @@ TEST_CASE("on a volume an event is listed as it is searched, and its clips by th
         "ask about " + spelled);
 }
 
+TEST_CASE("a path that leads into a library by a link is told by what the search calls it")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip = machine.projects.project("Trip").movie("a.mov");
+    machine.folder.link("alias", machine.folder.path("home"));
+    machine.folder.link("short", trip.path());
+    machine.projects.link("Trip/Shared Items/b.mov", "a.mov");
+    const std::string searched = "the folder that it lies in is searched by another path, " + machine.projects.path();
+    for (const std::string name : { "a.mov", "b.mov" }) {
+        const std::string alias = machine.folder.path("alias/Movies/Montaro Projects/Trip/Shared Items/" + name);
+        checkUnlisted(machine.answer(alias), "search folder", searched, "ask about " + trip.moviePath(name));
+        const std::string shortcut = machine.folder.path("short/Shared Items/" + name);
+        checkUnlisted(machine.answer(shortcut), "search folder", searched, "ask about " + trip.moviePath(name));
+        CHECK(machine.answer(trip.moviePath(name)).listed);
+    }
+}
+
 TEST_CASE("a volume that is not searched, and a place outside of all, are told apart")
 {
     ExplainedMachine machine;

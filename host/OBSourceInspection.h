@@ -25,7 +25,8 @@ public:
     virtual std::optional<double> pluginVersionNumber() const = 0;
     virtual std::optional<std::string> pluginVersionString() const = 0;
     /// Of a path that lies in none of the folders that are searched: the rule that would have it searched elsewhere, as
-    /// one for folders of a certain name; absent where the source has none that speaks of it.
+    /// one for folders of a certain name. Of one that lies in such a folder, where nothing was decided about it: why
+    /// nothing is looked for there. Absent where the source has no rule that speaks of it.
     virtual std::optional<OBUnsearchedPlace> whyUnsearched(const std::string& path) const
     {
         (void)path;

@@ -22,6 +22,37 @@ std::string lowerCase(std::string_view text)
     return lower;
 }
 
+std::string withArticle(const ScanRule& rule)
+{
+    return (&rule == &rules::hasEventMarker ? "an " : "a ") + std::string(rule.name);
+}
+
+/// The rule by which `folder` is a project or an event; null when it is neither.
+const ScanRule* ruleOfMarked(const FileSystem& fileSystem, std::string_view folder)
+{
+    for (const ScanRule* rule : { &rules::hasProjectMarker, &rules::hasEventMarker }) {
+        if (fileSystem.exists(platform::pathJoined(folder, rule->marker)))
+            return rule;
+    }
+    return nullptr;
+}
+
+/// Of what is a project or an event by the rule `inner` and lies in another, which is one by `outer`.
+ScanReason reasonOfNested(const ScanRule& inner, const ScanRule& outer, const std::string& subject)
+{
+    const std::string place = &inner == &outer ? " out of the " + std::string(outer.name) + " that holds it"
+                                               : " into a folder \"" + std::string(inner.library) + "\"";
+    return { subject + " is " + withArticle(inner) + " that lies in " + withArticle(outer)
+            + ", where none is looked for",
+        "move " + subject + place };
+}
+
+bool isFolder(const FileSystem& fileSystem, std::string_view path)
+{
+    const auto status = fileSystem.status(path);
+    return status && status->kind == ItemKind::folder;
+}
+
 } // namespace
 
 ScanReason scanReason(
@@ -42,6 +73,28 @@ ScanReason scanReason(
         reason.remedy
             = "give it another name, one that is free and ends in ." + std::string(platform::extensionOfName(name));
     return reason;
+}
+
+ScanReason reasonInside(
+    const FileSystem& fileSystem, const ScanRule& rule, std::string_view folder, std::string_view path)
+{
+    // To move a marker would end the project or event that it marks.
+    if (path == platform::pathJoined(folder, rule.marker))
+        return { "it marks the " + std::string(rule.name), {} };
+    std::string_view outermost;
+    const ScanRule* nested = nullptr;
+    for (std::string_view step = path; step.size() > folder.size();
+         step = platform::pathByRemovingLastComponent(step)) {
+        if (const ScanRule* marked = ruleOfMarked(fileSystem, step)) {
+            outermost = step;
+            nested = marked;
+        }
+    }
+    if (nested) {
+        const std::string name(platform::lastPathComponent(outermost));
+        return reasonOfNested(*nested, rule, outermost == path ? "it" : name);
+    }
+    return { rule.inside.text, isFolder(fileSystem, path) ? rule.remedyOfFolderInside : rule.inside.remedy };
 }
 
 ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, const std::string& path)

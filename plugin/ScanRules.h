@@ -10,6 +10,10 @@
 #include <string>
 #include <string_view>
 
+/// The folder in a project in which its shared movies lie, and that in an event in which its clips do.
+inline constexpr std::string_view sharedItemsFolder = "Shared Items";
+inline constexpr std::string_view clipsFolder = "Original Media";
+
 /// Why an item is kept out, for people.
 struct ScanFailure {
     std::string_view text; ///< what is so
@@ -40,7 +44,9 @@ struct ScanRule {
     std::string_view passed; ///< what is so when it passes, for people
     ScanFailure failure; ///< what is so when it does not
     ScanFailure inside {}; ///< of what is in an item that passes, and no further rule speaks of; empty for most
+    std::string_view remedyOfFolderInside {}; ///< what to do instead about a folder there
     std::string_view marker {}; ///< the entry that it looks for inside the item; empty for most rules
+    std::string_view library {}; ///< with a marker: what the folders are called in which such items are looked for
     /// What to do about a link that leads nowhere, where it takes only items of some kind; empty for most rules.
     std::string_view remedyOfDeadLink {};
     /// What is so of this very item instead, where that depends on what kind of item it is; null for most rules.
@@ -68,7 +74,9 @@ inline constexpr ScanRule hasProjectMarker { .name = "project",
     .failure = { "it holds no CurrentVersion.mtrproject", "open the project in Montaro, which marks it" },
     .inside = { "of a project only the movies directly in its folder \"Shared Items\" are listed",
         "move it into the project's folder \"Shared Items\", with the extension mov, m4v, mp4 or 3gp" },
-    .marker = MontaroProjectIdentifierPathComponent };
+    .remedyOfFolderInside = "move the movies in it into the project's folder \"Shared Items\"",
+    .marker = MontaroProjectIdentifierPathComponent,
+    .library = MontaroProjectsFolderName };
 
 inline constexpr ScanRule isNotPackage { .name = "package",
     .passes = [](const platform::FolderItem& item) { return !item.flags.package; },
@@ -93,7 +101,9 @@ inline constexpr ScanRule hasEventMarker { .name = "event",
     .failure = { "it holds no CurrentVersion.mtrevent", "open the event in Montaro, which marks it" },
     .inside = { "of an event only the clips directly in its folder \"Original Media\" are listed",
         "move it into the event's folder \"Original Media\"" },
-    .marker = MontaroEventIdentifierPathComponent };
+    .remedyOfFolderInside = "move the clips in it into the event's folder \"Original Media\"",
+    .marker = MontaroEventIdentifierPathComponent,
+    .library = MontaroEventsFolderName };
 
 inline constexpr ScanRule isNoFolder { .name = "kind",
     .passes = [](const platform::FolderItem& item) { return !item.flags.container; },

@@ -209,6 +209,8 @@ void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path
             "permit searching its folder (chmod +x)");
     else if (!missing.empty())
         way.end("existence", missing, "nothing is there", {});
+    else if (auto place = inside && _inspection ? _inspection->whyUnsearched(path) : std::nullopt)
+        way.end("place", path, std::move(place->text), std::move(place->remedy));
     else if (inside)
         way.end("place", next, inside->inside, inside->insideRemedy);
     else

@@ -109,6 +109,3 @@ private:
     std::vector<OBMediaGroupRef> _found GUARDED_BY(_lock);
     std::size_t _reached GUARDED_BY(_lock) = 0;
 };
-
-/// The folder in an event in which its clips lie.
-inline constexpr std::string_view clipsFolder = "Original Media";

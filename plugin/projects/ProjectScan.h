@@ -23,9 +23,6 @@ struct ProjectScan {
     OBImageRef emptyProjectIcon;
 };
 
-/// The folder in a project in which its shared movies lie.
-inline constexpr std::string_view sharedItemsFolder = "Shared Items";
-
 /// What is in a project's folder of shared movies that is a movie, in listing order.
 struct SharedMovies {
     explicit SharedMovies(const platform::Text& path)

@@ -125,15 +125,6 @@ TEST_CASE("an extension that no project movie has is named, and only its case is
         "give it the extension mov, m4v, mp4 or 3gp");
 }
 
-TEST_CASE("what lies beside the movies of a project is told where movies belong")
-{
-    ExplainedMachine machine;
-    machine.projects.project("Trip").file("loose.mov");
-    const ExplainAnswer answer = machine.answer(machine.projects.path("Trip/loose.mov"));
-    checkUnlisted(answer, "place", "of a project only the movies directly in its folder \"Shared Items\" are listed",
-        "move it into the project's folder \"Shared Items\", with the extension mov, m4v, mp4 or 3gp");
-}
-
 TEST_CASE("a link that leads nowhere is told so in either library")
 {
     ExplainedMachine machine;

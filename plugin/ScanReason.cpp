@@ -37,6 +37,20 @@ const ScanRule* ruleOfMarked(const FileSystem& fileSystem, std::string_view fold
     return nullptr;
 }
 
+const ScanRule& otherThan(const ScanRule& rule)
+{
+    return &rule == &rules::hasEventMarker ? rules::hasProjectMarker : rules::hasEventMarker;
+}
+
+/// Of what is an event or project, by `rule`, in a library for the other, or lies in one. It begins with `subject`.
+ScanReason reasonOfOtherLibrary(const ScanRule& rule, const std::string& subject, const std::string& whatToMove)
+{
+    const std::string library = "\"" + std::string(rule.library) + "\"";
+    return { subject + withArticle(rule) + ", and " + std::string(rule.name) + "s are looked for in folders called "
+            + library,
+        "move " + whatToMove + " into a folder " + library };
+}
+
 /// Of what is a project or an event by the rule `inner` and lies in another, which is one by `outer`.
 ScanReason reasonOfNested(const ScanRule& inner, const ScanRule& outer, const std::string& subject)
 {
@@ -45,6 +59,17 @@ ScanReason reasonOfNested(const ScanRule& inner, const ScanRule& outer, const st
     return { subject + " is " + withArticle(inner) + " that lies in " + withArticle(outer)
             + ", where none is looked for",
         "move " + subject + place };
+}
+
+/// Whether `path` stands in an event, or directly in one of the folders in it.
+bool liesInEvent(const FileSystem& fileSystem, std::string_view path)
+{
+    const std::string_view folder = platform::pathByRemovingLastComponent(path);
+    for (const std::string_view event : { folder, platform::pathByRemovingLastComponent(folder) }) {
+        if (fileSystem.exists(platform::pathJoined(event, rules::hasEventMarker.marker)))
+            return true;
+    }
+    return false;
 }
 
 bool isFolder(const FileSystem& fileSystem, std::string_view path)
@@ -66,6 +91,8 @@ ScanReason scanReason(
         if (item.kind == ItemKind::symbolicLink && !fileSystem.exists(path))
             return { "it is a symbolic link that leads nowhere", rule.remedyOfDeadLink };
     }
+    if (&rule == &rules::isContainer && liesInEvent(fileSystem, path))
+        return reasonOfOtherLibrary(rules::hasEventMarker, "it lies in ", "the event");
     ScanReason reason = rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
     if (const std::string name = rules::nameWithLowerCaseExtension(item.name); &rule == &rules::hasMovieExtension
         && !name.empty()
@@ -108,6 +135,8 @@ ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, co
     }
     if (fileSystem.linkStatus(marker))
         return { "its " + std::string(rule.marker) + " is a symbolic link that leads nowhere", rule.failure.remedy };
+    if (const ScanRule& other = otherThan(rule); fileSystem.exists(platform::pathJoined(path, other.marker)))
+        return reasonOfOtherLibrary(other, "it is ", "it");
     return rule.failure;
 }
 

@@ -63,3 +63,18 @@ TEST_CASE("what lies in a movie that is a folder is to move out of it")
     checkUnlisted(machine.answer(trip.moviePath("a.mov/part.mov")), "place",
         "a movie is not looked into, even if it is a folder", "move it into the folder \"Shared Items\" itself");
 }
+
+TEST_CASE("a project among events, and an event among projects, are told where they belong")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip = machine.events.project("Trip").movie("a.mov");
+    checkUnlisted(machine.answer(trip.path()), "event",
+        "it is a project, and projects are looked for in folders called \"Montaro Projects\"",
+        "move it into a folder \"Montaro Projects\"");
+    const BundleBuilder coast = machine.projects.event("Coast").movie("a.mov");
+    CHECK(machine.answer(coast.path()).listed); // as a folder
+    for (const std::string& path : { coast.moviePath("a.mov"), coast.path() + "/CurrentVersion.mtrevent" })
+        checkUnlisted(machine.answer(path), "folder",
+            "it lies in an event, and events are looked for in folders called \"Montaro Events\"",
+            "move the event into a folder \"Montaro Events\"");
+}

@@ -14,6 +14,10 @@ namespace {
 constexpr ScanFailure folderIsClosed { "its folder may be listed but not searched, so nothing is known of it",
     "permit searching its folder (chmod +x)" };
 
+/// Of a folder among the movies of a project. With a movie's extension it would be listed as one that nobody can play.
+constexpr ScanFailure folderAmongMovies { "it is a folder, and movies in it are not looked for",
+    "move the movies in it one folder up" };
+
 std::string lowerCase(std::string_view text)
 {
     std::string lower(text);
@@ -93,6 +97,10 @@ ScanReason scanReason(
     }
     if (&rule == &rules::isContainer && liesInEvent(fileSystem, path))
         return reasonOfOtherLibrary(rules::hasEventMarker, "it lies in ", "the event");
+    if (&rule == &rules::hasMovieExtension && isFolder(fileSystem, path)) {
+        const ScanRule* marked = ruleOfMarked(fileSystem, path);
+        return marked ? reasonOfNested(*marked, rules::hasProjectMarker, "it") : ScanReason(folderAmongMovies);
+    }
     ScanReason reason = rule.failureOf ? rule.failureOf(item) : ScanReason(rule.failure);
     if (const std::string name = rules::nameWithLowerCaseExtension(item.name); &rule == &rules::hasMovieExtension
         && !name.empty()

@@ -78,3 +78,16 @@ TEST_CASE("a project among events, and an event among projects, are told where t
             "it lies in an event, and events are looked for in folders called \"Montaro Events\"",
             "move the event into a folder \"Montaro Events\"");
 }
+
+TEST_CASE("a folder among the movies of a project is not advised to look like a movie")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip = machine.projects.project("Trip").movie("a.mov");
+    machine.projects.folder("Trip/Shared Items/Day 1").folder("Trip/Shared Items/Day 2.MOV");
+    const BundleBuilder inner = machine.projects.project("Trip/Shared Items/Inner");
+    for (const char* name : { "Day 1", "Day 2.MOV" })
+        checkUnlisted(machine.answer(trip.moviePath(name)), "extension",
+            "it is a folder, and movies in it are not looked for", "move the movies in it one folder up");
+    checkUnlisted(machine.answer(inner.path()), "extension",
+        "it is a project that lies in a project, where none is looked for", "move it out of the project that holds it");
+}

@@ -56,14 +56,16 @@ OBScanDecision findings::searchedLibrary(
     return decision;
 }
 
-OBScanDecision findings::listedFolder(std::string_view path, const platform::FolderListing& listing)
+OBScanDecision findings::listedFolder(
+    std::string_view path, const platform::FolderListing& listing, std::string_view remedyOfMissing)
 {
     if (listing.problem() == FileProblem::none || !listing.empty())
         return finding("listing", path, "it holds " + entriesText(listing.size()));
     const std::string problem(platform::textOfFileProblem(listing.problem()));
     OBScanDecision decision = finding("listing", path, "what it holds is not listed: " + problem);
-    decision.inside = "the folder that holds it cannot be listed: " + problem;
-    decision.insideRemedy = remedyOfProblem(listing.problem(), "the folder that holds it");
+    decision.inside = "it cannot be listed: " + problem;
+    decision.insideRemedy = listing.problem() == FileProblem::missing ? std::string(remedyOfMissing)
+                                                                      : remedyOfProblem(listing.problem(), "it");
     return decision;
 }
 

@@ -14,8 +14,9 @@ namespace findings {
 OBScanDecision searchedLibrary(
     std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome);
 
-/// A folder was listed, or could not be.
-OBScanDecision listedFolder(std::string_view path, const platform::FolderListing& listing);
+/// A folder was listed, or could not be, which keeps out what lies in it.
+OBScanDecision listedFolder(std::string_view path, const platform::FolderListing& listing,
+    std::string_view remedyOfMissing = "create the folder, or mount its volume");
 
 /// An item is no project, for a reason of its marker, and is looked at further: it may be an ordinary folder.
 OBScanDecision noProject(std::string_view path, std::string_view reason);

@@ -19,6 +19,12 @@ namespace {
         return { std::string(decision.rule), decision.path, decision.passed, decision.text };
     }
 
+    /// Whether a folder could not be listed. It may be in the tree all the same; what lies in it is not.
+    bool isUnlisted(const OBScanDecision& decision)
+    {
+        return decision.rule == "listing" && !decision.inside.empty();
+    }
+
     /// `path` below `folder`, cut after its first component there.
     std::string firstBelow(std::string_view folder, std::string_view path)
     {
@@ -136,6 +142,10 @@ Explainer::Way Explainer::wayThrough(std::size_t library, const std::string& pat
         return wayToRecord(met, path);
     Way way;
     for (const OBScanDecision* decision : met) {
+        if (isUnlisted(*decision) && decision->path != path) {
+            way.end(decision->rule, decision->path, decision->inside, decision->insideRemedy);
+            return way;
+        }
         way.steps.push_back(stepOf(*decision));
         if (!decision->passed) {
             way.remedy = decision->remedy;
@@ -176,7 +186,7 @@ void Explainer::endAt(Way& way, const Decisions& met, const std::string& path) c
         wasReached = true;
         if (!decision->itself.empty())
             itself = &decision->itself;
-        if (!decision->inside.empty() && decision->rule == "listing")
+        if (isUnlisted(*decision))
             unlisted = decision;
     }
     if (!wasReached)
@@ -202,9 +212,7 @@ void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path
     }
     const std::string missing = firstMissing(folder, path);
     const std::string next = firstBelow(folder, path);
-    if (inside && inside->rule == "listing")
-        way.end("listing", next, inside->inside, inside->insideRemedy);
-    else if (!missing.empty() && _fileSystem.isOutOfReach(missing))
+    if (!missing.empty() && _fileSystem.isOutOfReach(missing))
         way.end("existence", missing, "a folder that it lies in may not be searched, so nothing is known of it",
             "permit searching its folder (chmod +x)");
     else if (!missing.empty())

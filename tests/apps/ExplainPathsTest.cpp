@@ -128,8 +128,11 @@ TEST_CASE("a search folder shows what it holds, and one that is missing is told 
     checkUnlisted(
         machine.answer(machine.projects.path()), "record", "a search folder shows what it holds, not itself", "null");
     checkUnlisted(machine.answer("/Volumes/Stick/Montaro Projects"), "existence", "nothing is there", "null");
-    checkUnlisted(machine.answer("/Volumes/Stick/Montaro Projects/Trip"), "listing",
-        "the folder that holds it cannot be listed: it does not exist", "null");
+    const ExplainAnswer inside = machine.answer("/Volumes/Stick/Montaro Projects/Trip");
+    checkUnlisted(
+        inside, "listing", "it cannot be listed: it does not exist", "create the folder, or mount its volume");
+    CHECK(inside.rules == std::vector<std::string> { "search folder", "listing" });
+    CHECK(inside.lastPath == "/Volumes/Stick/Montaro Projects");
 }
 
 TEST_CASE("what is not there is told by the first rule that meets it")

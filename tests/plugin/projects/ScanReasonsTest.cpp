@@ -160,8 +160,8 @@ TEST_CASE("a folder of projects that may be neither searched nor listed says so 
              "taken for no project"),
             "folder | it is a folder",
             "package | it is a plain folder",
-            ("listing | what it holds is not listed: permission denied | the folder that holds it cannot be listed: "
-             "permission denied | permit reading the folder that holds it (chmod u+rx)"),
+            ("listing | what it holds is not listed: permission denied | it cannot be listed: permission denied"
+             " | permit reading it (chmod u+rx)"),
         });
 }
 

@@ -1,11 +1,14 @@
 #include "plugin/ScanFindings.h"
 
+#include "plugin/ScanReason.h"
+
 #include "platform/FileProblemText.h"
 #include "platform/PathText.h"
 
 #include <string>
 
 using platform::FileProblem;
+using platform::FileSystem;
 
 namespace {
 
@@ -31,13 +34,13 @@ OBScanDecision finding(std::string_view rule, std::string_view path, std::string
     return decision;
 }
 
-std::string remedyOfProblem(FileProblem problem, std::string_view folder)
+std::string remedyOfProblem(const FileSystem& fileSystem, FileProblem problem, std::string_view path)
 {
     switch (problem) {
     case FileProblem::notPermitted:
-        return "permit reading " + std::string(folder) + " (chmod u+rx)";
+        return remedyOfPermission(fileSystem, path);
     case FileProblem::pathTooLong:
-        return "move " + std::string(folder) + " to a place with a shorter path";
+        return "move it to a place with a shorter path";
     default:
         return {};
     }
@@ -56,16 +59,17 @@ OBScanDecision findings::searchedLibrary(
     return decision;
 }
 
-OBScanDecision findings::listedFolder(
-    std::string_view path, const platform::FolderListing& listing, std::string_view remedyOfMissing)
+OBScanDecision findings::listedFolder(const FileSystem& fileSystem, std::string_view path,
+    const platform::FolderListing& listing, std::string_view remedyOfMissing)
 {
     if (listing.problem() == FileProblem::none || !listing.empty())
         return finding("listing", path, "it holds " + entriesText(listing.size()));
     const std::string problem(platform::textOfFileProblem(listing.problem()));
     OBScanDecision decision = finding("listing", path, "what it holds is not listed: " + problem);
     decision.inside = "it cannot be listed: " + problem;
-    decision.insideRemedy = listing.problem() == FileProblem::missing ? std::string(remedyOfMissing)
-                                                                      : remedyOfProblem(listing.problem(), "it");
+    decision.insideRemedy = listing.problem() == FileProblem::missing
+        ? std::string(remedyOfMissing)
+        : remedyOfProblem(fileSystem, listing.problem(), path);
     return decision;
 }
 
@@ -88,7 +92,8 @@ OBScanDecision findings::clipsFolder(std::string_view path, std::size_t entries)
     return decision;
 }
 
-OBScanDecision findings::eventWithoutClipsFolder(std::string_view path, FileProblem problem)
+OBScanDecision findings::eventWithoutClipsFolder(
+    const FileSystem& fileSystem, std::string_view path, std::string_view clips, FileProblem problem)
 {
     const bool isMissing = problem == FileProblem::missing || problem == FileProblem::notAFolder;
     OBScanDecision decision = finding("clips folder", path,
@@ -97,9 +102,8 @@ OBScanDecision findings::eventWithoutClipsFolder(std::string_view path, FileProb
             ? "its folder \"Original Media\" is empty"
             : "its folder \"Original Media\" cannot be listed: " + std::string(platform::textOfFileProblem(problem)));
     decision.passed = false;
-    decision.remedy = problem == FileProblem::none || isMissing
-        ? "put its clips into a folder \"Original Media\""
-        : remedyOfProblem(problem, "its folder \"Original Media\"");
+    decision.remedy = problem == FileProblem::none || isMissing ? "put its clips into a folder \"Original Media\""
+                                                                : remedyOfProblem(fileSystem, problem, clips);
     return decision;
 }
 

@@ -15,7 +15,8 @@ OBScanDecision searchedLibrary(
     std::string_view path, std::string_view what, std::size_t index, std::size_t count, bool isInHome);
 
 /// A folder was listed, or could not be, which keeps out what lies in it.
-OBScanDecision listedFolder(std::string_view path, const platform::FolderListing& listing,
+OBScanDecision listedFolder(const platform::FileSystem& fileSystem, std::string_view path,
+    const platform::FolderListing& listing,
     std::string_view remedyOfMissing = "create the folder, or mount its volume");
 
 /// An item is no project, for a reason of its marker, and is looked at further: it may be an ordinary folder.
@@ -25,8 +26,9 @@ OBScanDecision noProject(std::string_view path, std::string_view reason);
 OBScanDecision moviesFolder(std::string_view path, std::size_t entries);
 OBScanDecision clipsFolder(std::string_view path, std::size_t entries);
 
-/// An event is left out, since its folder of clips, or what lies in it, gives none.
-OBScanDecision eventWithoutClipsFolder(std::string_view path, platform::FileProblem problem);
+/// An event is left out, since its folder of clips, which would be at `clips`, or what lies in it, gives none.
+OBScanDecision eventWithoutClipsFolder(const platform::FileSystem& fileSystem, std::string_view path,
+    std::string_view clips, platform::FileProblem problem);
 OBScanDecision eventWithoutClips(std::string_view path);
 
 /// A link leads to what becomes the clip, whether or not anything is there.

@@ -1,5 +1,6 @@
 #include "plugin/ScanReason.h"
 
+#include "platform/ForbiddingFolder.h"
 #include "platform/PathText.h"
 
 #include <algorithm>
@@ -11,8 +12,7 @@ using platform::ItemKind;
 namespace {
 
 /// Of an item that could be named but not looked at, so that no rule about its kind says anything.
-constexpr ScanFailure folderIsClosed { "its folder may be listed but not searched, so nothing is known of it",
-    "permit searching its folder (chmod +x)" };
+constexpr std::string_view folderIsClosed = "its folder may be listed but not searched, so nothing is known of it";
 
 /// Of a folder among the movies of a project. With a movie's extension it would be listed as one that nobody can play.
 constexpr ScanFailure folderAmongMovies { "it is a folder, and movies in it are not looked for",
@@ -91,7 +91,7 @@ ScanReason scanReason(
         return reasonOfMarker(fileSystem, rule, path);
     if (!rule.remedyOfDeadLink.empty()) {
         if (fileSystem.isOutOfReach(path))
-            return folderIsClosed;
+            return { folderIsClosed, remedyOfPermission(fileSystem, path) };
         if (item.kind == ItemKind::symbolicLink && !fileSystem.exists(path))
             return { "it is a symbolic link that leads nowhere", rule.remedyOfDeadLink };
     }
@@ -108,6 +108,18 @@ ScanReason scanReason(
         reason.remedy
             = "give it another name, one that is free and ends in ." + std::string(platform::extensionOfName(name));
     return reason;
+}
+
+std::string remedyOfPermission(const FileSystem& fileSystem, std::string_view path)
+{
+    std::string word;
+    for (const char letter : platform::folderThatForbids(fileSystem, path)) {
+        if (letter == '\'')
+            word += "'\\''";
+        else
+            word += letter;
+    }
+    return "permit reading: chmod u+rx '" + word + "'";
 }
 
 ScanReason reasonInside(
@@ -136,10 +148,11 @@ ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, co
 {
     const std::string marker = platform::pathJoined(path, rule.marker);
     if (fileSystem.isOutOfReach(marker)) {
+        const std::string remedy = remedyOfPermission(fileSystem, marker);
         const std::string unknown = ", so whether it holds " + std::string(rule.marker) + " is not known";
         if (fileSystem.isOutOfReach(path))
-            return { "its folder may be listed but not searched" + unknown, folderIsClosed.remedy };
-        return { "it may not be searched" + unknown, "permit searching it (chmod +x)" };
+            return { "its folder may be listed but not searched" + unknown, remedy };
+        return { "it may not be searched" + unknown, remedy };
     }
     if (fileSystem.linkStatus(marker))
         return { "its " + std::string(rule.marker) + " is a symbolic link that leads nowhere", rule.failure.remedy };

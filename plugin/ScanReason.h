@@ -11,6 +11,9 @@
 ScanReason scanReason(const platform::FileSystem& fileSystem, const ScanRule& rule, const platform::FolderItem& item,
     const std::string& path);
 
+/// What permits reading `path`, as a command for a shell.
+std::string remedyOfPermission(const platform::FileSystem& fileSystem, std::string_view path);
+
 /// Why `path`, in `folder`, is nothing by itself: the folder passes `rule`, one for a marker, and no rule speaks of
 /// `path`.
 ScanReason reasonInside(

@@ -5,7 +5,9 @@
 
 #include "apps/ombrix/Explanation.h"
 
+#include "apps/ombrix/ShellWord.h"
 #include "host/OBSourceInspection.h"
+#include "platform/ForbiddingFolder.h"
 #include "platform/PathText.h"
 
 #include <algorithm>
@@ -214,7 +216,7 @@ void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path
     const std::string next = firstBelow(folder, path);
     if (!missing.empty() && _fileSystem.isOutOfReach(missing))
         way.end("existence", missing, "a folder that it lies in may not be searched, so nothing is known of it",
-            "permit searching its folder (chmod +x)");
+            "permit reading: chmod u+rx " + shellWord(platform::folderThatForbids(_fileSystem, missing)));
     else if (!missing.empty())
         way.end("existence", missing, "nothing is there", {});
     else if (auto place = inside && _inspection ? _inspection->whyUnsearched(path) : std::nullopt)

@@ -131,7 +131,7 @@ OBMediaGroupRef OBMontaroPlugin::eventsInFolder(const Text& path, const EventSca
     if (!path)
         return nullptr;
     const FolderListing listing = listFolder(path, libraryListing);
-    scan.report.found([&] { return findings::listedFolder(path, listing); });
+    scan.report.found([&] { return findings::listedFolder(platform().fileSystem, path, listing); });
     if (listing.empty())
         return nullptr;
     OBMediaGroupRef carrier = makeGroup(OBMontaroEventLibraryGroupTypeIdentifier,
@@ -172,7 +172,9 @@ OBMediaGroupRef OBMontaroPlugin::finishedEvent(const FoundFolder& found, const R
     const EventClips& clips = read.clips;
     noteFolderRead(clips.folder, clips.problem);
     if (!read.group) {
-        scan.report.keptOut([&] { return findings::eventWithoutClipsFolder(found.path, clips.problem); });
+        scan.report.keptOut([&] {
+            return findings::eventWithoutClipsFolder(platform().fileSystem, found.path, clips.folder, clips.problem);
+        });
         return nullptr;
     }
     read.group->setMediaObjects(clips.clips);

@@ -130,12 +130,12 @@ OBMediaGroupRef OBMontaroPlugin::projectsInFolder(const Text& path, const Projec
         listing.folderStatus() ? std::optional(listing.folderStatus()->modificationDate)
                                : OBMediaGroup::modDateForFile(path) });
     if (listing.problem() != FileProblem::none && platform::extensionOfName(name) == localizedExtension) {
-        scan.report.found([&] { return findings::listedFolder(path, listing); });
+        scan.report.found([&] { return findings::listedFolder(platform().fileSystem, path, listing); });
         listed = Text(path.view().substr(0, path.size() - localizedExtension.size() - 1));
         listing = listFolder(listed, projectListing);
     }
 
-    scan.report.found([&] { return findings::listedFolder(listed, listing); });
+    scan.report.found([&] { return findings::listedFolder(platform().fileSystem, listed, listing); });
     for (const FolderItem item : listing) {
         if (!scan.report.passes(rules::nameIsNotHidden, item, listed)
             || !scan.report.passes(rules::isVisible, item, listed))

@@ -47,8 +47,10 @@ SharedMovies sharedMoviesOfProject(OBMediaManager& manager, const ScanReport& re
     movies.listing = manager.listFolder(movies.folder(), {});
     movies.project.pathIsReal = movies.listing.pathIsReal();
     if (movies.listing.empty())
-        report.found(
-            [&] { return findings::listedFolder(movies.folder(), movies.listing, "share the project in Montaro"); });
+        report.found([&] {
+            return findings::listedFolder(
+                manager.platform().fileSystem, movies.folder(), movies.listing, "share the project in Montaro");
+        });
     movies.take(report, movies.listing);
     return movies;
 }

@@ -150,7 +150,7 @@ TEST_CASE("nothing is claimed of a path in a folder that may not be searched")
     CHECK(explanation.steps.back().rule == "existence");
     CHECK(explanation.steps.back().path == library + "/a");
     CHECK(explanation.steps.back().text == "a folder that it lies in may not be searched, so nothing is known of it");
-    CHECK(explanation.remedy == "permit searching its folder (chmod +x)");
+    CHECK(explanation.remedy == "permit reading: chmod u+rx " + library);
     explanation = explanationOf(record, path, real);
     CHECK(explanation.steps.back().text == "nothing is there");
     folder.file("lib/a/b");

@@ -47,6 +47,12 @@ void closeBelow(SourceMachine& machine, const std::string& folder)
     };
 }
 
+/// A bar, and the remedy for a folder that may not be read.
+std::string permitting(const std::string& folder)
+{
+    return " | permit reading: chmod u+rx '" + folder + "'";
+}
+
 LibraryBuilder eventsOf(const SourceMachine& machine)
 {
     return LibraryBuilder(machine.disk.path("home/Movies/Montaro Events"));
@@ -109,7 +115,7 @@ TEST_CASE("what lies in a folder that may be listed but not searched is told by 
             { "PROJECTS/Open/notes.txt", "it is neither a project nor a folder | " },
             { "PROJECTS/Trip/CurrentVersion",
                 "its folder may be listed but not searched, so nothing is known of it"
-                " | permit searching its folder (chmod +x)" },
+                    + permitting(library.path("Trip")) },
         });
 }
 
@@ -124,7 +130,7 @@ TEST_CASE("an event that may not be searched is not said to lack its marker")
         == std::map<std::string, std::string> {
             { prefix + "/Closed",
                 "it may not be searched, so whether it holds CurrentVersion.mtrevent is not known"
-                " | permit searching it (chmod +x)" },
+                    + permitting(library.path("Closed")) },
             { prefix + "/Open", "it holds no CurrentVersion.mtrevent | open the event in Montaro, which marks it" },
         });
 }
@@ -139,7 +145,7 @@ TEST_CASE("in a library that may be listed but not searched nothing is said of a
         == std::map<std::string, std::string> {
             { machine.abbreviated(library.path("Coast")),
                 "its folder may be listed but not searched, so whether it holds CurrentVersion.mtrevent is not known"
-                " | permit searching its folder (chmod +x)" },
+                    + permitting(library.path()) },
         });
 }
 
@@ -160,8 +166,8 @@ TEST_CASE("a folder of projects that may be neither searched nor listed says so 
              "taken for no project"),
             "folder | it is a folder",
             "package | it is a plain folder",
-            ("listing | what it holds is not listed: permission denied | it cannot be listed: permission denied"
-             " | permit reading it (chmod u+rx)"),
+            "listing | what it holds is not listed: permission denied | it cannot be listed: permission denied"
+                + permitting(path),
         });
 }
 
@@ -175,8 +181,7 @@ TEST_CASE("an event whose folder of clips cannot be listed is left out for that"
     CHECK(reasonsIn(machine)
         == std::map<std::string, std::string> {
             { machine.abbreviated(library.path("Coast")),
-                "its folder \"Original Media\" cannot be listed: permission denied"
-                " | permit reading its folder \"Original Media\" (chmod u+rx)" },
+                "its folder \"Original Media\" cannot be listed: permission denied" + permitting(clips) },
         });
 }
 
@@ -191,4 +196,18 @@ TEST_CASE("a folder that stands in for one that cannot be listed is told of belo
     CHECK(decisionsOn(machine, path).back().starts_with("listing | what it holds is not listed: permission denied"));
     const std::vector<std::string> standIn = decisionsOn(machine, library.path("Area"));
     CHECK(std::count(standIn.begin(), standIn.end(), "listing | it holds 1 entry") == 2);
+}
+
+TEST_CASE("of a library that may not be reached the folder that forbids it is named")
+{
+    SourceMachine machine;
+    const std::string library = machine.projects().path();
+    const std::string closed = machine.disk.path("home/Movies");
+    closeBelow(machine, closed);
+    machine.files.whenListing = [closed](std::string_view folder) {
+        return folder.starts_with(closed) ? FileProblem::notPermitted : FileProblem::none;
+    };
+    CHECK(decisionsOn(machine, library).back()
+        == "listing | what it holds is not listed: permission denied | it cannot be listed: permission denied"
+            + permitting(closed));
 }

@@ -21,6 +21,14 @@ namespace {
         return { std::string(decision.rule), decision.path, decision.passed, decision.text };
     }
 
+    /// `remedy` to whoever asks about `path`: "it" is what decided, and is named where that is a folder around the path.
+    std::string remedyFor(const std::string& path, const std::string& decided, const std::string& remedy)
+    {
+        if (path == decided || remedy.find(" it") == std::string::npos)
+            return remedy;
+        return std::string(platform::lastPathComponent(decided)) + ": " + remedy;
+    }
+
     /// Whether a folder could not be listed. It may be in the tree all the same; what lies in it is not.
     bool isUnlisted(const OBScanDecision& decision)
     {
@@ -145,12 +153,13 @@ Explainer::Way Explainer::wayThrough(std::size_t library, const std::string& pat
     Way way;
     for (const OBScanDecision* decision : met) {
         if (isUnlisted(*decision) && decision->path != path) {
-            way.end(decision->rule, decision->path, decision->inside, decision->insideRemedy);
+            way.end(decision->rule, decision->path, decision->inside,
+                remedyFor(path, decision->path, decision->insideRemedy));
             return way;
         }
         way.steps.push_back(stepOf(*decision));
         if (!decision->passed) {
-            way.remedy = decision->remedy;
+            way.remedy = remedyFor(path, decision->path, decision->remedy);
             return way;
         }
     }

@@ -129,8 +129,8 @@ TEST_CASE("a search folder shows what it holds, and one that is missing is told 
         machine.answer(machine.projects.path()), "record", "a search folder shows what it holds, not itself", "null");
     checkUnlisted(machine.answer("/Volumes/Stick/Montaro Projects"), "existence", "nothing is there", "null");
     const ExplainAnswer inside = machine.answer("/Volumes/Stick/Montaro Projects/Trip");
-    checkUnlisted(
-        inside, "listing", "it cannot be listed: it does not exist", "create the folder, or mount its volume");
+    checkUnlisted(inside, "listing", "it cannot be listed: it does not exist",
+        "Montaro Projects: create the folder, or mount its volume");
     CHECK(inside.rules == std::vector<std::string> { "search folder", "listing" });
     CHECK(inside.lastPath == "/Volumes/Stick/Montaro Projects");
 }

@@ -43,7 +43,8 @@ TEST_CASE("a name with a full stop first is hidden, and so is all that lies belo
     const std::string remedy = "rename it so that its name does not begin with a full stop";
     for (const char* path : { ".old", ".old/Shared Items/a.mov", ".old/no/such/thing" }) {
         const ExplainAnswer answer = machine.answer(machine.projects.path(path));
-        checkUnlisted(answer, "hidden name", "its name begins with a full stop", remedy);
+        const bool isItself = answer.path == answer.lastPath;
+        checkUnlisted(answer, "hidden name", "its name begins with a full stop", isItself ? remedy : ".old: " + remedy);
         CHECK(answer.lastPath == machine.projects.path(".old"));
     }
 }
@@ -63,7 +64,7 @@ TEST_CASE("a package is not looked into")
     machine.projects.project("Some.app/Trip");
     const ExplainAnswer answer = machine.answer(machine.projects.path("Some.app/Trip"));
     checkUnlisted(answer, "package", "its extension makes it a package, which is shown as one file and not looked into",
-        "remove its extension");
+        "Some.app: remove its extension");
 }
 
 TEST_CASE("a folder of events without the marker file is no event")
@@ -71,7 +72,7 @@ TEST_CASE("a folder of events without the marker file is no event")
     ExplainedMachine machine;
     machine.events.file("Coast/Original Media/a.mov");
     checkUnlisted(machine.answer(machine.events.path("Coast/Original Media/a.mov")), "event",
-        "it holds no CurrentVersion.mtrevent", "open the event in Montaro, which marks it");
+        "it holds no CurrentVersion.mtrevent", "Coast: open the event in Montaro, which marks it");
 }
 
 TEST_CASE("a marker that leads nowhere is told from one that is missing")
@@ -143,7 +144,7 @@ TEST_CASE("a link to an event is not followed")
     store.event("Coast").movieWithBytes("a.mov", "clip");
     machine.events.link("Coast", store.path("Coast"));
     checkUnlisted(machine.answer(machine.events.path("Coast/Original Media/a.mov")), "folder",
-        "it is a symbolic link, and no link is taken for an event", "put what it leads to in its place");
+        "it is a symbolic link, and no link is taken for an event", "Coast: put what it leads to in its place");
 }
 
 TEST_CASE("a folder among the clips is not entered, nor a link to one")

@@ -1,7 +1,7 @@
 // An explanation in columns: number, verdict, rule, path, and what was found there.
 //
 // The one surprise: each path is told by what it adds to the one before, and not again while it stays the same. A
-// terminal that is too narrow for two columns gets the findings below the paths.
+// terminal that is too narrow for two columns gets the findings below the paths, or below the rules.
 
 #include "apps/ombrix/ExplanationText.h"
 
@@ -11,6 +11,8 @@
 #include "platform/PathText.h"
 
 #include <algorithm>
+#include <climits>
+#include <utility>
 #include <vector>
 
 namespace ombrix {
@@ -75,13 +77,14 @@ namespace {
             }
             const int textColumn = _pathColumn + _pathWidth + gap;
             _textIsBelow = program.columns() && *program.columns() - textColumn < leastTextWidth;
-            _textColumn = _textIsBelow ? _pathColumn : textColumn;
+            const bool isNarrow = _textIsBelow && *_program.columns() - _pathColumn < leastWidthBelow;
+            _textColumn = isNarrow ? ruleColumn + gap : _textIsBelow ? _pathColumn : textColumn;
         }
 
         void print() const
         {
             if (_wishes.namesPath)
-                _program.printLine(_style.bold(_style.name(abbreviated(_explanation.path)), linkTo(_explanation.path)));
+                printPath();
             if (_explanation.isListed())
                 printPlace(mainPlace(_explanation));
             else
@@ -96,8 +99,8 @@ namespace {
         static constexpr int numberWidth = 3;
         static constexpr int ruleColumn = numberWidth + 3 + gap;
         static constexpr int widestPath = 40;
-        static constexpr int leastPathWidth = 8;
         static constexpr int leastTextWidth = 40;
+        static constexpr int leastWidthBelow = 24;
 
         TextLine emptyLine() const { return { _style, _program.columns() }; }
 
@@ -106,25 +109,47 @@ namespace {
             _program.printWrapped(emptyLine().add(0, title, look), columnBehind(title), _style.name(text));
         }
 
+        /// Above the rest, whole: a terminal breaks it behind a slash where it can.
+        void printPath() const
+        {
+            const std::string path = _style.name(abbreviated(_explanation.path));
+            const int room = _program.columns().value_or(INT_MAX);
+            std::string line;
+            for (std::size_t start = 0, end = 0; start < path.size(); start = end) {
+                end = std::min(path.find('/', start), path.size() - 1) + 1;
+                const std::string part = path.substr(start, end - start);
+                if (!line.empty() && apps::displayWidth(line) + apps::displayWidth(part) > room)
+                    _program.printLine(_style.bold(std::exchange(line, {}), linkTo(_explanation.path)));
+                line += part;
+            }
+            _program.printLine(_style.bold(line, linkTo(_explanation.path)));
+        }
+
         void printPlace(const TreePlace& place) const
         {
             const int column = columnBehind(listedTitle);
-            TextLine line = emptyLine();
-            line.add(0, listedTitle, TextLine::Look::bold);
+            const TextLine title = emptyLine().add(0, listedTitle, TextLine::Look::bold);
+            const std::string groupName = _style.name(place.group->name());
             const std::string kind(kindOfGroup(*place.group));
+            std::string whole = kind + " " + groupName;
+            TextLine line = title;
             if (place.object) {
                 const bool isClip = place.group->typeIdentifier() == OBMontaroEventGroupTypeIdentifier;
-                line.add(column, isClip ? "clip \"" : "movie \"");
-                line.addBehind(
-                    _style.name(place.object->name()), TextLine::Look::bold, linkTo(place.object->path().view()));
+                const std::string before = isClip ? "clip \"" : "movie \"";
+                const std::string name = _style.name(place.object->name());
+                line.add(column, before);
+                line.addBehind(name, TextLine::Look::bold, linkTo(place.object->path().view()));
                 line.addBehind("\" of the " + kind + " ");
+                whole = before + name + "\" of the " + whole;
             } else {
                 line.add(column, kind + " ");
             }
             const platform::Text path = place.group->path();
-            line.addBehind(
-                _style.name(place.group->name()), TextLine::Look::bold, path ? linkTo(path.view()) : std::string());
-            _program.printLine(line.text());
+            line.addBehind(groupName, TextLine::Look::bold, path ? linkTo(path.view()) : std::string());
+            if (_program.columns() && column + apps::displayWidth(whole) > *_program.columns())
+                _program.printWrapped(title, column, whole);
+            else
+                _program.printLine(line.text());
             _program.printWrapped(emptyLine(), column, _style.name(breadcrumbs(place)), TextLine::Look::dim);
         }
 
@@ -152,7 +177,7 @@ namespace {
 
         void printFinding(TextLine& line, const std::string& path, const std::string& text) const
         {
-            if (!path.empty() && _textIsBelow) {
+            if (_textIsBelow && (!path.empty() || _textColumn < _pathColumn)) {
                 _program.printLine(line.addName(_pathColumn, path).text());
                 _program.printWrapped(emptyLine(), _textColumn, text, TextLine::Look::dim);
                 return;
@@ -165,14 +190,17 @@ namespace {
         /// What decides was said above the steps.
         void printDeciding(TextLine& line, const std::string& path) const
         {
-            const int room = _textIsBelow
-                ? std::max(leastPathWidth, *_program.columns() - _pathColumn - columnBehind(decidesMark))
-                : _pathWidth;
-            if (!path.empty())
-                line.add(_pathColumn, cutTo(room, path));
-            const int column
-                = _textIsBelow ? _pathColumn + std::min(room, apps::displayWidth(path)) + gap : _textColumn;
-            _program.printLine(line.addWhole(path.empty() ? _textColumn : column, decidesMark).text());
+            const int behindPath = _pathColumn + columnBehind(path);
+            if (path.empty() || !_textIsBelow) {
+                line.add(_pathColumn, cutTo(_pathWidth, path)).addWhole(_textColumn, decidesMark);
+            } else if (behindPath + apps::displayWidth(decidesMark) <= *_program.columns()) {
+                line.addName(_pathColumn, path).addWhole(behindPath, decidesMark);
+            } else {
+                _program.printLine(line.addName(_pathColumn, path).text());
+                _program.printLine(emptyLine().addWhole(_textColumn, decidesMark).text());
+                return;
+            }
+            _program.printLine(line.text());
         }
 
         std::string cutTo(int width, const std::string& path) const

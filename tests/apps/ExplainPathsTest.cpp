@@ -300,3 +300,22 @@ TEST_CASE("in a text the deciding rule is marked, its reason is whole, and lines
         CHECK_FALSE(contains(shown, "…"));
     }
 }
+
+TEST_CASE("on a narrow terminal what decides has its name, and what is listed is told whole")
+{
+    ExplainedMachine machine;
+    const BundleBuilder trip
+        = machine.projects.project("Trip to the harbour").movie("a long way.mov").movieWithBytes("Uppercase.MOV", "");
+    RunWishes wishes = machine.wishes(
+        { trip.moviePath("a long way.mov"), trip.moviePath("Uppercase.MOV"), "--color=never", "--hyperlink=never" });
+    TerminalWishes terminal;
+    terminal.columns = 40;
+    const std::string shown = runOnTerminal(wishes, terminal).output;
+    CAPTURE(shown);
+    CHECK(linesFit(shown, 40));
+    CHECK(contains(shown, "~/Movies/Montaro Projects/\nTrip to the harbour/Shared Items/\na long way.mov\n"));
+    CHECK(contains(shown, "\nlisted   movie \"a long way\" of the\n         project Trip to the harbour\n"));
+    CHECK(contains(shown, "\n  1 ok   search folder   ~/Movies/M…ects\n            home folder, 1st of 3 for\n"));
+    CHECK(contains(shown, "\n  4 ok   hidden file\n            no file .hidden names it\n"));
+    CHECK(contains(shown, "   Uppercase.MOV\n            ← decides\n"));
+}

@@ -18,6 +18,10 @@ constexpr std::string_view folderIsClosed = "its folder may be listed but not se
 constexpr ScanFailure folderAmongMovies { "it is a folder, and movies in it are not looked for",
     "move the movies in it one folder up" };
 
+/// Of a folder between the library and its events. To open it in the editor would not help.
+constexpr ScanFailure folderOfEvents { "it is no event, and events in it are not looked for",
+    "move the events in it one folder up" };
+
 std::string lowerCase(std::string_view text)
 {
     std::string lower(text);
@@ -71,6 +75,15 @@ bool liesInEvent(const FileSystem& fileSystem, std::string_view path)
     const std::string_view folder = platform::pathByRemovingLastComponent(path);
     for (const std::string_view event : { folder, platform::pathByRemovingLastComponent(folder) }) {
         if (fileSystem.exists(platform::pathJoined(event, rules::hasEventMarker.marker)))
+            return true;
+    }
+    return false;
+}
+
+bool holdsEvents(const FileSystem& fileSystem, std::string_view folder)
+{
+    for (const FolderItem item : fileSystem.itemsInFolder(folder, { .marker = rules::hasEventMarker.marker })) {
+        if (rules::hasEventMarker.passes(item))
             return true;
     }
     return false;
@@ -158,6 +171,8 @@ ScanReason reasonOfMarker(const FileSystem& fileSystem, const ScanRule& rule, co
         return { "its " + std::string(rule.marker) + " is a symbolic link that leads nowhere", rule.failure.remedy };
     if (const ScanRule& other = otherThan(rule); fileSystem.exists(platform::pathJoined(path, other.marker)))
         return reasonOfOtherLibrary(other, "it is ", "it");
+    if (&rule == &rules::hasEventMarker && holdsEvents(fileSystem, path))
+        return folderOfEvents;
     return rule.failure;
 }
 

@@ -91,3 +91,13 @@ TEST_CASE("a folder among the movies of a project is not advised to look like a 
     checkUnlisted(machine.answer(inner.path()), "extension",
         "it is a project that lies in a project, where none is looked for", "move it out of the project that holds it");
 }
+
+TEST_CASE("a folder between the library and its events is told that they belong one up")
+{
+    ExplainedMachine machine;
+    const BundleBuilder coast = machine.events.event("Sub/Coast").movie("a.mov");
+    const std::string reason = "it is no event, and events in it are not looked for";
+    checkUnlisted(machine.answer(machine.events.path("Sub")), "event", reason, "move the events in it one folder up");
+    checkUnlisted(
+        machine.answer(coast.moviePath("a.mov")), "event", reason, "Sub: move the events in it one folder up");
+}

@@ -214,7 +214,7 @@ private:
     EventScan newEventScan(MontaroFlatGroupList flatGroups);
     OBMediaGroupRef eventsInFolder(const platform::Text& path, const EventScan& scan);
     using EventFound = std::function<void(const OBMediaGroupRef& event)>;
-    OBMediaGroupRef finishedEvent(const FoundFolder& found, const ReadEvent& read, const EventScan& scan);
+    OBMediaGroupRef eventToShow(const FoundFolder& found, const ReadEvent& read, const EventScan& scan);
     ReadEvent readEvent(
         const platform::Text& library, const FoundFolder& folder, const EventScan& scan, const EventFound& found);
     ReadEvent readEventWith(ClipScratch& scratch, const platform::Text& library, const FoundFolder& folder,

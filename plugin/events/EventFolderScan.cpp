@@ -65,6 +65,15 @@ void setAttributesOfClips(OBMediaGroup& event, const ClipDates& dates, bool newe
     event.setAttributes(std::move(attributes));
 }
 
+void setClips(const ReadEvent& event, bool newestFirst)
+{
+    if (!event.group)
+        return;
+    event.group->setMediaObjects(event.clips.clips);
+    if (!event.clips.clips.empty())
+        setAttributesOfClips(*event.group, event.clips.dates, newestFirst);
+}
+
 } // namespace
 
 EventScan OBMontaroPlugin::newEventScan(MontaroFlatGroupList flatGroups)
@@ -146,10 +155,11 @@ OBMediaGroupRef OBMontaroPlugin::eventsInFolder(const Text& path, const EventSca
     const auto read = [&](std::size_t index) {
         events[index]
             = readEvent(path, folders[index], scan, [&](const OBMediaGroupRef& event) { shown.found(index, event); });
+        setClips(events[index], _mostRecentEventFirst);
+        shown.read(index);
     };
     const auto take = [&](std::size_t index) {
-        carrier->addChildGroup(finishedEvent(folders[index], std::exchange(events[index], {}), scan));
-        shown.reached(index + 1);
+        carrier->addChildGroup(eventToShow(folders[index], std::exchange(events[index], {}), scan));
     };
     if (scan.report.isObserved()) {
         // Whoever is told of decisions is told of them in their order.
@@ -163,9 +173,9 @@ OBMediaGroupRef OBMontaroPlugin::eventsInFolder(const Text& path, const EventSca
     return carrier;
 }
 
-/// An event with what was read of it; null when it has no clips. The flat list shows it all the same where its folder of
-/// clips holds anything at all.
-OBMediaGroupRef OBMontaroPlugin::finishedEvent(const FoundFolder& found, const ReadEvent& read, const EventScan& scan)
+/// The event of a folder that was read; null when it has no clips. The flat list shows it all the same where its folder
+/// of clips holds anything at all.
+OBMediaGroupRef OBMontaroPlugin::eventToShow(const FoundFolder& found, const ReadEvent& read, const EventScan& scan)
 {
     if (!read.isEvent)
         return nullptr;
@@ -177,12 +187,10 @@ OBMediaGroupRef OBMontaroPlugin::finishedEvent(const FoundFolder& found, const R
         });
         return nullptr;
     }
-    read.group->setMediaObjects(clips.clips);
     noteItemsFound(clips.clips.size());
     if (clips.clips.empty()) {
         scan.report.keptOut([&] { return findings::eventWithoutClips(found.path); });
         return nullptr;
     }
-    setAttributesOfClips(*read.group, clips.dates, _mostRecentEventFirst);
     return read.group;
 }

@@ -84,9 +84,11 @@ public:
     ShownEvents(MontaroFlatGroupList list, std::size_t count)
         : _list(std::move(list))
         , _found(count)
+        , _isRead(count)
     {
     }
 
+    /// The folder `index` is an event.
     void found(std::size_t index, const OBMediaGroupRef& event)
     {
         platform::Locked guard(_lock);
@@ -94,18 +96,22 @@ public:
         if (index == _reached)
             addGroup(_list, event);
     }
-    /// All before `index` have been read.
-    void reached(std::size_t index)
+    /// The folder `index` has been read, and what it holds is set on its event.
+    void read(std::size_t index)
     {
         platform::Locked guard(_lock);
-        _reached = index;
-        if (index < _found.size() && _found[index])
-            addGroup(_list, _found[index]);
+        _isRead[index] = true;
+        while (_reached < _isRead.size() && _isRead[_reached]) {
+            ++_reached;
+            if (_reached < _found.size() && _found[_reached])
+                addGroup(_list, _found[_reached]);
+        }
     }
 
 private:
     const MontaroFlatGroupList _list;
     platform::Mutex _lock;
     std::vector<OBMediaGroupRef> _found GUARDED_BY(_lock);
-    std::size_t _reached GUARDED_BY(_lock) = 0;
+    std::vector<bool> _isRead GUARDED_BY(_lock);
+    std::size_t _reached GUARDED_BY(_lock) = 0; // all before it have been read
 };

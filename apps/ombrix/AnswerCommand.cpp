@@ -7,6 +7,7 @@
 #include "apps/ombrix/SearchFolders.h"
 #include "host/OBSourceInspection.h"
 #include "platform/Clock.h"
+#include "platform/ForbiddingFolder.h"
 #include "platform/PathText.h"
 #include "platform/Preferences.h"
 #include "platform/Volumes.h"
@@ -82,21 +83,13 @@ namespace {
         return answer;
     }
 
-    /// The folder that keeps `path` from being read: the first on the way that may not be searched, else itself.
-    std::string folderThatForbids(const platform::FileSystem& files, std::string_view path)
-    {
-        while (path.size() > 1 && files.isOutOfReach(path))
-            path = platform::pathByRemovingLastComponent(path);
-        return std::string(path);
-    }
-
     Answer tellFolder(const platform::Platform& machine, const OBMediaManagerClass& source, const std::string& path)
     {
         const platform::FileSystem& files = machine.fileSystem;
         FolderState state;
         state.problem = searchProblem(files, path);
         if (state.problem == platform::FileProblem::notPermitted)
-            state.blockedAt = folderThatForbids(files, path);
+            state.blockedAt = platform::folderThatForbids(files, path);
         state.realPath = files.resolvedPath(path);
         state.fileSystem = machine.volumes.fileSystemType(path).value_or("");
         state.isFit = source.validDiskFormat(path);

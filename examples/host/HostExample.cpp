@@ -30,8 +30,7 @@ int browse(const platform::Platform& machine)
         = made.manager->observe(here, { .rootPublished = [](const OBMediaGroupRef& root) { print(root, ""); } });
     made.manager->requestRootMediaGroup(here, [](const OBLoadResult& result) {
         if (result.outcome == OBLoadOutcome::unavailable || !result.problem.empty())
-            std::cerr << "nothing to load: "
-                      << (result.problem.empty() ? "the editor is not installed" : result.problem) << '\n';
+            std::cerr << "nothing to load: " << (result.problem.empty() ? "no editor there" : result.problem) << '\n';
     });
     machine.mainRunLoop.run(); // this thread is the framework's main thread, until somebody calls quit()
     return 0;

@@ -26,7 +26,8 @@ int countGroups(const platform::Platform& machine)
     OBManagerResult made = host.createManager("org.ombrix.OBMontaroPlugin");
     const OBLoadResult result = made.manager ? load(*made.manager) : OBLoadResult();
     int groups = 0;
-    OBWalkGroups(result.rootMediaGroup, [&groups](const OBMediaGroupRef&, const OBGroupPlace&) { return ++groups > 0; });
+    OBWalkGroups(
+        result.rootMediaGroup, [&groups](const OBMediaGroupRef&, const OBGroupPlace&) { return ++groups > 0; });
     std::cout << groups << " groups" << made.problem << '\n';
 
     made.manager = nullptr; // its threads end now, each after what it is doing

@@ -1,4 +1,6 @@
 #include "tests/apps/ProgramRun.h"
+#include "tests/support/DescribedMachine.h"
+#include "tests/support/FencedBlocks.h"
 #include "tests/support/GoldenText.h"
 #include "tests/support/LibraryBuilder.h"
 #include "tests/support/TemporaryFolder.h"
@@ -64,12 +66,12 @@ TEST_CASE("the example of an application says so when there is nothing to load")
 {
     const TemporaryFolder folder;
     TerminalWishes terminal;
-    terminal.sendSignalAfter = "installed";
+    terminal.sendSignalAfter = "no editor there";
     terminal.signal = SIGINT;
     const ProgramRun run = runWithErrorsOnTerminal(exampleRun(folder), terminal);
     CHECK(run.status == 0);
     CHECK(run.output.empty());
-    CHECK(run.errors == "nothing to load: the editor is not installed\n");
+    CHECK(run.errors == "nothing to load: no editor there\n");
 }
 
 TEST_CASE("what README shows of an application is a part of the example, which has at most fifty lines")
@@ -82,4 +84,36 @@ TEST_CASE("what README shows of an application is a part of the example, which h
     const std::string shown = readme.substr(start, readme.find("```\n", start) - start);
     CHECK(shown.starts_with("int browse("));
     CHECK(example.find("\n" + shown) != std::string::npos);
+}
+
+TEST_CASE("the example with a loop of its own counts what is on a described machine, and ends by itself")
+{
+    const TemporaryFolder folder;
+    LibraryBuilder projects(folder.folder("home/Movies/Montaro Projects"));
+    projects.project("Clients/Meyer").movie("a.mov");
+    DescribedMachine description;
+    description.home(folder.path("home")).editor(folder.file("editor"));
+    description.write(folder.path("machine.json"));
+    RunWishes wishes;
+    wishes.program = OMBRIX_OWN_LOOP_EXAMPLE;
+    wishes.arguments = { folder.path("machine.json") };
+    const ProgramRun run = runProgram(wishes);
+    CHECK(run.status == 0);
+    CHECK(run.errors.empty());
+    CHECK(run.output == "4 groups\n");
+    wishes.arguments = { folder.path("none.json") };
+    CHECK(runProgram(wishes).status == 1);
+}
+
+TEST_CASE("what the guide to embedding shows is a part of the examples, to the letter")
+{
+    std::string examples = "\n";
+    for (const char* file : { "HostExample.cpp", "OwnLoopExample.cpp", "CMakeLists.txt" })
+        examples += contentOf(OMBRIX_SOURCE_FOLDER "/examples/host/" + std::string(file)) + "\n";
+    const std::vector<FencedBlock> blocks = fencedBlocks(contentOf(OMBRIX_SOURCE_FOLDER "/docs/embedding.md"));
+    CHECK(blocks.size() >= 4);
+    for (const FencedBlock& block : blocks) {
+        CAPTURE(block.text);
+        CHECK(examples.find(block.text) != std::string::npos);
+    }
 }

@@ -61,7 +61,7 @@ namespace {
                 "a program knows host/, roles and apps/common; machines and the system lie behind them" },
             { "examples/folders", { publicHost, "platform" }, {}, false,
                 "an example of a source knows what a plug-in from outside does: the host's public headers and roles" },
-            { "examples", { publicHost, "platform", "platform/linux" }, {}, true,
+            { "examples", { publicHost, "platform", "platform/linux", "platform/described" }, {}, true,
                 "an example knows what an application from outside does: the host's public headers, roles and the "
                 "machine" },
             { "tests/platform/linux/watching", { "platform/", "tests/support", "tests/platform/linux" }, { "doctest/" },

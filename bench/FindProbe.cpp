@@ -15,8 +15,8 @@
 #include <vector>
 
 // A search by name in a tree of a million clips, to one pass of memmem over the same names laid one after the other.
-// Both run in turn, and the figure is the median of the ratios. The tree is made here through the host's public headers,
-// shaped as a load shapes it: events below years, and the root's own list repeating every clip.
+// Both run in turn, and the figure is the median of the ratios. The tree is made here through the host's public
+// headers, shaped as a load shapes it: events below years, and the root's own list repeating every clip.
 
 namespace {
 

@@ -33,6 +33,6 @@ bool isAccent(char32_t character);
 /// The letter that `character` is without its accents; `character` itself where it has none.
 char32_t withoutAccents(char32_t character);
 
-/// Whether words are made of `character`: letters, marks and numbers, and bytes that are no UTF-8, which most likely are
-/// letters of an older encoding.
+/// Whether words are made of `character`: letters, marks and numbers, and bytes that are no UTF-8, which most likely
+/// are letters of an older encoding.
 bool belongsToWord(char32_t character);

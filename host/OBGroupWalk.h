@@ -18,8 +18,8 @@ struct OBGroupPlace {
 /// Calls `visit` with `root` and everything below it, a group before its child groups, each with its place, until it
 /// answers false. A null root has nothing to visit.
 ///
-/// However deep a tree is, it takes no more of the thread's stack. The child groups of a group are those that it had when
-/// it was visited; the tree may change meanwhile. Any thread.
+/// However deep a tree is, it takes no more of the thread's stack. The child groups of a group are those that it had
+/// when it was visited; the tree may change meanwhile. Any thread.
 template <class Visit> void OBWalkGroups(const OBMediaGroupRef& root, const Visit& visit)
 {
     struct Level {

@@ -84,8 +84,8 @@ public:
 
     OBMediaGroupList childGroups() const;
     void setChildGroups(OBMediaGroupList groups);
-    /// Replaces the list in one step if it is still the one that `childGroups` answered as `before`; false, with nothing
-    /// changed, when somebody has replaced or extended it since.
+    /// Replaces the list in one step if it is still the one that `childGroups` answered as `before`; false, with
+    /// nothing changed, when somebody has replaced or extended it since.
     bool replaceChildGroups(const OBMediaGroupList& before, OBMediaGroupList groups);
     /// Appends one group; nothing when it is null.
     void addChildGroup(OBMediaGroupRef group);

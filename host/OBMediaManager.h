@@ -148,8 +148,8 @@ public:
 
     /// The installed tree, at once; null before the first load.
     OBMediaGroupRef rootMediaGroup() const;
-    /// Publishes a tree, new or changed in place. False, with nothing done, for a tree that another has replaced since it
-    /// was installed: what was changed in it has to be changed in that one.
+    /// Publishes a tree, new or changed in place. False, with nothing done, for a tree that another has replaced since
+    /// it was installed: what was changed in it has to be changed in that one.
     bool setRootMediaGroup(const OBMediaGroupRef& group);
     /// Whether whoever scans is to stop.
     bool isCancelLoadRequestPending() const noexcept;
@@ -177,7 +177,8 @@ public:
     /// The two halves of that, for whoever lists on several threads and notes in order.
     platform::FolderListing readFolder(const platform::Text& path, const platform::ListingRequest& request);
     void noteFolderRead(const platform::Text& path, platform::FileProblem problem);
-    /// For the progress: folders that were listed together with another, media objects made, items that a rule kept out.
+    /// For the progress: folders that were listed together with another, media objects made, items that a rule kept
+    /// out.
     void noteFoldersDone(std::uint64_t count);
     void noteItemsFound(std::uint64_t count);
     void noteItemsSkipped(std::uint64_t count);

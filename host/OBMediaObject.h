@@ -99,8 +99,8 @@ public:
 
     /// All of it at once, for whoever prints a million.
     OBMediaObjectRecord record() const;
-    /// Whether it is still as it was made: nobody has changed it, nothing is known of its movie, and its path is its real
-    /// path. All such objects of a batch differ by their files' names alone.
+    /// Whether it is still as it was made: nobody has changed it, nothing is known of its movie, and its path is its
+    /// real path. All such objects of a batch differ by their files' names alone.
     bool isAsMade() const;
 
     /// The file; absent when none was set.
@@ -111,8 +111,8 @@ public:
     /// The real path: every symbolic link on the way resolved. Absent when nothing exists there. Asks the file system.
     platform::Text aliasResolvedPath() const;
 
-    /// Size and creation date of the file as they were when it was found: asks nothing of the disk. Absent for an object
-    /// of whose file nothing was seen.
+    /// Size and creation date of the file as they were when it was found: asks nothing of the disk. Absent for an
+    /// object of whose file nothing was seen.
     std::optional<platform::FileFacts> fileFacts() const;
     void setFileFacts(std::optional<platform::FileFacts> facts);
 

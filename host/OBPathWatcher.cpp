@@ -274,7 +274,8 @@ bool OBPathWatcher::pathsStand() const
     return !_toStand || _toStand->isEmpty();
 }
 
-/// The lanes stay registered until their calls have ended, so that whoever takes an observer back meanwhile waits for them too.
+/// The lanes stay registered until their calls have ended, so that whoever takes an observer back meanwhile waits for
+/// them too.
 void OBPathWatcher::stopFollowing()
 {
     AllRegistrations before;

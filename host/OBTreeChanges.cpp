@@ -1,5 +1,5 @@
-// The one surprise: a list of objects is compared by what it is made of. A folder's files are one block of memory, which
-// groups of groups repeat, so the innermost group of a million objects is found by looking at the blocks alone.
+// The one surprise: a list of objects is compared by what it is made of. A folder's files are one block of memory,
+// which groups of groups repeat, so the innermost group of a million objects is found by looking at the blocks alone.
 
 #include "host/OBTreeChanges.h"
 

@@ -26,7 +26,8 @@ public:
     OrderedWork(const platform::Platform& platform, ThreadStarter startThread, std::size_t count, const Job& job);
 
     /// Calls `job` once for each index below `count`, on any of the threads, and `take` for each in order, on the
-    /// calling thread. When it returns, or throws what one of the two threw, no other thread is inside `job` or will be.
+    /// calling thread. When it returns, or throws what one of the two threw, no other thread is inside `job` or will
+    /// be.
     void perform(const Job& take);
 
 private:

@@ -167,8 +167,8 @@ Value PluginLibrary::stringTable(const Plugin& plugin, std::vector<std::string>&
     return {};
 }
 
-/// The bundle that is used for `identifier`, loaded: one that turns out to be damaged leaves its place to the next, and the
-/// one that loads takes it for good. Refused when all are; null when there is none.
+/// The bundle that is used for `identifier`, loaded: one that turns out to be damaged leaves its place to the next, and
+/// the one that loads takes it for good. Refused when all are; null when there is none.
 PluginLibrary::Plugin* PluginLibrary::loaded(std::string_view identifier, std::vector<std::string>& toLog)
 {
     Plugin* plugin = find(identifier);

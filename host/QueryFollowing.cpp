@@ -14,8 +14,8 @@ using platform::PathChange;
 namespace {
 
 /// Whether a change can have brought a file into the result or taken one out of it. Where it cannot be known any more
-/// what was there, it can. Asks no disk: one that does not answer would keep the reports of all others waiting. So a link that bears a
-/// movie's name counts as a movie.
+/// what was there, it can. Asks no disk: one that does not answer would keep the reports of all others waiting. So a
+/// link that bears a movie's name counts as a movie.
 bool mayChangeResult(const OBMetadataQuery& query, const PathChange& change)
 {
     switch (change.kind) {

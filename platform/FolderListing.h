@@ -90,14 +90,14 @@ struct ListingRequest {
     std::string_view subfolder {};
     /// The size and the creation date of every item that is neither a folder, nor a link, nor hidden by its name.
     bool fileFacts = false;
-    /// Of the folder that holds the listed one: is there an entry of this name in it, links followed, and since when has
-    /// it been as it is? Where there is none, nothing is listed. Not asked when empty.
+    /// Of the folder that holds the listed one: is there an entry of this name in it, links followed, and since when
+    /// has it been as it is? Where there is none, nothing is listed. Not asked when empty.
     std::string_view markerBeside {};
     /// A listing that is needed no longer, or null. It is emptied, and the answer lies in its memory.
     FolderListing* spare = nullptr;
     LinkPolicy links = LinkPolicy::follow;
-    /// With LinkPolicy::stop: a link of the marker's name inside a folder is followed all the same where the system comes
-    /// to something by it.
+    /// With LinkPolicy::stop: a link of the marker's name inside a folder is followed all the same where the system
+    /// comes to something by it.
     bool followsMarkers = false;
 };
 
@@ -152,8 +152,8 @@ public:
     /// the request did not ask for them.
     const std::optional<ItemStatus>& folderStatus() const noexcept { return _folderStatus; }
 
-    /// What the request asked of the folder that holds the listed one. Absent where it did not, and where that could not
-    /// be told in the same pass: then it is to be asked for by itself, and all items are listed.
+    /// What the request asked of the folder that holds the listed one. Absent where it did not, and where that could
+    /// not be told in the same pass: then it is to be asked for by itself, and all items are listed.
     const std::optional<FolderHolder>& holder() const noexcept { return _holder; }
 
     /// Whether the folder's path, as it was asked for, is known to hold no symbolic link and so is its own real path.
@@ -233,7 +233,8 @@ private:
         ItemKind kind = ItemKind::other;
     };
     /// Folders have a modification date and other items have facts, so one date serves both, and what a subfolder holds
-    /// may stand in place of a size. A folder of a hundred thousand items is walked twice: half the bytes are half the way.
+    /// may stand in place of a size. A folder of a hundred thousand items is walked twice: half the bytes are half the
+    /// way.
     struct Entry {
         std::int64_t seconds = 0;
         std::uint64_t size = 0; // or where the subfolder's entries begin, and 32 bits below, how many there are

@@ -33,7 +33,8 @@ public:
 
     // Handing something to the desktop. Each answers at once; what became of it goes to the observer.
 
-    /// Starts the application registered under `identifier` as its desktop entry says, so that it outlives this process.
+    /// Starts the application registered under `identifier` as its desktop entry says, so that it outlives this
+    /// process.
     virtual void launchApplication(std::string_view identifier) = 0;
     /// Starts the program at `path` likewise, without arguments.
     virtual void launchProgram(std::string_view path) = 0;

@@ -81,8 +81,8 @@ void OBMontaroPlugin::registerQueries()
         movieQuery, this, stringsOf(*_MontaroEventsSearchPaths.load()), OBQueryRunModeLive);
 }
 
-/// A reload that began after this load's scan of its half, and ended before the load did, has changed the tree that this
-/// one replaces.
+/// A reload that began after this load's scan of its half, and ended before the load did, has changed the tree that
+/// this one replaces.
 void OBMontaroPlugin::rootMediaGroupInstalled(const OBMediaGroupRef&)
 {
     const ScanHistory::Result projects = _projectScans.latest();

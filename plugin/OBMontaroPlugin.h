@@ -104,8 +104,8 @@ public:
     void finishReloadMontaroProjects(const OBMediaGroupRef& library);
     /// Whether a folder is a project.
     bool _isMTProject(std::string_view path);
-    /// One folder's projects and folders, below a group that stands for it; null for no path. They are added to the flat
-    /// list, as in a scan.
+    /// One folder's projects and folders, below a group that stands for it; null for no path. They are added to the
+    /// flat list, as in a scan.
     OBMediaGroupRef _createMontaroProjectsFolderForPath(const platform::Text& path);
     /// Gives a folder group one representative movie a project below it.
     void _createMontaroProjectsFolderMediaObjects(const OBMediaGroupRef& folder);
@@ -136,8 +136,8 @@ public:
     /// into the installed tree too.
     OBMediaGroupRef _reloadMontaroEvents_updateRootMediaGroup(const platform::Text& parentID, bool updateRoot);
     OBMediaGroupRef _reloadMontaroEvents();
-    /// One library's events, below a group that carries them; null for a folder that lists nothing. They are added to the
-    /// flat list, as in a scan.
+    /// One library's events, below a group that carries them; null for a folder that lists nothing. They are added to
+    /// the flat list, as in a scan.
     OBMediaGroupRef _createMontaroEventsFolderForPath(const platform::Text& path);
     /// Whether a folder is an event.
     bool _isMTEvent(std::string_view path);
@@ -158,8 +158,8 @@ public:
     /// A volume was mounted: a thread of its own adds its event folder to those that are searched.
     void _fileSystemMounted(const platform::Notification& notification);
     void _fileSystemMountedThreaded(const platform::Notification& notification);
-    /// Whether the volume that holds `path` is of a type that is fit to hold the editor's libraries; false where nothing
-    /// exists.
+    /// Whether the volume that holds `path` is of a type that is fit to hold the editor's libraries; false where
+    /// nothing exists.
     static bool validDiskFormat(std::string_view path);
 
     // User interaction

@@ -14,8 +14,8 @@ struct ChosenMovie {
     double width = 0;
 };
 
-/// The first of the widest movies of the first of `projects`, and of as many after it as one turn of the main thread has
-/// time for; at least one answer. Heights play no part; movies without a resolution are never chosen.
+/// The first of the widest movies of the first of `projects`, and of as many after it as one turn of the main thread
+/// has time for; at least one answer. Heights play no part; movies without a resolution are never chosen.
 ///
 /// Has the main thread produce each movie's thumbnail. Where a walk took long, the main thread gets back to its other
 /// work first. A pending cancel, asked before each movie, ends the walk with what was chosen so far; asked before each

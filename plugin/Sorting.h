@@ -6,9 +6,9 @@
 #include <utility>
 #include <vector>
 
-/// The elements sorted by `comparison`, which answers -1, 0 or +1 for two of them: top-down merge sort, n elements being
-/// cut after n/2. Where the comparison is 0, the element of the first part comes first. The comparison need not be
-/// transitive (events without a year equal everything), so the way of sorting is part of the result.
+/// The elements sorted by `comparison`, which answers -1, 0 or +1 for two of them: top-down merge sort, n elements
+/// being cut after n/2. Where the comparison is 0, the element of the first part comes first. The comparison need not
+/// be transitive (events without a year equal everything), so the way of sorting is part of the result.
 template <class Element, class Comparison>
 std::vector<Element> mergeSorted(std::vector<Element> elements, const Comparison& comparison)
 {

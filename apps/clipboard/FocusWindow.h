@@ -7,8 +7,8 @@ struct wl_surface;
 struct xdg_surface;
 struct xdg_toplevel;
 
-/// A window of one pixel, shown for as long as it lives: a compositor lets only a program whose window has the focus set
-/// the clipboard.
+/// A window of one pixel, shown for as long as it lives: a compositor lets only a program whose window has the focus
+/// set the clipboard.
 class FocusWindow {
 public:
     explicit FocusWindow(const WaylandDisplay& display);

@@ -1,6 +1,6 @@
-// The clipboard of a Wayland compositor, by its core protocol: what sets a clipboard has to carry the number of the event
-// that gave the window its focus, and the toolkit knows only those of keys and buttons, so that a compositor where
-// something was copied before would not listen to it.
+// The clipboard of a Wayland compositor, by its core protocol: what sets a clipboard has to carry the number of the
+// event that gave the window its focus, and the toolkit knows only those of keys and buttons, so that a compositor
+// where something was copied before would not listen to it.
 
 #include "apps/clipboard/WaylandClipboard.h"
 

@@ -1,5 +1,5 @@
-// The clipboard of an X display, through the toolkit. It adds names of its own to what is offered, which it leaves nobody
-// a choice about: UTF8_STRING, STRING and TEXT beside text/plain, and text/x-moz-url beside text/uri-list.
+// The clipboard of an X display, through the toolkit. It adds names of its own to what is offered, which it leaves
+// nobody a choice about: UTF8_STRING, STRING and TEXT beside text/plain, and text/x-moz-url beside text/uri-list.
 
 #include "apps/clipboard/XClipboard.h"
 

@@ -18,8 +18,8 @@ struct WatchedWork {
     std::string_view item = "clip"; ///< what one of the items found is called
 };
 
-/// While it lives, tells on standard error how far a load, or other work, has come: on a terminal one line from 300 ms on, ten times a
-/// second; wherever standard error goes, which disk has kept the load waiting for 3 seconds.
+/// While it lives, tells on standard error how far a load, or other work, has come: on a terminal one line from 300 ms
+/// on, ten times a second; wherever standard error goes, which disk has kept the load waiting for 3 seconds.
 ///
 /// Has a thread of its own, since every other thread may wait for that disk.
 class LoadWatch {

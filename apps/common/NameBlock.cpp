@@ -1,6 +1,6 @@
 // A library holds a million names, and a search that looked at each object would spend its time on fetching objects. So
-// the file names of whole batches are folded and searched as they lie, and only what holds the longest word is looked at
-// by itself.
+// the file names of whole batches are folded and searched as they lie, and only what holds the longest word is looked
+// at by itself.
 
 #include "apps/common/NameBlock.h"
 
@@ -102,8 +102,8 @@ std::optional<std::size_t> NameBlock::nextNeedle(std::size_t start) const
     return static_cast<std::size_t>(static_cast<const char*>(at) - _folded.data());
 }
 
-/// The last character of the run that is not ASCII and ends, at `place`, not behind `position`; the beginning of the run
-/// where there is none.
+/// The last character of the run that is not ASCII and ends, at `place`, not behind `position`; the beginning of the
+/// run where there is none.
 platform::FoldedCharacter NameBlock::otherBefore(
     const Piece& run, std::size_t platform::FoldedCharacter::*place, std::size_t position) const
 {

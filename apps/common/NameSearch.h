@@ -40,8 +40,8 @@ struct FoundNames {
 /// Looks through the names of `root`, which is not null, and of everything below it. Equal matches stand in tree order:
 /// a group before its own objects, these before its child groups.
 ///
-/// An object is found once, in the innermost group that it was set on: groups of groups repeat the objects below them. A
-/// representative is never found; it stands for a movie that is found itself. Any thread.
+/// An object is found once, in the innermost group that it was set on: groups of groups repeat the objects below them.
+/// A representative is never found; it stands for a movie that is found itself. Any thread.
 FoundNames findNames(const OBMediaGroupRef& root, const NameQuery& query, NameKinds kinds = NameKinds::all);
 
 /// Puts equal matches in the order of their dates, the newest first and those without a date last.

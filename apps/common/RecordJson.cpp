@@ -80,8 +80,8 @@ namespace {
             [&writer](const Text& text) { writer.text(text); });
     }
 
-    /// An object's JSON with gaps for its name and its file's name. The files of a folder mostly differ by these alone, and
-    /// a library holds a million of them, so all else is looked up, quoted and put together once a folder.
+    /// An object's JSON with gaps for its name and its file's name. The files of a folder mostly differ by these alone,
+    /// and a library holds a million of them, so all else is looked up, quoted and put together once a folder.
     class ObjectStencil {
     public:
         /// Cuts it anew after an object that is as its batch made it.

@@ -6,8 +6,8 @@
 
 namespace ombrix {
 
-/// Absolute, as the shell names the working folder, "." and ".." taken out as text; no link is looked at. The empty path
-/// stays empty; absent where there is no current folder.
+/// Absolute, as the shell names the working folder, "." and ".." taken out as text; no link is looked at. The empty
+/// path stays empty; absent where there is no current folder.
 std::optional<std::string> absolutePath(const std::string& path);
 
 /// Why there is none.

@@ -21,7 +21,8 @@ namespace {
         return { std::string(decision.rule), decision.path, decision.passed, decision.text };
     }
 
-    /// `remedy` to whoever asks about `path`: "it" is what decided, and is named where that is a folder around the path.
+    /// `remedy` to whoever asks about `path`: "it" is what decided, and is named where that is a folder around the
+    /// path.
     std::string remedyFor(const std::string& path, const std::string& decided, const std::string& remedy)
     {
         if (path == decided || remedy.find(" it") == std::string::npos)
@@ -237,7 +238,8 @@ void Explainer::endBelow(Way& way, const Decisions& met, const std::string& path
 }
 
 /// `path` as the search spells it, where that is another way to the same place, and the folder that is searched; empty
-/// where there is none. Only links that lead into the folder are resolved: those below it stay as they were asked about.
+/// where there is none. Only links that lead into the folder are resolved: those below it stay as they were asked
+/// about.
 std::pair<std::string, std::string> Explainer::searchedSpelling(const std::string& path) const
 {
     for (const std::string& folder : _folders) {

@@ -17,7 +17,8 @@ struct ExplanationTextWishes {
     std::function<std::string(std::string_view path)> linkTarget {}; ///< where a terminal's link to a path leads
 };
 
-/// Prints the verdict, the steps and what would list the path, so that no word of a reason is lost on a narrow terminal.
+/// Prints the verdict, the steps and what would list the path, so that no word of a reason is lost on a narrow
+/// terminal.
 void printExplanation(Program& program, const Explanation& explanation, const ExplanationTextWishes& wishes);
 
 } // namespace ombrix

@@ -32,7 +32,8 @@ namespace {
         return style.name(name.empty() ? group.ID() : name);
     }
 
-    /// The groups around a hit, from the outermost one in. The root is told only where nothing else is: it is around all.
+    /// The groups around a hit, from the outermost one in. The root is told only where nothing else is: it is around
+    /// all.
     std::string placeOf(const apps::FoundNames& found, const apps::NameHit& hit, const apps::Style& style)
     {
         const bool isRoot = !hit.object && hit.group == 0;

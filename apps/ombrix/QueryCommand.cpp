@@ -1,4 +1,5 @@
-// "query": the files that an expression matches, printed as they are found. Loads nothing, so the editor need not be there.
+// "query": the files that an expression matches, printed as they are found. Loads nothing, so the editor need not be
+// there.
 
 #include "apps/common/LoadWatch.h"
 #include "apps/common/RecordJson.h"

@@ -9,8 +9,8 @@
 
 namespace ombrix {
 
-/// Whether a folder that a source searches can be: `missing` where nothing is there, `notPermitted` also where its names
-/// may be listed but nothing in it may be looked at.
+/// Whether a folder that a source searches can be: `missing` where nothing is there, `notPermitted` also where its
+/// names may be listed but nothing in it may be looked at.
 platform::FileProblem searchProblem(const platform::FileSystem& fileSystem, std::string_view folder);
 
 /// That in the words of a list: "exists", "absent", "not a folder", "not readable: …".

@@ -7,7 +7,8 @@
 
 namespace ombrix {
 
-/// A command to be typed as it stands, on the machine and source of this run: "ombrix tree 'Anna & Tom' --machine FILE".
+/// A command to be typed as it stands, on the machine and source of this run: "ombrix tree 'Anna & Tom' --machine
+/// FILE".
 std::string suggestedCommand(const Arguments& arguments, std::string_view command, std::string_view operand = {});
 
 /// The arguments by which another run of the program gets the machine and source of this run.

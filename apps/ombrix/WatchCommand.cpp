@@ -1,8 +1,8 @@
-// "watch": the tree, and what becomes of it. Nothing is joined at the end, for a thread may wait for a disk that does not
-// answer.
+// "watch": the tree, and what becomes of it. Nothing is joined at the end, for a thread may wait for a disk that does
+// not answer.
 //
-// The one surprise: the first thread only runs the main loop. Signals come to a thread of their own, so that the program
-// ends when it is asked to, whatever the main loop waits for.
+// The one surprise: the first thread only runs the main loop. Signals come to a thread of their own, so that the
+// program ends when it is asked to, whatever the main loop waits for.
 
 #include "apps/common/HostileNames.h"
 #include "apps/common/StandardError.h"

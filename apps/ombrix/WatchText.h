@@ -16,8 +16,8 @@ namespace ombrix {
 
 // What "watch" tells people. Texts are laid out.
 
-/// What came, what changed and what went: "+ Coast (12 clips)    ~ Meyer: 1 → 2 movies    - Draft". What is many is only
-/// counted.
+/// What came, what changed and what went: "+ Coast (12 clips)    ~ Meyer: 1 → 2 movies    - Draft". What is many is
+/// only counted.
 std::string changesText(const OBTreeChanges& changes, const apps::Style& style);
 
 /// Why there was a scan and how long it took: "heard 14:02:26, waited 5.0 s, scanned in 18 ms"; where volumes have come

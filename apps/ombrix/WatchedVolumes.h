@@ -40,8 +40,8 @@ private:
 /// How many of the media objects lie on the volume, by its mount point or by its name below /Volumes.
 std::size_t countObjectsOn(const WatchedVolume& volume, const std::vector<OBTreeChange>& changes);
 
-/// The folders of the volume, by its name below /Volumes, that are called like one of `searchFolders` and exist, and yet
-/// are none of them.
+/// The folders of the volume, by its name below /Volumes, that are called like one of `searchFolders` and exist, and
+/// yet are none of them.
 std::vector<std::string> unsearchedFoldersOn(
     const WatchedVolume& volume, const std::vector<std::string>& searchFolders, const platform::FileSystem& fileSystem);
 

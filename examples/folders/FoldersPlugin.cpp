@@ -101,7 +101,7 @@ public:
             reload();
     }
 
-    /// A burst of changes is awaited on a thread of its own: this call may come on the main thread, which must not sleep.
+    /// A burst of changes is awaited on a thread of its own: this may be the main thread, which must not sleep.
     void watchedPathChanged_fileChangedEventFlags(std::string_view, std::uint64_t) override
     {
         const auto answer = [this] {

@@ -35,8 +35,8 @@ namespace {
         const std::optional<std::string> _home;
     };
 
-    /// Knows one application at most, and no icon; what is handed to the desktop goes to the real one. The environment is
-    /// that of another machine, so the settings are those in the home folder.
+    /// Knows one application at most, and no icon; what is handed to the desktop goes to the real one. The environment
+    /// is that of another machine, so the settings are those in the home folder.
     class DescribedWorkspace : public Workspace {
     public:
         DescribedWorkspace(std::optional<std::string> editorPath, const FileSystem& files, Workspace& desktop)

@@ -17,8 +17,8 @@ namespace {
         return byte * 0x0101010101010101;
     }
 
-    /// 0 when all eight are ASCII and may stand in a string as they are. A byte that may not borrows from those above it,
-    /// so which ones may not is not told.
+    /// 0 when all eight are ASCII and may stand in a string as they are. A byte that may not borrows from those above
+    /// it, so which ones may not is not told.
     std::uint64_t unplainBytes(std::uint64_t eight)
     {
         const std::uint64_t controls = eight - everyByte(0x20);

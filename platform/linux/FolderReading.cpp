@@ -77,8 +77,8 @@ namespace {
     {
         _markerPath.assign("../").append(_request.markerBeside);
         if (uninterrupted([&] { return faccessat(_folder, _markerPath.c_str(), F_OK, 0); }) == -1) {
-            // A link may lead somewhere all the same, by links that are no links of this system's; and from inside it may
-            // be forbidden to look at what the whole path leads to.
+            // A link may lead somewhere all the same, by links that are no links of this system's; and from inside it
+            // may be forbidden to look at what the whole path leads to.
             struct stat status { };
             const bool isMissing = errno == ENOENT
                 && fstatat(_folder, _markerPath.c_str(), &status, AT_SYMLINK_NOFOLLOW) == -1 && errno == ENOENT;

@@ -27,7 +27,8 @@ constexpr int yearOfNoDate = -1;
 constexpr int latestRecordedYear = 9999;
 constexpr std::string_view dateFormat = "%-d %b %Y"; // for people who ask about a clip
 
-/// Names and flags of the entries, what a clip's list and an event's year need of each file, and whether it is an event.
+/// Names and flags of the entries, what a clip's list and an event's year need of each file, and whether it is an
+/// event.
 constexpr platform::ListingRequest clipListing { .fileFacts = true,
     .markerBeside = MontaroEventIdentifierPathComponent };
 
@@ -270,7 +271,8 @@ ReadEvent OBMontaroPlugin::readEvent(
     return event;
 }
 
-/// From the open folder of clips what holds it is nearer than along the whole path. Of what is no event nothing is read.
+/// From the open folder of clips what holds it is nearer than along the whole path. Of what is no event nothing is
+/// read.
 ReadEvent OBMontaroPlugin::readEventWith(ClipScratch& scratch, const Text& library, const FoundFolder& folder,
     const EventScan& scan, const EventFound& found)
 {

@@ -15,8 +15,8 @@
 #include <utility>
 #include <vector>
 
-/// Memory in which a folder of clips is read. Taken anew for each folder, it would come to lie scattered among the records
-/// that stay.
+/// Memory in which a folder of clips is read. Taken anew for each folder, it would come to lie scattered among the
+/// records that stay.
 struct ClipScratch {
     platform::FolderListing listing {};
     std::vector<OBFileOfFolder> files {};

@@ -3,7 +3,9 @@
 #include <doctest/doctest.h>
 
 #include <algorithm>
+#include <cstddef>
 #include <optional>
+#include <sstream>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -150,6 +152,30 @@ TEST_CASE("no source or header is longer than 400 lines")
         const auto lines = std::count(file.text.begin(), file.text.end(), '\n');
         if (isCode(file.path) && lines > 400)
             complaints.push_back(file.path + ": " + std::to_string(lines) + " lines");
+    }
+    CHECK_MESSAGE(complaints.empty(), joined(complaints));
+}
+
+// The expected texts of tests are as long as they are; what is written about code wraps there too.
+TEST_CASE("no line of code is longer than 120 characters, nor any of a comment")
+{
+    constexpr std::ptrdiff_t most = 120;
+    std::vector<std::string> complaints;
+    for (const SourceFile& file : sourceFiles()) {
+        if (!isCode(file.path))
+            continue;
+        std::istringstream text(file.text);
+        std::size_t number = 0;
+        for (std::string line; std::getline(text, line);) {
+            ++number;
+            const std::size_t start = std::min(line.find_first_not_of(' '), line.size());
+            const bool isComment = std::string_view(line).substr(start).starts_with("//");
+            // A byte that continues a character is none of its own.
+            const auto length
+                = std::count_if(line.begin(), line.end(), [](char byte) { return (byte & 0xC0) != 0x80; });
+            if (length > most && (isComment || !file.path.starts_with("tests/")))
+                complaints.push_back(file.path + ":" + std::to_string(number));
+        }
     }
     CHECK_MESSAGE(complaints.empty(), joined(complaints));
 }

@@ -45,7 +45,8 @@ public:
     virtual bool makeFolder(const std::string& path) = 0;
     /// A new file that somebody still writes to; its number, or 0.
     virtual std::uint64_t beginFile(const std::string& path) = 0;
-    /// The writer is done: the file, wherever it is now, holds `text`, and bears a date of the writer's choice or now's.
+    /// The writer is done: the file, wherever it is now, holds `text`, and bears a date of the writer's choice or
+    /// now's.
     virtual void endFile(std::uint64_t number, const std::string& text, std::optional<platform::Date> date) = 0;
     /// A whole new file, or other content for one that exists. "640x480" makes it a movie of that size.
     virtual bool writeFile(const std::string& path, const std::string& text) = 0;

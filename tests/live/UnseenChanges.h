@@ -13,7 +13,8 @@ namespace tests {
 // names them; everything else has to be equal.
 //
 // Differences that the comparison takes out of both trees, or asks for in neither:
-// - The lists of folders to search are built once. The projects of a volume that was mounted later are not searched for,
+// - The lists of folders to search are built once. The projects of a volume that was mounted later are not searched
+// for,
 //   and its events are searched for after all others; of a volume that went between the two lists, only one knows.
 //   The fresh load is told of the volumes in the order of the events, and projects in folders that only one of the two
 //   searches are taken out of both trees.
@@ -32,8 +33,9 @@ public:
         behindLink, ///< something changed behind a link below a library, where nothing is watched
         polledContents, ///< a file was written where folders are polled: only its folder's change time is looked at
         failedListing, ///< a folder could not be read for a while: nothing tells when it can be again
-        ambiguousPath, ///< which half a change belongs to is read off its path: below a folder called Montaro Projects in
-        ///< the events, it belongs to the projects
+        /// Which half a change belongs to is read off its path: below a folder called Montaro Projects in the events,
+        /// it belongs to the projects.
+        ambiguousPath,
         preference, ///< the order of events: the preference is read anew, and used by the next reload
     };
 

@@ -65,8 +65,8 @@ public:
     std::vector<WatchedFolders::Number> setSteps(
         WatchedRoot& root, const std::vector<std::pair<WatchedFolders::Number, Step>>& steps);
 
-    /// Has every root followed again that has a step called `name` in `folder`. With `isOther` an entry of that name has
-    /// come or gone, else its permissions may be others.
+    /// Has every root followed again that has a step called `name` in `folder`. With `isOther` an entry of that name
+    /// has come or gone, else its permissions may be others.
     void noteStep(WatchedFolders::Number folder, std::string_view name, bool isOther);
     /// Has every root followed again that leads through or to `folder`; with `isGone`, what leads to it is told.
     void noteFolder(WatchedFolders::Number folder, bool isGone);

@@ -16,8 +16,8 @@ namespace {
 
 constexpr ListingRequest sharedListing { .marker = "mark", .subfolder = "Shared" };
 
-/// What the listing tells of the subfolder of the item called `name`: its items sorted, folders with a slash; "?" where it
-/// has to be asked for alone.
+/// What the listing tells of the subfolder of the item called `name`: its items sorted, folders with a slash; "?" where
+/// it has to be asked for alone.
 std::string subfolderOf(const FolderListing& listing, std::string_view name)
 {
     for (const FolderItem item : listing) {

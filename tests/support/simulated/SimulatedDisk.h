@@ -69,7 +69,8 @@ public:
     void makeFolders(const std::string& path);
     /// A new file that somebody still writes to; its number, or 0.
     std::uint64_t beginFile(const std::string& path);
-    /// The writer is done: the file, wherever it is now, holds `text`, and bears a date of the writer's choice or now's.
+    /// The writer is done: the file, wherever it is now, holds `text`, and bears a date of the writer's choice or
+    /// now's.
     void endFile(std::uint64_t number, const std::string& text, std::optional<platform::Date> date = {});
     /// A whole new file, or other content for one that exists.
     bool writeFile(const std::string& path, const std::string& text);

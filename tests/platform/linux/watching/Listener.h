@@ -105,8 +105,8 @@ void moveItem(const std::string& from, const std::string& to);
 /// What is told of the root until a file, made now in the watched folder `root`, has appeared.
 Changes changesSoFar(Listener& listener, const std::string& root);
 
-/// Whether files that are made in `folder` from now on, their names beginning with `name`, come to be told of. False when
-/// that does not happen within a minute.
+/// Whether files that are made in `folder` from now on, their names beginning with `name`, come to be told of. False
+/// when that does not happen within a minute.
 bool comesToHear(Listener& listener, const std::string& folder, const std::string& name);
 
 /// A time later than every change.
